@@ -1,0 +1,125 @@
+#include "platform/Files.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <fcntl.h>
+#include <random>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <utility>
+
+#include "QVSa/frame/Failure.h"
+
+namespace QVSa::platform {
+
+namespace {
+
+class Descriptor {
+ public:
+  Descriptor(const std::filesystem::path& path, int flags) : handle_(::open(path.c_str(), flags | O_CLOEXEC, 0666)) {}
+  Descriptor(const Descriptor&) = delete;
+  Descriptor& operator=(const Descriptor&) = delete;
+  ~Descriptor() { close(); }
+
+  bool isOpen() const { return handle_ >= 0; }
+  int handle() const { return handle_; }
+  bool close() { return handle_ < 0 || ::close(std::exchange(handle_, -1)) == 0; }
+
+ private:
+  int handle_;
+};
+
+// A file under a passing name: removed at the end, where it was not renamed before.
+class PassingFile {
+ public:
+  explicit PassingFile(std::filesystem::path path) : path_(std::move(path)) {}
+  PassingFile(const PassingFile&) = delete;
+  PassingFile& operator=(const PassingFile&) = delete;
+  ~PassingFile() { ::unlink(path_.c_str()); }
+
+ private:
+  std::filesystem::path path_;
+};
+
+bool folderExists(const std::filesystem::path& file) {
+  std::error_code ignored;
+  return !file.has_parent_path() || std::filesystem::is_directory(file.parent_path(), ignored);
+}
+
+[[noreturn]] void fail(const std::filesystem::path& path) {
+  switch (errno) {
+    case ENOENT:
+      throw runtimeFailure(folderExists(path) ? number::noFile : number::noPath);
+    case ENOTDIR:
+      throw runtimeFailure(number::noPath);
+    case EACCES:
+    case EPERM:
+    case EROFS:
+      throw runtimeFailure(number::accessDenied);
+    default:
+      throw runtimeFailure(number::pathAccess);
+  }
+}
+
+void writeAll(const Descriptor& file, const Bytes& content, const std::filesystem::path& path) {
+  for (std::size_t written = 0; written < content.size();) {
+    const ssize_t count = ::write(file.handle(), content.data() + written, content.size() - written);
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) fail(path);
+    written += static_cast<std::size_t>(count);
+  }
+}
+
+std::filesystem::path nameBeside(const std::filesystem::path& target) {
+  std::random_device random;
+  std::filesystem::path path = target;
+  path += "." + std::to_string(random()) + std::to_string(random()) + ".new";
+  return path;
+}
+
+// The file is in its place already: a file system that cannot sync a folder is no failure.
+void syncFolderOf(const std::filesystem::path& file) {
+  const Descriptor folder(file.has_parent_path() ? file.parent_path() : ".", O_RDONLY | O_DIRECTORY);
+  if (folder.isOpen()) ::fsync(folder.handle());
+}
+
+}  // namespace
+
+std::filesystem::path localPath(const String& path) {
+  String local = path;
+  std::ranges::replace(local, '\\', '/');
+  return local;
+}
+
+Bytes readFile(const String& path) {
+  const std::filesystem::path source = localPath(path);
+  const Descriptor file(source, O_RDONLY);
+  struct stat state {};
+  if (!file.isOpen() || ::fstat(file.handle(), &state) != 0) fail(source);
+  Bytes content(static_cast<std::size_t>(state.st_size) + 1);
+  std::size_t size = 0;
+  while (true) {
+    const ssize_t count = ::read(file.handle(), content.data() + size, content.size() - size);
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) fail(source);
+    if (count == 0) break;
+    size += static_cast<std::size_t>(count);
+    if (size == content.size()) content.resize(size * 2);
+  }
+  content.resize(size);
+  return content;
+}
+
+void writeFile(const String& path, const Bytes& content) {
+  const std::filesystem::path target = localPath(path);
+  const std::filesystem::path beside = nameBeside(target);
+  Descriptor file(beside, O_WRONLY | O_CREAT | O_EXCL);
+  if (!file.isOpen()) fail(target);
+  const PassingFile passing(beside);
+  writeAll(file, content, target);
+  if (::fsync(file.handle()) != 0 || !file.close()) fail(target);
+  if (::rename(beside.c_str(), target.c_str()) != 0) fail(target);
+  syncFolderOf(target);
+}
+
+}  // namespace QVSa::platform

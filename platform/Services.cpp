@@ -1,0 +1,53 @@
+#include "platform/Services.h"
+
+#include <algorithm>
+#include <ctime>
+#include <syslog.h>
+#include <unistd.h>
+#include <utility>
+
+namespace QVSa::platform {
+
+namespace {
+
+constexpr std::size_t computerNameLength = 128;
+
+Date systemLocalTime() {
+  const std::time_t now = std::time(nullptr);
+  std::tm parts{};
+  localtime_r(&now, &parts);
+  // A leap second has the number 60.
+  return Date(parts.tm_year + 1900, parts.tm_mon + 1, parts.tm_mday, parts.tm_hour, parts.tm_min,
+              std::min(parts.tm_sec, 59));
+}
+
+String systemComputerName() {
+  char buffer[computerNameLength + 1] = {};
+  // A longer name comes cut.
+  gethostname(buffer, computerNameLength);
+  String name = buffer;
+  name.erase(0, name.find_first_not_of(' '));
+  name.erase(name.find_last_not_of(' ') + 1);
+  return name;
+}
+
+// The name stands in the line: openlog would change it for the whole host process.
+void writeEventLog(const String& text) {
+  String line = text;
+  std::ranges::replace_if(
+      line, [](unsigned char c) { return c < ' '; }, ' ');
+  syslog(LOG_USER | LOG_ERR, "QVSa: %s", line.c_str());
+}
+
+Services& current() {
+  static Services services{systemLocalTime, systemComputerName, writeEventLog};
+  return services;
+}
+
+}  // namespace
+
+const Services& services() { return current(); }
+
+Services replaceServices(Services services) { return std::exchange(current(), std::move(services)); }
+
+}  // namespace QVSa::platform

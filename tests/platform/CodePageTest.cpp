@@ -1,0 +1,44 @@
+#include <gtest/gtest.h>
+
+#include "platform/CodePage.h"
+#include "tests/support/EnvironmentLocale.h"
+
+namespace QVSa::platform {
+namespace {
+
+TEST(CodePage, FollowsTheEnvironmentsLocale) {
+  const auto codePage = [](const std::map<std::string, std::string>& variables) {
+    const test::EnvironmentLocale locale(variables);
+    return ansiCodePage();
+  };
+  EXPECT_EQ(codePage({}), "CP1252");
+  EXPECT_EQ(codePage({{"LANG", "C"}}), "CP1252");
+  EXPECT_EQ(codePage({{"LANG", "de_DE.utf8"}}), "CP1252");
+  EXPECT_EQ(codePage({{"LANG", "ru_RU.KOI8-R"}}), "KOI8-R");
+  EXPECT_EQ(codePage({{"LANG", "ru_RU.nonsense"}}), "CP1252");
+  EXPECT_EQ(codePage({{"LANG", "zh_CN.UTF-8"}}), "CP936");
+  EXPECT_EQ(codePage({{"LANG", "zh_HK.UTF-8"}}), "CP950");
+  EXPECT_EQ(codePage({{"LANG", "ja_JP.UTF-8"}}), "CP932");
+  EXPECT_EQ(codePage({{"LANG", "ko_KR.UTF-8"}}), "CP949");
+  EXPECT_EQ(codePage({{"LC_ALL", ""}, {"LC_CTYPE", "ja_JP.UTF-8"}, {"LANG", "ko_KR.UTF-8"}}), "CP932");
+  EXPECT_EQ(codePage({{"LC_ALL", "zh_TW.UTF-8"}, {"LC_CTYPE", "ja_JP.UTF-8"}}), "CP950");
+}
+
+TEST(CodePage, PutsAQuestionMarkForWhatDoesNotFit) {
+  const test::EnvironmentLocale western("fr_FR.UTF-8");
+  EXPECT_EQ(toAnsi("a\u00e9\u20ac\u201c").bytes, "a\xE9\x80\x93");
+  EXPECT_TRUE(toAnsi("a\u00e9\u20ac").oneByteEach);
+  EXPECT_EQ(toAnsi("<\u5bc6\u7801>\U0001F511").bytes, "<\?\?>?");
+  EXPECT_FALSE(toAnsi("\u5bc6").oneByteEach);
+  EXPECT_EQ(toAnsi("a\xE5\xAF").bytes, "a?");
+}
+
+TEST(CodePage, HasTwoBytesForAnEastAsianCharacter) {
+  const test::EnvironmentLocale chinese("zh_CN.UTF-8");
+  const AnsiText text = toAnsi("a\u5bc6");
+  EXPECT_EQ(text.bytes, "a\xC3\xDC");
+  EXPECT_FALSE(text.oneByteEach);
+}
+
+}  // namespace
+}  // namespace QVSa::platform
