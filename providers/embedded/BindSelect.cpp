@@ -1,0 +1,270 @@
+#include <algorithm>
+
+#include "providers/embedded/Binder.h"
+#include "providers/tsql/SqlFailure.h"
+
+namespace QVSa::embedded {
+
+namespace {
+
+using Kind = tsql::Expression::Kind;
+
+const BoundExpression& withoutCollation(const BoundExpression& expression) {
+  const bool collation = expression.kind == BoundExpression::Kind::infix && expression.text == "collate";
+  return collation ? *expression.operands[0] : expression;
+}
+
+}  // namespace
+
+BoundQuery Binder::bindQuery(const tsql::Select& select, bool updatable) {
+  BoundQuery query;
+  query.select = bindSelect(select, nullptr);
+  BoundCore& core = query.select->parts.front().core;
+  const bool oneTable = select.parts.size() == 1 && core.from.size() == 1 && core.from.front().table;
+  if (updatable && oneTable && !core.distinct && core.groupBy.empty()) {
+    query.updatable = core.from.front().table;
+    core.items.push_back({rowid(core.from.front().alias), "", std::nullopt});
+  }
+  if (!oneTable || select.parts.front().core.from.front()->hints.empty()) return query;
+
+  const auto& source = *select.parts.front().core.from.front();
+  const auto hinted = [&](const char* hint) { return std::ranges::find(source.hints, hint) != source.hints.end(); };
+  if (!hinted("xlock") && !hinted("readpast")) return query;
+  RowClaim claim{core.from.front().table, nullptr, hinted("xlock"), hinted("readpast")};
+  tsql::ObjectName table = source.table;
+  if (source.alias) table = {"", "", *source.alias, 0};
+  claim.candidates = keysOf(table, select.parts.front().core.from, select.parts.front().core.where.get());
+  Parameter locked;
+  locked.source = Parameter::Source::lockedRows;
+  BoundPtr mine = std::make_unique<BoundExpression>();
+  mine->kind = BoundExpression::Kind::inList;
+  mine->parameter = parameter(locked)->parameter;
+  mine->operands.push_back(rowid(core.from.front().alias));
+  core.where.push_back(std::move(mine));
+  query.claim = std::move(claim);
+  return query;
+}
+
+BoundSelectPtr Binder::bindSelect(const tsql::Select& select, const Scope* outer) {
+  auto bound = std::make_unique<BoundSelect>();
+  const std::size_t visible = commonTables_.size();
+  bindCommonTables(select, *bound, outer);
+  Scope scope;
+  for (const auto& part : select.parts) {
+    scope = {};
+    scope.outer = outer;
+    bound->parts.push_back({part.all, bindCore(part.core, scope)});
+  }
+  if (select.parts.size() > 1) unifyParts(*bound);
+  collateResult(*bound);
+  bindOrder(select, *bound, scope);
+  commonTables_.resize(visible);
+  return bound;
+}
+
+// A common table may read itself: its first part gives the columns, the parts behind it are bound with the name known.
+void Binder::bindCommonTables(const tsql::Select& select, BoundSelect& bound, const Scope* outer) {
+  for (const auto& table : select.with) {
+    auto body = std::make_unique<BoundSelect>();
+    const std::string emitted = "c" + std::to_string(++aliases_);
+    for (std::size_t i = 0; i < table.select->parts.size(); ++i) {
+      Scope scope;
+      scope.outer = outer;
+      body->parts.push_back({table.select->parts[i].all, bindCore(table.select->parts[i].core, scope)});
+      if (i > 0) continue;
+      auto& items = body->parts.front().core.items;
+      for (std::size_t n = 0; n < table.columns.size() && n < items.size(); ++n) items[n].name = table.columns[n];
+      commonTables_.push_back({table.name, emitted, resultColumns(*body)});
+    }
+    if (body->parts.size() > 1) unifyParts(*body);
+    const std::size_t columns = body->parts.front().core.items.size();
+    bound.with.push_back({emitted, columns, std::move(body)});
+  }
+}
+
+BoundCore Binder::bindCore(const tsql::SelectCore& core, Scope& scope) {
+  BoundCore bound;
+  bound.distinct = core.distinct;
+  if (core.topPercent) throw tsql::sqlFailure(40515, "TOP PERCENT is not supported by the embedded engine.");
+  bindFrom(core.from, scope, bound);
+  if (core.top) {
+    Parameter top = literalParameter(*core.top, Parameter::Source::literal);
+    top.type = {Base::bigint, -1};
+    top.converted = true;
+    bound.top = parameter(top)->parameter;
+  }
+  if (core.where) {
+    bound.where.push_back(bind(*core.where, scope));
+    if (bound.where.back()->aggregate)
+      throw tsql::sqlFailure(147, "An aggregate may not appear in the WHERE clause unless it is in a subquery contained "
+                                  "in a HAVING clause or a select list, and the column being aggregated is an outer "
+                                  "reference.");
+  }
+  bindItems(core, scope, bound);
+  for (const auto& expression : core.groupBy) bound.groupBy.push_back(collate(bind(*expression, scope)));
+  if (core.having) bound.having = bind(*core.having, scope);
+  checkGroup(bound, scope);
+  return bound;
+}
+
+void Binder::bindItems(const tsql::SelectCore& core, const Scope& scope, BoundCore& bound) {
+  for (const auto& item : core.items) {
+    const tsql::Expression& expression = *item.expression;
+    if (expression.kind == Kind::star) {
+      addStar(expression, scope, bound);
+      continue;
+    }
+    BoundItem result;
+    if (expression.kind == Kind::column) {
+      const Found found = findColumn(expression, scope);
+      result.name = found.column->name;
+      result.tableColumn = found.column->tableColumn;
+    }
+    if (item.alias) result.name = *item.alias;
+    result.aliased = item.alias.has_value();
+    result.expression = bind(expression, scope);
+    bound.items.push_back(std::move(result));
+  }
+}
+
+void Binder::addStar(const tsql::Expression& star, const Scope& scope, BoundCore& bound) {
+  bool known = false;
+  for (const auto& source : scope.sources) {
+    if (!star.qualifier.empty() && !sameName(source.name, star.qualifier.back())) continue;
+    known = true;
+    for (const auto& column : source.columns) {
+      auto expression = std::make_unique<BoundExpression>();
+      expression->kind = BoundExpression::Kind::column;
+      expression->source = source.alias;
+      expression->text = column.emitted;
+      expression->type = column.type;
+      expression->collated = column.collated;
+      bound.items.push_back({std::move(expression), column.name, column.tableColumn});
+    }
+  }
+  if (known) return;
+  if (star.qualifier.empty()) throw tsql::sqlFailure(263, "Must specify table to select from.");
+  throw tsql::sqlFailure(107, "The column prefix '" + star.qualifier.back() + "' does not match with a table name or "
+                              "alias name used in the query.");
+}
+
+void Binder::checkGroup(const BoundCore& core, const Scope& scope) {
+  const bool aggregates = std::ranges::any_of(core.items, [](const BoundItem& item) { return item.expression->aggregate; });
+  if (core.groupBy.empty() && !core.having && !aggregates) return;
+  for (const auto& item : core.items) checkGrouped(*item.expression, core, scope);
+  if (core.having) checkGrouped(*core.having, core, scope);
+}
+
+// Every column that is read outside an aggregate is one of the group's expressions or stands inside one.
+void Binder::checkGrouped(const BoundExpression& expression, const BoundCore& core, const Scope& scope) {
+  if (std::ranges::any_of(core.groupBy, [&](const BoundPtr& group) { return sameExpression(*group, expression); })) return;
+  const bool isAggregate = expression.kind == BoundExpression::Kind::call && expression.aggregate &&
+                           std::ranges::none_of(expression.operands, [](const BoundPtr& o) { return o->aggregate; });
+  if (isAggregate) return;
+  const bool own = expression.kind == BoundExpression::Kind::column &&
+                   std::ranges::any_of(scope.sources, [&](const ScopeSource& s) { return s.alias == expression.source; });
+  if (own)
+    throw tsql::sqlFailure(8120, "Column " + expression.text + " is invalid in the select list because it is not "
+                                 "contained in either an aggregate function or the GROUP BY clause.");
+  for (const auto& operand : expression.operands) checkGrouped(*operand, core, scope);
+}
+
+// Two texts of one expression hold two parameters where they hold a literal. If the literals are equal the expressions
+// are, and the literals become part of the statement's shape, since with others they would not be.
+bool Binder::sameExpression(const BoundExpression& first, const BoundExpression& second) {
+  const BoundExpression& a = withoutCollation(first);
+  const BoundExpression& b = withoutCollation(second);
+  if (a.kind != b.kind || a.text != b.text || a.source != b.source || a.negated != b.negated || a.select || b.select ||
+      a.operands.size() != b.operands.size())
+    return false;
+  if (a.kind == BoundExpression::Kind::parameter) {
+    Parameter& left = parameters_[a.parameter];
+    Parameter& right = parameters_[b.parameter];
+    if (left.text != right.text || !(left.type == right.type) || left.negate != right.negate) return false;
+    left.structural = right.structural = true;
+    return true;
+  }
+  if (a.kind == BoundExpression::Kind::inList) return false;
+  for (std::size_t i = 0; i < a.operands.size(); ++i)
+    if (!sameExpression(*a.operands[i], *b.operands[i])) return false;
+  return true;
+}
+
+// The parts of a union have one type a column, that of the highest precedence.
+void Binder::unifyParts(BoundSelect& select) {
+  auto& first = select.parts.front().core.items;
+  for (auto& part : select.parts)
+    if (part.core.items.size() != first.size())
+      throw tsql::sqlFailure(205, "All queries combined using a UNION, INTERSECT or EXCEPT operator must have an equal "
+                                  "number of expressions in their target lists.");
+  for (std::size_t i = 0; i < first.size(); ++i) {
+    Type type;
+    for (const auto& part : select.parts) type = common(type, part.core.items[i].expression->type);
+    for (auto& part : select.parts) {
+      BoundPtr& item = part.core.items[i].expression;
+      item = coerce(std::move(item), type, Purpose::compute);
+    }
+  }
+}
+
+// Rows are told apart by the dialect's collation.
+void Binder::collateResult(BoundSelect& select) {
+  const bool distinct = std::ranges::any_of(select.parts, [](const BoundSelect::Part& part) { return part.core.distinct; });
+  if (select.parts.size() == 1 && !distinct) return;
+  for (auto& part : select.parts)
+    for (auto& item : part.core.items) item.expression = collate(std::move(item.expression));
+}
+
+std::optional<std::size_t> Binder::ordinalOf(const tsql::Expression& expression, const tsql::Select& select,
+                                             const BoundCore& core) const {
+  if (expression.kind == Kind::literal && expression.token.kind == tsql::TokenKind::integer) {
+    const std::size_t ordinal = std::stoul(expression.token.text);
+    if (ordinal < 1 || ordinal > core.items.size())
+      throw tsql::sqlFailure(108, "The ORDER BY position number " + expression.token.text +
+                                      " is out of range of the number of items in the select list.");
+    return ordinal;
+  }
+  if (expression.kind != Kind::column || !expression.qualifier.empty()) return std::nullopt;
+  // An alias hides a column of its name. In a union the result's names are all that there is.
+  for (std::size_t i = 0; i < core.items.size(); ++i)
+    if ((core.items[i].aliased || select.parts.size() > 1) && sameName(core.items[i].name, expression.name)) return i + 1;
+  return std::nullopt;
+}
+
+void Binder::bindOrder(const tsql::Select& select, BoundSelect& bound, const Scope& scope) {
+  BoundCore& core = bound.parts.front().core;
+  for (const auto& item : select.orderBy) {
+    BoundOrder order;
+    order.descending = item.descending;
+    if (const auto ordinal = ordinalOf(*item.expression, select, core)) {
+      order.ordinal = *ordinal;
+      BoundPtr& target = core.items[*ordinal - 1].expression;
+      target = collate(std::move(target));
+      bound.orderBy.push_back(std::move(order));
+      continue;
+    }
+    if (select.parts.size() > 1)
+      throw tsql::sqlFailure(104, "ORDER BY items must appear in the select list if the statement contains a UNION, "
+                                  "INTERSECT or EXCEPT operator.");
+    order.expression = collate(bind(*item.expression, scope));
+    if (core.distinct) {
+      const auto same = std::ranges::find_if(core.items, [&](const BoundItem& candidate) {
+        return sameExpression(*candidate.expression, *order.expression);
+      });
+      if (same == core.items.end())
+        throw tsql::sqlFailure(145, "ORDER BY items must appear in the select list if SELECT DISTINCT is specified.");
+      order.ordinal = static_cast<std::size_t>(same - core.items.begin()) + 1;
+      order.expression.reset();
+    }
+    bound.orderBy.push_back(std::move(order));
+  }
+}
+
+std::vector<Binder::SourceColumn> Binder::resultColumns(const BoundSelect& select) {
+  std::vector<SourceColumn> columns;
+  for (const auto& item : select.parts.front().core.items)
+    columns.push_back({item.name, "\"c" + std::to_string(columns.size()) + "\"", item.expression->type, false, std::nullopt});
+  return columns;
+}
+
+}  // namespace QVSa::embedded

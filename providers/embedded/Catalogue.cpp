@@ -1,0 +1,143 @@
+#include "providers/embedded/Catalogue.h"
+
+#include <algorithm>
+#include <cstdlib>
+
+#include "providers/embedded/CaseFolding.h"
+#include "providers/embedded/Utf8.h"
+#include "providers/tsql/Parser.h"
+#include "providers/tsql/SqlFailure.h"
+
+namespace QVSa::embedded {
+
+namespace {
+
+TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition) {
+  TableInfo table{database, definition.table.name, {}, std::nullopt};
+  for (auto& column : definition.columns) {
+    const bool inKey = column.primaryKey || std::ranges::any_of(definition.keys, [&](const tsql::KeyDefinition& key) {
+                         return key.primary && std::ranges::any_of(key.columns, [&](const String& name) {
+                                  return sameName(name, column.name);
+                                });
+                       });
+    if (column.identity) table.identity = table.columns.size();
+    table.columns.push_back({column.name, typeOf(column.type), !inKey && !column.identity && column.nullable.value_or(true),
+                             std::move(column.defaultValue)});
+  }
+  return table;
+}
+
+}  // namespace
+
+std::optional<std::size_t> TableInfo::find(const std::string& column) const {
+  for (std::size_t i = 0; i < columns.size(); ++i)
+    if (sameName(columns[i].name, column)) return i;
+  return std::nullopt;
+}
+
+Catalogue::Catalogue(Handle& handle) : version_(currentVersion(handle)) {
+  for (std::size_t database = 0; database < databaseNames.size(); ++database) load(handle, database);
+}
+
+std::int64_t Catalogue::currentVersion(Handle& handle) {
+  Prepared query(handle.get(),
+                 "select (select catalogue from master.engine) + (select catalogue from QVSys.engine) + "
+                 "(select catalogue from QVApp.engine) + (select catalogue from QVUpdate.engine)");
+  query.step();
+  return std::get<std::int64_t>(query.column(0));
+}
+
+void Catalogue::load(Handle& handle, std::size_t database) {
+  Prepared query(handle.get(), std::string("select text from ") + databaseNames[database] + ".definitions");
+  while (query.step()) {
+    auto statements = tsql::parse(tsql::tokenize(std::get<std::string>(query.column(0))));
+    for (auto& statement : statements) {
+      if (auto* table = std::get_if<tsql::CreateTable>(&statement)) {
+        entries_.emplace(std::pair(database, foldName(table->table.name)), tableInfo(database, *table));
+      } else if (auto* view = std::get_if<tsql::CreateView>(&statement)) {
+        const std::string name = view->view.name;
+        entries_.emplace(std::pair(database, foldName(name)), ViewInfo{database, name, std::move(*view)});
+      } else if (auto* synonym = std::get_if<tsql::CreateSynonym>(&statement)) {
+        entries_.emplace(std::pair(database, foldName(synonym->synonym.name)),
+                         SynonymInfo{database, synonym->synonym.name, synonym->target});
+      }
+    }
+  }
+}
+
+const Catalogue::Entry* Catalogue::lookUp(std::size_t database, const std::string& name) const {
+  const auto entry = entries_.find({database, foldName(name)});
+  return entry == entries_.end() ? nullptr : &entry->second;
+}
+
+Object Catalogue::find(const tsql::ObjectName& name, std::size_t currentDatabase) const {
+  std::size_t database = currentDatabase;
+  if (!name.database.empty()) {
+    const auto known = databaseByName(name.database);
+    if (!known) throw tsql::sqlFailure(911, "Database '" + name.database + "' does not exist.");
+    database = *known;
+  }
+  const Entry* entry = lookUp(database, name.name);
+  // A synonym names a table or a view, never another synonym, so one step is enough.
+  if (entry)
+    if (const auto* synonym = std::get_if<SynonymInfo>(entry))
+      entry = lookUp(databaseByName(synonym->target.database).value_or(synonym->database), synonym->target.name);
+  if (entry) {
+    if (const auto* table = std::get_if<TableInfo>(entry)) return table;
+    if (const auto* view = std::get_if<ViewInfo>(entry)) return view;
+  }
+  throw tsql::sqlFailure(208, "Invalid object name '" + name.name + "'.");
+}
+
+bool Catalogue::exists(std::size_t database, const std::string& name) const { return lookUp(database, name) != nullptr; }
+
+const SynonymInfo* Catalogue::synonym(std::size_t database, const std::string& name) const {
+  const Entry* entry = lookUp(database, name);
+  return entry ? std::get_if<SynonymInfo>(entry) : nullptr;
+}
+
+std::optional<std::size_t> databaseByName(const std::string& name) {
+  for (std::size_t i = 0; i < databaseNames.size(); ++i)
+    if (sameName(name, databaseNames[i])) return i;
+  return std::nullopt;
+}
+
+Type typeOf(const tsql::TypeName& name) {
+  static const std::map<std::string, Base> known = {
+      {"bit", Base::bit},           {"tinyint", Base::tinyint},   {"smallint", Base::smallint},
+      {"int", Base::integer},       {"integer", Base::integer},   {"bigint", Base::bigint},
+      {"decimal", Base::decimal},   {"numeric", Base::decimal},   {"money", Base::decimal},
+      {"float", Base::real},        {"real", Base::real},         {"smalldatetime", Base::smalldatetime},
+      {"datetime", Base::datetime}, {"varchar", Base::varchar},   {"char", Base::varchar},
+      {"nvarchar", Base::nvarchar}, {"nchar", Base::nvarchar},    {"text", Base::ntext},
+      {"ntext", Base::ntext},       {"image", Base::image},       {"binary", Base::image},
+      {"varbinary", Base::image}};
+  const auto base = known.find(name.name);
+  if (base == known.end()) throw tsql::sqlFailure(2715, "Cannot find data type " + name.name + ".");
+  const bool sized = base->second == Base::varchar || base->second == Base::nvarchar ||
+                     (base->second == Base::image && name.name != "image");
+  if (!sized) return {base->second, -1};
+  return {base->second, static_cast<int>(name.size.value_or(1))};
+}
+
+std::string foldName(const std::string& name) {
+  std::string folded;
+  folded.reserve(name.size());
+  const char* at = name.data();
+  const char* end = at + name.size();
+  while (at != end) appendSymbol(folded, foldCase(nextSymbol(at, end)));
+  return folded;
+}
+
+bool sameName(const std::string& a, const std::string& b) { return a == b || foldName(a) == foldName(b); }
+
+std::string quoteName(const std::string& name) {
+  std::string quoted = "\"";
+  for (const char c : name) {
+    if (c == '"') quoted += '"';
+    quoted += c;
+  }
+  return quoted + '"';
+}
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,82 @@
+#pragma once
+
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <variant>
+#include <vector>
+
+#include "providers/embedded/Handle.h"
+#include "providers/embedded/Types.h"
+#include "providers/tsql/Tree.h"
+
+namespace QVSa::embedded {
+
+struct ColumnInfo {
+  std::string name;
+  Type type;
+  bool nullable = true;
+  tsql::ExpressionPtr defaultValue;  // empty where the column has none
+};
+
+struct TableInfo {
+  std::size_t database = 0;  // position in databaseNames
+  std::string name;
+  std::vector<ColumnInfo> columns;
+  std::optional<std::size_t> identity;  // the identity column, which is the row's key in the file as well
+
+  std::optional<std::size_t> find(const std::string& column) const;
+};
+
+struct ViewInfo {
+  std::size_t database = 0;
+  std::string name;
+  tsql::CreateView definition;
+};
+
+struct SynonymInfo {
+  std::size_t database = 0;
+  std::string name;
+  tsql::ObjectName target;
+};
+
+using Object = std::variant<const TableInfo*, const ViewInfo*>;
+
+// What the databases of an installation hold, as it was when it was loaded.
+class Catalogue {
+ public:
+  explicit Catalogue(Handle& handle);
+
+  // Changes with every definition in any database, by whichever session: a catalogue of another version is out of date.
+  static std::int64_t currentVersion(Handle& handle);
+  std::int64_t version() const { return version_; }
+
+  // The table or view of that name, through synonyms. Throws 208 where there is none, 911 for an unknown database.
+  Object find(const tsql::ObjectName& name, std::size_t currentDatabase) const;
+  // Whether a name is taken in a database by a table, a view or a synonym.
+  bool exists(std::size_t database, const std::string& name) const;
+  const SynonymInfo* synonym(std::size_t database, const std::string& name) const;
+
+ private:
+  using Entry = std::variant<TableInfo, ViewInfo, SynonymInfo>;
+  const Entry* lookUp(std::size_t database, const std::string& name) const;
+  void load(Handle& handle, std::size_t database);
+
+  std::int64_t version_ = 0;
+  std::map<std::pair<std::size_t, std::string>, Entry> entries_;
+};
+
+// The position of a database by its name, any case; nothing for an unknown one.
+std::optional<std::size_t> databaseByName(const std::string& name);
+
+// The engine's type for a type's name. Throws 2715 for an unknown one.
+Type typeOf(const tsql::TypeName& name);
+
+// A name as names are compared: without regard to case.
+std::string foldName(const std::string& name);
+bool sameName(const std::string& a, const std::string& b);
+// A name as the storage library's texts hold it: "name", quotation marks doubled.
+std::string quoteName(const std::string& name);
+
+}  // namespace QVSa::embedded

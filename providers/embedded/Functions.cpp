@@ -1,0 +1,100 @@
+#include "providers/embedded/Functions.h"
+
+#include <exception>
+#include <memory>
+#include <utility>
+
+#include "providers/embedded/Collation.h"
+#include "providers/embedded/Conversions.h"
+#include "providers/embedded/Function.h"
+#include "providers/embedded/ListTable.h"
+#include "providers/embedded/StorageFailure.h"
+#include "providers/embedded/StoredValue.h"
+
+namespace QVSa::embedded {
+
+namespace {
+
+// A result code of our own: the step failed for the exception that is kept here, on the thread that ran it.
+constexpr int functionFailed = SQLITE_ERROR | (0x7F << 8);
+thread_local std::exception_ptr keptFailure;
+
+struct Registered {
+  const Function* function;
+  FunctionContext* session;
+};
+
+// Nothing may be thrown through the storage library's frames.
+void keep(sqlite3_context* context, const char* text) {
+  keptFailure = std::current_exception();
+  sqlite3_result_error(context, text, -1);
+  sqlite3_result_error_code(context, functionFailed);
+}
+
+void run(sqlite3_context* context, int count, sqlite3_value** arguments) {
+  const auto* const registered = static_cast<const Registered*>(sqlite3_user_data(context));
+  try {
+    Call call(context, count, arguments, *registered->session);
+    if (!call.anyNull()) registered->function->body(call);
+  } catch (const std::exception& e) {
+    keep(context, e.what());
+  }
+}
+
+void convertValue(Call& call) {
+  const Type from{static_cast<Base>(call.whole(1)), -1};
+  const Type to{static_cast<Base>(call.whole(2)), static_cast<int>(call.whole(3))};
+  call.give(convert(call.value(0), from, to, static_cast<Purpose>(call.whole(4)), static_cast<int>(call.whole(5))));
+}
+
+void scopeIdentity(Call& call) {
+  if (call.session().hasScopeIdentity) call.give(call.session().scopeIdentity);
+}
+
+constexpr Function sessionFunctions[] = {{"t_convert", 6, convertValue}, {"t_scope_identity", 0, scopeIdentity, false}};
+
+void registerAll(sqlite3* handle, FunctionContext& session, std::span<const Function> functions) {
+  const auto destroy = [](void* registered) { delete static_cast<Registered*>(registered); };
+  for (const Function& function : functions) {
+    const int flags = SQLITE_UTF8 | SQLITE_INNOCUOUS | (function.sameEachTime ? SQLITE_DETERMINISTIC : 0);
+    auto registered = std::make_unique<Registered>(Registered{&function, &session});
+    // The library destroys the client data where it fails, too.
+    const int code = sqlite3_create_function_v2(handle, function.name, function.arguments, flags, registered.release(),
+                                                run, nullptr, nullptr, destroy);
+    if (code != SQLITE_OK) throwStorageFailure(handle, code);
+  }
+}
+
+}  // namespace
+
+bool Call::anyNull() const {
+  for (int i = 0; i < count_; ++i)
+    if (isNull(i)) return true;
+  return false;
+}
+
+std::string_view Call::text(int i) const {
+  const unsigned char* const text = sqlite3_value_text(arguments_[i]);
+  if (text == nullptr) throw std::bad_alloc();
+  return {reinterpret_cast<const char*>(text), static_cast<std::size_t>(sqlite3_value_bytes(arguments_[i]))};
+}
+
+Value Call::value(int i) const { return readValue(arguments_[i]); }
+
+void Call::give(const Value& value) { giveResult(context_, value); }
+
+void registerFunctions(sqlite3* handle, FunctionContext& context) {
+  registerCollation(handle);
+  registerAll(handle, context, sessionFunctions);
+  registerAll(handle, context, textFunctions());
+  registerAll(handle, context, dateFunctions());
+  registerAll(handle, context, numberFunctions());
+  registerListTable(handle);
+}
+
+void rethrowFailure(sqlite3* handle) {
+  if (sqlite3_extended_errcode(handle) != functionFailed || !keptFailure) return;
+  std::rethrow_exception(std::exchange(keptFailure, nullptr));
+}
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,97 @@
+#pragma once
+
+#include <array>
+#include <chrono>
+#include <filesystem>
+#include <memory>
+#include <optional>
+#include <random>
+#include <sqlite3.h>
+#include <string>
+#include <sys/types.h>
+#include <vector>
+
+#include "QVSa/frame/Failure.h"
+#include "providers/embedded/Functions.h"
+#include "providers/embedded/Layout.h"
+#include "providers/embedded/Prepared.h"
+#include "providers/embedded/RowLocks.h"
+
+namespace QVSa::embedded {
+
+// What everything of the engine answers in a process that was forked from one that had used it: the storage library's
+// record of its locks is inherited, the locks are not, and even new handles would read mixtures.
+Failure usedAfterFork();
+
+// One handle of the storage library with all databases of an installation attached under their names, its functions and
+// its collation registered: WAL journal, full sync. Waits for the writer with short random sleeps up to the deadline,
+// and stops a statement that runs over it.
+class Handle {
+ public:
+  // Opens the files of an installation that exists. Throws 17 for a folder that is missing or no installation, 4060 for
+  // a file that is no database, is damaged, cannot be read or written, or has a newer layout.
+  explicit Handle(const std::filesystem::path& folder);
+  ~Handle();
+  Handle(const Handle&) = delete;
+  Handle& operator=(const Handle&) = delete;
+
+  const std::filesystem::path& folder() const { return folder_; }
+  sqlite3* get() const { return handle_; }
+  FunctionContext& context() { return context_; }
+  RowLocks& locks(std::size_t database);
+  // Lets the row locks on all databases go.
+  void releaseLocks();
+
+  // The moment after which a wait ends with SQLITE_BUSY and a running statement with SQLITE_INTERRUPT; none: no limit.
+  void deadline(std::optional<std::chrono::steady_clock::time_point> value) { deadline_ = value; }
+  std::optional<std::chrono::steady_clock::time_point> deadline() const { return deadline_; }
+
+  // What the user of the handle keeps with it from session to session. It goes before the handle does.
+  std::shared_ptr<void>& attachment() { return attachment_; }
+
+  // Throws 0x80004005 in a process that was forked from the one that opened the handle.
+  void requireOwnProcess() const;
+  // Whether the folder still holds the installation that this handle has open: a look at its first file.
+  bool isCurrent() const;
+
+  // Sleeps for a moment, random and short. Throws the time-out where the deadline has passed.
+  void waitShortly();
+  // Takes the writer's place of one database, inside a transaction of the handle: a write that changes nothing.
+  void takeWriter(std::size_t database);
+  // Runs statements of the storage library that give no rows.
+  void execute(const std::string& text);
+  // Whether a transaction of the storage library is open.
+  bool inTransaction() const;
+  // The stored digest of a log-in's password; empty for a log-in that does not exist.
+  std::string loginDigest(const std::string& user);
+
+  // Ends what a session may have left: running statements, a transaction, row locks, the deadline, the last identity.
+  void clear();
+
+ private:
+  static int onBusy(void* self, int count);
+  static int onProgress(void* self);
+
+  void open();
+  void attach(std::size_t database);
+  void check(const std::string& database);
+  void resetStatements();
+  bool isLate() const;
+  void sleep();
+
+  std::filesystem::path folder_;
+  pid_t process_;
+  std::string master_;  // the path of the first file, and which file that is
+  dev_t masterDevice_ = 0;
+  ino_t masterNumber_ = 0;
+  sqlite3* handle_ = nullptr;
+  FunctionContext context_;
+  std::array<std::unique_ptr<RowLocks>, databaseNames.size()> locks_;
+  std::vector<Prepared> gates_;
+  std::optional<Prepared> login_;
+  std::shared_ptr<void> attachment_;
+  std::optional<std::chrono::steady_clock::time_point> deadline_;
+  std::minstd_rand random_;
+};
+
+}  // namespace QVSa::embedded

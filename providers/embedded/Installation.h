@@ -1,0 +1,32 @@
+#pragma once
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+#include "QVSa/frame/Values.h"
+
+namespace QVSa::embedded {
+
+struct DatabaseScript {
+  String database;  // QVSys, QVApp or QVUpdate
+  String script;    // T-SQL with GO between its batches
+};
+
+struct InstallationPlan {
+  std::filesystem::path folder;
+  String userPassword;                  // of the log-in QVUser, which owns the three databases
+  String adminPassword;                 // of the log-in sa
+  std::vector<DatabaseScript> scripts;  // run in this order, each in its database
+};
+
+// Makes an installation: the folder where it is missing, one file a database, the lock files, the log-ins, then the
+// scripts. It is built in a folder beside the target and renamed, so that a failure leaves nothing behind.
+// Throws 58 where the folder exists and is not empty, 75 or 70 where it cannot be made, 0x80004005 on a network file
+// system.
+void createInstallation(const InstallationPlan& plan);
+
+// Whether the folder holds an installation of the engine.
+bool isInstallation(const std::filesystem::path& folder);
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,22 @@
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <filesystem>
+#include <string>
+
+namespace QVSa::embedded {
+
+// The databases of an installation, in the order in which a handle attaches them.
+inline constexpr std::array<const char*, 4> databaseNames = {"master", "QVSys", "QVApp", "QVUpdate"};
+
+// The layout of the files that this build writes, and the mark that tells an installation's file from any other.
+// Each file holds engine(layout, catalogue), one row: its layout and a count of changed definitions; and gate(n),
+// empty, which is written to where the writer's place has to be taken and nothing else is to change.
+inline constexpr int layoutVersion = 1;
+inline constexpr int applicationId = 0x51565361;
+
+std::filesystem::path databaseFile(const std::filesystem::path& folder, const std::string& database);
+std::filesystem::path lockFile(const std::filesystem::path& folder, const std::string& database);
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,21 @@
+#pragma once
+
+#include <memory>
+#include <vector>
+
+#include "providers/embedded/Types.h"
+
+struct sqlite3;
+struct sqlite3_stmt;
+
+namespace QVSa::embedded {
+
+using ValueList = std::vector<Value>;
+
+// The table-valued function list(?) with one column, value: what makes "in (1, 2, ...)" one parameter.
+void registerListTable(sqlite3* handle);
+
+// Binds the values to the parameter; it keeps its share of them until it is bound anew.
+void bindList(sqlite3_stmt* statement, int parameter, std::shared_ptr<const ValueList> values);
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,62 @@
+#include "providers/embedded/Login.h"
+
+#include <algorithm>
+#include <mutex>
+#include <vector>
+
+#include "platform/Fingerprint.h"
+#include "platform/PasswordDigest.h"
+#include "platform/SecretMessage.h"
+#include "providers/tsql/SqlFailure.h"
+
+namespace QVSa::embedded {
+
+namespace {
+
+// Fingerprints of the log-ins that were checked in this process.
+class CheckedLogins {
+ public:
+  bool contains(const Bytes& fingerprint) {
+    const std::lock_guard guard(mutex_);
+    return std::find(known_.begin(), known_.end(), fingerprint) != known_.end();
+  }
+
+  void add(const Bytes& fingerprint) {
+    const std::lock_guard guard(mutex_);
+    // A process has a log-in or two; who tries thousands pays the slow way again.
+    if (known_.size() >= most) known_.clear();
+    known_.push_back(fingerprint);
+  }
+
+ private:
+  static constexpr std::size_t most = 64;
+
+  std::mutex mutex_;
+  std::vector<Bytes> known_;
+};
+
+CheckedLogins& checkedLogins() {
+  static CheckedLogins theLogins;
+  return theLogins;
+}
+
+// The digest is salted: the same one for the same password means the same log-in.
+Bytes fingerprintOf(const std::string& digest, const std::string& password) {
+  std::string text = digest + '\0' + password;
+  const Bytes result = platform::fingerprint(text);
+  platform::clearSecret(text);
+  return result;
+}
+
+}  // namespace
+
+void checkLogin(Handle& handle, const std::string& user, const std::string& password) {
+  const std::string digest = handle.loginDigest(user);
+  const Bytes fingerprint = fingerprintOf(digest, password);
+  if (checkedLogins().contains(fingerprint)) return;
+  if (!platform::passwordMatches(password, digest))
+    throw tsql::sqlFailure(18456, "Login failed for user '" + user + "'.");
+  checkedLogins().add(fingerprint);
+}
+
+}  // namespace QVSa::embedded

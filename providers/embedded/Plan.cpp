@@ -1,0 +1,156 @@
+#include "providers/embedded/Plan.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <set>
+
+#include "providers/embedded/Binder.h"
+#include "providers/embedded/Emitter.h"
+#include "providers/embedded/Literal.h"
+#include "providers/tsql/OuterJoins.h"
+
+namespace QVSa::embedded {
+
+namespace {
+
+// More than the library's own statements have shapes; a host that writes endless ones starts over.
+constexpr std::size_t cacheLimit = 1000;
+
+void setColumns(Step& step, const BoundSelect& select) {
+  for (const auto& item : select.parts.front().core.items) {
+    const Type& type = item.expression->type;
+    step.columns.push_back({item.name, type.base == Base::ntext || type.base == Base::image});
+    step.results.push_back({type, item.tableColumn});
+  }
+}
+
+void setClaim(Step& step, const RowClaim& claim) {
+  step.table = claim.table;
+  step.locks = claim.lock;
+  step.skips = claim.skip;
+  step.candidates = std::make_unique<Compiled>(emit(*claim.candidates));
+}
+
+Step compileQuery(const tsql::Select& select, Binder& binder, bool updatable) {
+  Step step;
+  step.kind = Step::Kind::query;
+  const BoundQuery query = binder.bindQuery(select, updatable);
+  step.main = std::make_unique<Compiled>(emit(*query.select));
+  setColumns(step, *query.select);
+  if (query.claim) setClaim(step, *query.claim);
+  if (query.updatable) {
+    step.table = query.updatable;
+    step.updatable = true;
+    step.columns.pop_back();
+    step.results.pop_back();
+  }
+  return step;
+}
+
+Step compileInsert(const tsql::Insert& insert, Binder& binder) {
+  Step step;
+  step.kind = Step::Kind::insert;
+  const BoundInsert bound = binder.bindInsert(insert);
+  step.table = bound.table;
+  step.givesIdentity = bound.givesIdentity;
+  step.main = std::make_unique<Compiled>(emit(bound));
+  return step;
+}
+
+template <class BoundWrite>
+Step compileWrite(const BoundWrite& bound) {
+  Step step;
+  step.kind = Step::Kind::write;
+  step.main = std::make_unique<Compiled>(emit(bound));
+  setClaim(step, bound.claim);
+  return step;
+}
+
+Step compileStatement(tsql::Statement& statement, Binder& binder, bool updatable) {
+  if (const auto* select = std::get_if<tsql::SelectPtr>(&statement)) return compileQuery(**select, binder, updatable);
+  if (const auto* insert = std::get_if<tsql::Insert>(&statement)) return compileInsert(*insert, binder);
+  if (const auto* update = std::get_if<tsql::Update>(&statement)) return compileWrite(binder.bindUpdate(*update));
+  if (const auto* erase = std::get_if<tsql::Delete>(&statement)) return compileWrite(binder.bindDelete(*erase));
+  Step step;
+  step.control = std::move(statement);
+  return step;
+}
+
+template <class Visit>
+void forEachLiteral(const std::vector<tsql::Token>& tokens, Visit visit) {
+  for (const auto& token : tokens)
+    if (tsql::isLiteral(token.kind)) visit(token);
+}
+
+}  // namespace
+
+Prepared Compiled::take(Handle& handle) {
+  if (!idle_.empty()) {
+    Prepared statement = std::move(idle_.back());
+    idle_.pop_back();
+    return statement;
+  }
+  Prepared statement(handle.get(), text_);
+  if (parameters_.empty())
+    for (int i = 1; i <= sqlite3_bind_parameter_count(statement.get()); ++i)
+      if (sqlite3_bind_parameter_name(statement.get(), i)) parameters_.push_back(static_cast<std::size_t>(i - 1));
+  return statement;
+}
+
+void Compiled::giveBack(Prepared statement) {
+  statement.reset();
+  idle_.push_back(std::move(statement));
+}
+
+Step compile(tsql::Statement statement, const Catalogue& catalogue, std::size_t database, bool updatable,
+             ShapeFacts& facts) {
+  tsql::rewriteOuterJoins(statement);
+  Binder binder(catalogue, database);
+  Step step = compileStatement(statement, binder, updatable);
+  step.parameters = binder.takeParameters();
+  for (const auto& pattern : binder.takePatterns()) facts.patterns.push_back(pattern);
+  std::set<std::size_t> structural;
+  for (const auto& parameter : step.parameters)
+    if (parameter.structural) structural.insert(parameter.literal);
+  for (const auto& parameter : step.parameters)
+    if (!parameter.own && parameter.source != Parameter::Source::lockedRows && !structural.contains(parameter.literal))
+      facts.parameters.push_back(parameter.literal);
+  return step;
+}
+
+std::string PlanCache::variant(const Shape& shape, const std::vector<tsql::Token>& tokens) {
+  std::string text;
+  if (shape.values.empty() && shape.patterns.empty()) return text;
+  forEachLiteral(tokens, [&](const tsql::Token& token) {
+    if (std::ranges::find(shape.values, token.literal) != shape.values.end())
+      text += std::to_string(token.text.size()) + ":" + token.text;
+    else if (std::ranges::find(shape.patterns, token.literal) != shape.patterns.end())
+      text += likePrefix(token.text).empty() ? '%' : 'p';
+  });
+  return text;
+}
+
+std::shared_ptr<Plan> PlanCache::find(const std::string& shape, const std::vector<tsql::Token>& tokens) const {
+  const auto known = shapes_.find(shape);
+  if (known == shapes_.end()) return nullptr;
+  const auto plan = known->second.plans.find(variant(known->second, tokens));
+  return plan == known->second.plans.end() ? nullptr : plan->second;
+}
+
+void PlanCache::add(const std::string& shape, const std::vector<tsql::Token>& tokens, const ShapeFacts& facts,
+                    std::shared_ptr<Plan> plan) {
+  if (++size_ > cacheLimit) {
+    shapes_.clear();
+    size_ = 1;
+  }
+  Shape& known = shapes_[shape];
+  if (known.plans.empty()) {
+    known.patterns = facts.patterns;
+    forEachLiteral(tokens, [&](const tsql::Token& token) {
+      if (std::ranges::find(facts.parameters, token.literal) == facts.parameters.end()) known.values.push_back(token.literal);
+    });
+  }
+  known.plans[variant(known, tokens)] = std::move(plan);
+}
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,72 @@
+#include "providers/embedded/Pool.h"
+
+#include <atomic>
+#include <mutex>
+#include <unistd.h>
+
+namespace QVSa::embedded {
+
+namespace {
+
+// The one idle handle of the process. Handles are closed outside the mutex: that can take a checkpoint.
+class Pool {
+ public:
+  // The idle handle if it is one of this folder; an idle one of another folder stays.
+  std::unique_ptr<Handle> take(const std::filesystem::path& folder) {
+    const std::lock_guard guard(mutex_);
+    return idle_ && idle_->folder().native() == folder.native() ? std::move(idle_) : nullptr;
+  }
+
+  // Keeps the handle; the one that was kept comes back.
+  std::unique_ptr<Handle> keep(std::unique_ptr<Handle> handle) {
+    const std::lock_guard guard(mutex_);
+    std::swap(idle_, handle);
+    return handle;
+  }
+
+ private:
+  std::mutex mutex_;
+  std::unique_ptr<Handle> idle_;
+};
+
+std::filesystem::path placeOf(const std::filesystem::path& folder) {
+  return folder.is_absolute() ? folder : std::filesystem::absolute(folder);
+}
+
+Pool& pool() {
+  static Pool thePool;
+  return thePool;
+}
+
+// Checked before the mutex is touched, which another thread may have held at the moment of the fork.
+bool isFirstProcess() {
+  static std::atomic<pid_t> first = 0;
+  pid_t none = 0;
+  const pid_t self = ::getpid();
+  return first.compare_exchange_strong(none, self) || none == self;
+}
+
+}  // namespace
+
+void GiveBack::operator()(Handle* handle) const noexcept {
+  std::unique_ptr<Handle> owned(handle);
+  if (!isFirstProcess()) return;
+  try {
+    owned->clear();
+  } catch (...) {
+    // A handle that cannot be cleared is closed, which ends all that it holds.
+    return;
+  }
+  owned = pool().keep(std::move(owned));
+}
+
+PooledHandle acquireHandle(const std::filesystem::path& folder) {
+  if (!isFirstProcess()) throw usedAfterFork();
+  const std::filesystem::path place = placeOf(folder);
+  if (auto idle = pool().take(place); idle && idle->isCurrent()) return PooledHandle(idle.release());
+  return PooledHandle(new Handle(place));
+}
+
+void discardIdleHandle(const std::filesystem::path& folder) { pool().take(placeOf(folder)); }
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,23 @@
+#pragma once
+
+#include <memory>
+
+#include "providers/embedded/Handle.h"
+
+namespace QVSa::embedded {
+
+// Gives a handle back to the process's pool, cleared; one idle handle is kept, the last one given back.
+struct GiveBack {
+  void operator()(Handle* handle) const noexcept;
+};
+
+using PooledHandle = std::unique_ptr<Handle, GiveBack>;
+
+// The idle handle of this folder, if its files are still the same, or a new one. Throws as Handle does, and 0x80004005
+// in a process that was forked from one that had used the engine. Threads may call it at once.
+PooledHandle acquireHandle(const std::filesystem::path& folder);
+
+// Closes the idle handle of the folder, before its files are moved or removed.
+void discardIdleHandle(const std::filesystem::path& folder);
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,94 @@
+#include "providers/embedded/RowLocks.h"
+
+#include <cerrno>
+#include <fcntl.h>
+#include <system_error>
+#include <unistd.h>
+
+#include "providers/embedded/CaseFolding.h"
+#include "providers/embedded/Utf8.h"
+#include "providers/tsql/SqlFailure.h"
+
+namespace QVSa::embedded {
+
+namespace {
+
+constexpr int keyBits = 40;
+constexpr int hashBits = 23;
+constexpr std::int64_t rangeLength = std::int64_t{1} << keyBits;
+
+// FNV-1a. Every program that opens the installation has to come to the same number.
+std::int64_t rangeOf(const std::string& table) {
+  std::uint64_t hash = 0xCBF29CE484222325U;
+  const char* const end = table.data() + table.size();
+  for (const char* at = table.data(); at < end;) hash = (hash ^ foldCase(nextSymbol(at, end))) * 0x100000001B3U;
+  const std::uint64_t folded = (hash ^ hash >> 32) % ((std::uint64_t{1} << hashBits) - 1) + 1;
+  return static_cast<std::int64_t>(folded << keyBits);
+}
+
+std::int64_t byteOf(std::int64_t range, std::int64_t row) { return range + (row & (rangeLength - 1)); }
+
+struct flock rangeLock(short type, std::int64_t start, std::int64_t length) {
+  struct flock lock {};  // open file description locks want l_pid to be 0
+  lock.l_type = type;
+  lock.l_whence = SEEK_SET;
+  lock.l_start = start;
+  lock.l_len = length;
+  return lock;
+}
+
+[[noreturn]] void throwLockFailure() {
+  throw Failure(number::general, "SQL Server",
+                "The lock file cannot be used: " + std::generic_category().message(errno));
+}
+
+}  // namespace
+
+RowLocks::RowLocks(const std::filesystem::path& lockFile) : file_(::open(lockFile.c_str(), O_RDWR | O_CLOEXEC)) {
+  if (file_ < 0)
+    throw tsql::sqlFailure(4060, "Cannot open database \"" + lockFile.stem().string() +
+                                     "\": its lock file: " + std::generic_category().message(errno) + ".");
+}
+
+RowLocks::~RowLocks() { ::close(file_); }
+
+bool RowLocks::tryLock(const std::string& table, std::int64_t row) {
+  const std::int64_t range = rangeOf(table);
+  const auto found = held_.find(range);
+  if (found != held_.end() && (found->second.whole || found->second.rows.contains(row))) return true;
+  if (found != held_.end() && found->second.rows.size() >= mostRows && take(range, rangeLength)) {
+    found->second.whole = true;
+    return true;
+  }
+  if (!take(byteOf(range, row), 1)) return false;
+  held_[range].rows.insert(row);
+  return true;
+}
+
+bool RowLocks::othersHold(const std::string& table) const { return isTaken(rangeOf(table), rangeLength); }
+
+bool RowLocks::othersHold(const std::string& table, std::int64_t row) const {
+  return isTaken(byteOf(rangeOf(table), row), 1);
+}
+
+void RowLocks::release() {
+  if (held_.empty()) return;
+  struct flock lock = rangeLock(F_UNLCK, 0, 0);
+  if (::fcntl(file_, F_OFD_SETLK, &lock) != 0) throwLockFailure();
+  held_.clear();
+}
+
+bool RowLocks::take(std::int64_t start, std::int64_t length) {
+  struct flock lock = rangeLock(F_WRLCK, start, length);
+  if (::fcntl(file_, F_OFD_SETLK, &lock) == 0) return true;
+  if (errno == EAGAIN || errno == EACCES) return false;
+  throwLockFailure();
+}
+
+bool RowLocks::isTaken(std::int64_t start, std::int64_t length) const {
+  struct flock lock = rangeLock(F_WRLCK, start, length);
+  if (::fcntl(file_, F_OFD_GETLK, &lock) != 0) throwLockFailure();
+  return lock.l_type != F_UNLCK;
+}
+
+}  // namespace QVSa::embedded

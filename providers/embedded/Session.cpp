@@ -1,0 +1,352 @@
+#include "providers/embedded/Session.h"
+
+#include <algorithm>
+
+#include "platform/Services.h"
+#include "providers/embedded/Definitions.h"
+#include "providers/embedded/Literal.h"
+#include "providers/embedded/Rows.h"
+#include "providers/tsql/Parser.h"
+#include "providers/tsql/SqlFailure.h"
+
+namespace QVSa::embedded {
+
+// What a handle keeps between sessions: the catalogue, and the plans that were bound against it.
+struct EmbeddedSession::Cache {
+  std::shared_ptr<const Catalogue> catalogue;
+  std::array<PlanCache, 2 * databaseNames.size()> plans;  // by current database and whether rows are to be written back
+};
+
+namespace {
+
+bool changesNames(const tsql::Statement& statement) {
+  return std::holds_alternative<tsql::Use>(statement) || isDefinition(statement);
+}
+
+std::pair<std::size_t, std::string> tableKey(const TableInfo& table) { return {table.database, foldName(table.name)}; }
+
+void skipResult(Prepared& statement) {
+  while (statement.step()) {
+  }
+}
+
+Value parameterValue(const Parameter& parameter, const tsql::Token& token) {
+  switch (parameter.source) {
+    case Parameter::Source::prefixLow:
+      return likePrefix(token.text);
+    case Parameter::Source::prefixHigh:
+      // Nothing that begins with the prefix stands behind it followed by the last character that there is.
+      return likePrefix(token.text) + "\xF4\x8F\xBF\xBF";
+    default:
+      break;
+  }
+  Value value = literalValue(token, parameter.negate);
+  if (!parameter.converted) return value;
+  return convert(value, literalType(token.kind), parameter.type, parameter.purpose, parameter.style);
+}
+
+std::shared_ptr<const ValueList> listValue(const Parameter& parameter, const tsql::Token& list) {
+  auto values = std::make_shared<ValueList>();
+  values->reserve(list.items.size());
+  for (const auto& item : list.items)
+    values->push_back(convert(literalValue(item, false), literalType(item.kind), parameter.type, Purpose::compute));
+  return values;
+}
+
+Failure deadlock() {
+  return tsql::sqlFailure(1205, "Transaction was deadlocked on lock resources with another process and has been chosen as "
+                                "the deadlock victim. Rerun the transaction.");
+}
+
+}  // namespace
+
+EmbeddedSession::EmbeddedSession(PooledHandle handle, std::size_t database, bool administrator)
+    : handle_(std::move(handle)), database_(database), administrator_(administrator) {
+  if (!handle_->attachment()) handle_->attachment() = std::make_shared<Cache>();
+  cache_ = std::static_pointer_cast<Cache>(handle_->attachment());
+  refreshCatalogue();
+}
+
+EmbeddedSession::~EmbeddedSession() {
+  for (auto* rows : rows_) rows->close();
+  try {
+    endTransaction();
+    if (handle_->inTransaction()) handle_->execute("rollback");
+  } catch (const Failure&) {
+    // The pool does not keep a handle whose transaction could not be ended.
+  }
+}
+
+void EmbeddedSession::refreshCatalogue() {
+  if (cache_->catalogue && cache_->catalogue->version() == Catalogue::currentVersion(*handle_)) return;
+  for (auto& plans : cache_->plans) plans.clear();
+  cache_->catalogue = std::make_shared<const Catalogue>(*handle_);
+}
+
+BatchResult EmbeddedSession::run(const Batch& batch) {
+  handle_->requireOwnProcess();
+  if (batch.timeout.count() > 0)
+    handle_->deadline(std::chrono::steady_clock::now() + batch.timeout);
+  else
+    handle_->deadline(std::nullopt);
+  auto tokens = tsql::tokenize(batch.text);
+  BatchResult result;
+  if (const auto plan = planFor(batch, tokens)) {
+    for (auto& step : plan->steps) runStep(plan, step, tokens, result);
+    return result;
+  }
+  return runUncached(tsql::parse(tokens), batch, tokens);
+}
+
+std::shared_ptr<Plan> EmbeddedSession::planFor(const Batch& batch, std::vector<tsql::Token>& tokens) {
+  PlanCache& plans = cache_->plans[2 * database_ + (batch.updatable ? 1 : 0)];
+  const std::string shape = tsql::shapeOf(tokens);
+  if (auto known = plans.find(shape, tokens)) return known;
+  auto statements = tsql::parse(tokens);
+  if (std::ranges::any_of(statements, changesNames)) return nullptr;
+  auto plan = std::make_shared<Plan>();
+  plan->catalogue = cache_->catalogue;
+  ShapeFacts facts;
+  try {
+    for (auto& statement : statements)
+      plan->steps.push_back(compile(std::move(statement), *plan->catalogue, database_, batch.updatable, facts));
+  } catch (const Failure& failure) {
+    // Another session may have made the object since this one looked.
+    if (cache_->catalogue->version() == Catalogue::currentVersion(*handle_)) throw;
+    refreshCatalogue();
+    return planFor(batch, tokens);
+  }
+  plans.add(shape, tokens, facts, plan);
+  return plan;
+}
+
+BatchResult EmbeddedSession::runUncached(std::vector<tsql::Statement> statements, const Batch& batch,
+                                         const std::vector<tsql::Token>& tokens) {
+  BatchResult result;
+  for (auto& statement : statements) {
+    auto plan = std::make_shared<Plan>();
+    plan->catalogue = cache_->catalogue;
+    ShapeFacts facts;
+    plan->steps.push_back(compile(std::move(statement), *plan->catalogue, database_, batch.updatable, facts));
+    runStep(plan, plan->steps.front(), tokens, result);
+  }
+  return result;
+}
+
+void EmbeddedSession::runStep(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens,
+                              BatchResult& result) {
+  handle_->context().statementTicks = ticksOf(platform::services().localTime());
+  if (step.kind == Step::Kind::control) return control(step.control);
+  if (step.kind != Step::Kind::query) {
+    result.affected = write(step, tokens);
+    return;
+  }
+  auto rows = query(plan, step, tokens);
+  if (!result.rows) result.rows = std::move(rows);
+}
+
+std::unique_ptr<Rows> EmbeddedSession::query(const std::shared_ptr<Plan>& plan, Step& step,
+                                             const std::vector<tsql::Token>& tokens) {
+  const auto locked = step.candidates ? claimRows(step, tokens) : nullptr;
+  Prepared statement = step.main->take(*handle_);
+  bind(statement, *step.main, step.parameters, tokens, locked);
+  auto rows = std::make_unique<EmbeddedRows>(*this, plan, step, std::move(statement));
+  if (locked && !marked_) {
+    rows->buffer();
+    handle_->locks(step.table->database).release();
+  }
+  return rows;
+}
+
+void EmbeddedSession::bind(Prepared& statement, const Compiled& compiled, const std::vector<Parameter>& parameters,
+                           const std::vector<tsql::Token>& tokens, const std::shared_ptr<const ValueList>& locked) {
+  // Literals are numbered in their order, so one pass finds them all.
+  std::vector<const tsql::Token*> literals;
+  for (const auto& token : tokens)
+    if (tsql::isLiteral(token.kind)) literals.push_back(&token);
+  for (const std::size_t place : compiled.parameters()) {
+    const Parameter& parameter = parameters[place];
+    const int number = static_cast<int>(place + 1);
+    if (parameter.source == Parameter::Source::lockedRows) {
+      statement.bind(number, locked);
+      continue;
+    }
+    const tsql::Token& token = parameter.own ? *parameter.own : *literals.at(parameter.literal);
+    if (parameter.source == Parameter::Source::list)
+      statement.bind(number, listValue(parameter, token));
+    else
+      statement.bind(number, parameterValue(parameter, token));
+  }
+}
+
+ValueList EmbeddedSession::candidates(Step& step, const std::vector<tsql::Token>& tokens) {
+  Prepared statement = step.candidates->take(*handle_);
+  bind(statement, *step.candidates, step.parameters, tokens);
+  ValueList keys;
+  while (statement.step()) keys.push_back(statement.column(0));
+  step.candidates->giveBack(std::move(statement));
+  return keys;
+}
+
+// The rows that a select with lock hints may give: each is locked first, and the select then reads it again.
+std::shared_ptr<const ValueList> EmbeddedSession::claimRows(Step& step, const std::vector<tsql::Token>& tokens) {
+  RowLocks& locks = handle_->locks(step.table->database);
+  auto mine = std::make_shared<ValueList>();
+  for (auto& key : candidates(step, tokens)) {
+    const std::int64_t row = std::get<std::int64_t>(key);
+    const auto taken = [&] {
+      return step.locks ? locks.tryLock(step.table->name, row) : !locks.othersHold(step.table->name, row);
+    };
+    bool have = taken();
+    while (!have && !step.skips) {
+      handle_->waitShortly();
+      have = taken();
+    }
+    if (have) mine->push_back(std::move(key));
+  }
+  return mine;
+}
+
+// A write waits for rows that another session holds before it takes the writer's place: the holder may need that place
+// to finish. Who has the place already cannot wait.
+void EmbeddedSession::awaitRows(Step& step, const std::vector<tsql::Token>& tokens) {
+  RowLocks& locks = handle_->locks(step.table->database);
+  while (locks.othersHold(step.table->name)) {
+    const auto keys = candidates(step, tokens);
+    const bool free = std::ranges::none_of(
+        keys, [&](const Value& key) { return locks.othersHold(step.table->name, std::get<std::int64_t>(key)); });
+    if (free) return;
+    if (!writing_.empty()) throw deadlock();
+    handle_->waitShortly();
+  }
+}
+
+void EmbeddedSession::prepareWrite(std::size_t database) {
+  for (auto* rows : rows_) rows->buffer();
+  if (marked_) takeWriter(database);
+}
+
+void EmbeddedSession::takeWriter(std::size_t database) {
+  if (!started_) handle_->execute("begin");
+  started_ = true;
+  if (writing_.contains(database)) return;
+  handle_->takeWriter(database);
+  writing_.insert(database);
+}
+
+Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) {
+  if (step.givesIdentity && identityInsert_ != tableKey(*step.table))
+    throw tsql::sqlFailure(544, "Cannot insert explicit value for identity column in table '" + step.table->name +
+                                    "' when IDENTITY_INSERT is set to OFF.");
+  if (step.candidates) awaitRows(step, tokens);
+  prepareWrite(step.table->database);
+  Prepared statement = step.main->take(*handle_);
+  bind(statement, *step.main, step.parameters, tokens);
+  skipResult(statement);
+  const Long changes = static_cast<Long>(sqlite3_changes(handle_->get()));
+  step.main->giveBack(std::move(statement));
+  if (step.kind == Step::Kind::insert && changes > 0 && step.table->identity) {
+    handle_->context().scopeIdentity = sqlite3_last_insert_rowid(handle_->get());
+    handle_->context().hasScopeIdentity = true;
+  }
+  return changes;
+}
+
+void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
+                               const std::vector<std::pair<std::size_t, Value>>& values) {
+  prepareWrite(table.database);
+  std::string text;
+  for (const auto& [column, value] : values) text += (text.empty() ? "" : ",") + quoteName(table.columns[column].name) + "=?";
+  Prepared statement(handle_->get(), std::string("update ") + databaseNames[table.database] + "." + quoteName(table.name) +
+                                         " set " + text + " where rowid=?");
+  int place = 0;
+  for (const auto& [column, value] : values) statement.bind(++place, value);
+  statement.bind(++place, key);
+  skipResult(statement);
+}
+
+void EmbeddedSession::control(const tsql::Statement& statement) {
+  if (const auto* option = std::get_if<tsql::SetOption>(&statement)) return setOption(*option);
+  if (const auto* transaction = std::get_if<tsql::Transaction>(&statement)) {
+    using Kind = tsql::Transaction::Kind;
+    if (transaction->kind == Kind::begin) return begin();
+    return transaction->kind == Kind::commit ? commit() : rollback();
+  }
+  if (const auto* use = std::get_if<tsql::Use>(&statement)) {
+    const auto database = databaseByName(use->database);
+    if (!database)
+      throw tsql::sqlFailure(911, "Database '" + use->database + "' does not exist. Make sure that the name is entered "
+                                  "correctly.");
+    database_ = *database;
+    return;
+  }
+  if (const auto* call = std::get_if<tsql::Call>(&statement))
+    throw tsql::sqlFailure(2812, "Could not find stored procedure '" + call->procedure.name + "'.");
+  defineObject(statement);
+}
+
+void EmbeddedSession::setOption(const tsql::SetOption& option) {
+  // Counts are the caller's own business here; every other option than these two is refused by the parser.
+  if (option.option != "identity_insert") return;
+  const Object object = cache_->catalogue->find(*option.table, database_);
+  const auto* table = std::get_if<const TableInfo*>(&object);
+  if (!table || !(*table)->identity)
+    throw tsql::sqlFailure(8106, "Table '" + option.table->name + "' does not have the identity property. Cannot perform "
+                                 "SET operation.");
+  identityInsert_ = option.on ? tableKey(**table) : std::pair<std::size_t, std::string>();
+}
+
+void EmbeddedSession::defineObject(const tsql::Statement& statement) {
+  const bool logins = std::holds_alternative<tsql::CreateLogin>(statement) ||
+                      (std::holds_alternative<tsql::Drop>(statement) &&
+                       std::get<tsql::Drop>(statement).kind == tsql::Drop::Kind::login);
+  if (logins && !administrator_) throw tsql::sqlFailure(229, "User does not have permission to perform this action.");
+  const bool own = !marked_;
+  if (own) begin();
+  try {
+    prepareWrite(definedDatabase(statement, database_));
+    define(*handle_, *cache_->catalogue, database_, statement);
+    refreshCatalogue();
+    if (own) commit();
+  } catch (const Failure&) {
+    if (own) rollback();
+    refreshCatalogue();
+    throw;
+  }
+}
+
+void EmbeddedSession::detach(EmbeddedRows& rows) { std::erase(rows_, &rows); }
+
+void EmbeddedSession::begin() {
+  if (marked_) throw tsql::sqlFailure(3988, "New transaction is not allowed because another one is open.");
+  marked_ = true;
+}
+
+void EmbeddedSession::commit() {
+  if (!marked_) throw tsql::sqlFailure(3902, "The COMMIT TRANSACTION request has no corresponding BEGIN TRANSACTION.");
+  // A failed statement for want of room ends the storage library's transaction by itself.
+  if (started_ && !handle_->inTransaction()) {
+    endTransaction();
+    throw tsql::sqlFailure(3930, "The current transaction cannot be committed and cannot support operations that write to "
+                                 "the log file. Roll back the transaction.");
+  }
+  if (started_) handle_->execute("commit");
+  started_ = false;
+  endTransaction();
+}
+
+void EmbeddedSession::rollback() {
+  if (!marked_) throw tsql::sqlFailure(3903, "The ROLLBACK TRANSACTION request has no corresponding BEGIN TRANSACTION.");
+  for (auto* rows : rows_) rows->buffer();
+  if (handle_->inTransaction()) handle_->execute("rollback");
+  endTransaction();
+  refreshCatalogue();
+}
+
+void EmbeddedSession::endTransaction() {
+  marked_ = started_ = false;
+  writing_.clear();
+  handle_->releaseLocks();
+}
+
+}  // namespace QVSa::embedded

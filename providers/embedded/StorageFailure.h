@@ -1,0 +1,18 @@
+#pragma once
+
+#include "QVSa/frame/Failure.h"
+
+struct sqlite3;
+
+namespace QVSa::embedded {
+
+// Throws the failure for a result code of the storage library, with SQL Server's number where it has one: a function's
+// own failure first, then 2627 and 2601 (unique), 515 (not null), 1205 (the writer's place is taken while this handle
+// writes, or the rows read are old), the time-out, 1105 (no room), 3906 (read-only), 823 (input or output error), 824
+// (damaged).
+[[noreturn]] void throwStorageFailure(sqlite3* handle, int code);
+
+// A statement or a wait ran over its time-out.
+Failure timeExpired();
+
+}  // namespace QVSa::embedded

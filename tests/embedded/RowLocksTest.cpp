@@ -1,0 +1,76 @@
+#include <fcntl.h>
+#include <fstream>
+#include <gtest/gtest.h>
+
+#include "QVSa/frame/Failure.h"
+#include "providers/embedded/RowLocks.h"
+#include "tests/embedded/ChildProcess.h"
+#include "tests/embedded/InstallationFolder.h"
+
+namespace QVSa::embedded {
+namespace {
+
+class RowLocksOfAFile : public testing::Test {
+ protected:
+  RowLocksOfAFile() { std::ofstream(file_).put('\n'); }
+
+  InstallationFolder folder_{false};
+  std::filesystem::path file_ = folder_.root() / "QVSys.lock";
+};
+
+TEST_F(RowLocksOfAFile, ARowBelongsToOneSessionAtATime) {
+  RowLocks mine(file_), yours(file_);
+  EXPECT_TRUE(mine.tryLock("idRec", 7));
+  EXPECT_TRUE(mine.tryLock("IDREC", 7));
+  EXPECT_FALSE(yours.tryLock("idrec", 7));
+  EXPECT_TRUE(yours.tryLock("idRec", 8));
+  EXPECT_TRUE(yours.tryLock("idDel", 7));
+  EXPECT_TRUE(yours.othersHold("idRec", 7));
+  EXPECT_FALSE(mine.othersHold("idRec", 7));
+  EXPECT_TRUE(mine.othersHold("idRec"));
+  EXPECT_FALSE(yours.othersHold("users"));
+
+  mine.release();
+  EXPECT_TRUE(mine.empty());
+  EXPECT_TRUE(yours.tryLock("idRec", 7));
+  EXPECT_FALSE(mine.tryLock("idRec", -1) && yours.tryLock("idRec", -1));
+}
+
+TEST_F(RowLocksOfAFile, ManyRowsBecomeTheWholeTable) {
+  RowLocks mine(file_), yours(file_);
+  for (std::int64_t row = 0; row <= static_cast<std::int64_t>(RowLocks::mostRows); ++row)
+    ASSERT_TRUE(mine.tryLock("users", row));
+  EXPECT_FALSE(yours.tryLock("users", 1'000'000));
+  EXPECT_TRUE(yours.tryLock("jobs", 1'000'000));
+  mine.release();
+  EXPECT_TRUE(yours.tryLock("users", 1'000'000));
+  // The table cannot be had as a whole now; its free rows still can.
+  for (std::int64_t row = 0; row < 1'500; ++row) ASSERT_TRUE(mine.tryLock("users", row));
+  EXPECT_FALSE(mine.tryLock("users", 1'000'000));
+}
+
+TEST_F(RowLocksOfAFile, AKilledProcessLeavesNoLock) {
+  RowLocks mine(file_);
+  int ready[2];
+  ASSERT_EQ(::pipe(ready), 0);
+  ChildProcess child([&] {
+    RowLocks locks(file_);
+    const char taken = locks.tryLock("idRec", 1) ? 'y' : 'n';
+    if (::write(ready[1], &taken, 1) == 1) ::pause();
+    return 0;
+  });
+  char taken = 0;
+  ASSERT_EQ(::read(ready[0], &taken, 1), 1);
+  EXPECT_EQ(taken, 'y');
+  EXPECT_FALSE(mine.tryLock("idRec", 1));
+  child.kill();
+  EXPECT_TRUE(mine.tryLock("idRec", 1));
+}
+
+TEST_F(RowLocksOfAFile, AMissingLockFileIsNotMade) {
+  EXPECT_THROW(RowLocks(folder_.root() / "QVApp.lock"), Failure);
+  EXPECT_FALSE(std::filesystem::exists(folder_.root() / "QVApp.lock"));
+}
+
+}  // namespace
+}  // namespace QVSa::embedded
