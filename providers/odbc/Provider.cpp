@@ -1,0 +1,24 @@
+#include "providers/odbc/Provider.h"
+
+#include "providers/odbc/Driver.h"
+#include "providers/odbc/Session.h"
+
+namespace QVSa::odbc {
+
+namespace {
+
+class OdbcProvider final : public Provider {
+ public:
+  std::unique_ptr<ProviderSession> open(const ConnectionOptions& options) override {
+    return std::make_unique<Session>(connectionText(options, systemDriver()), options.password, options.loginTimeout);
+  }
+};
+
+}  // namespace
+
+Provider& provider() {
+  static OdbcProvider instance;
+  return instance;
+}
+
+}  // namespace QVSa::odbc

@@ -1,0 +1,10 @@
+#pragma once
+
+#include "QVSa/frame/Provider.h"
+
+namespace QVSa::odbc {
+
+// SQL Server through the system's ODBC driver manager. For any thread.
+Provider& provider();
+
+}  // namespace QVSa::odbc

@@ -1,0 +1,79 @@
+#include "providers/odbc/Statement.h"
+
+#include <algorithm>
+#include <limits>
+
+#include "providers/odbc/Failure.h"
+
+namespace QVSa::odbc {
+
+namespace {
+
+SQLPOINTER number(std::int64_t value) { return reinterpret_cast<SQLPOINTER>(static_cast<SQLULEN>(value)); }
+
+}  // namespace
+
+Statement::Statement(SQLHDBC connection, std::chrono::seconds timeout) {
+  if (!SQL_SUCCEEDED(SQLAllocHandle(SQL_HANDLE_STMT, connection, &handle_))) {
+    throw failure(diagnostics(SQL_HANDLE_DBC, connection));
+  }
+  // A driver that has no time-out, or sends texts unread anyway, refuses these; nothing is lost by that.
+  SQLSetStmtAttrW(handle_, SQL_ATTR_QUERY_TIMEOUT, number(timeout.count()), SQL_IS_UINTEGER);
+  SQLSetStmtAttrW(handle_, SQL_ATTR_NOSCAN, number(SQL_NOSCAN_ON), SQL_IS_UINTEGER);
+}
+
+Statement::~Statement() { SQLFreeHandle(SQL_HANDLE_STMT, handle_); }
+
+bool Statement::check(SQLRETURN rc) const {
+  if (rc == SQL_NO_DATA) return false;
+  if (!SQL_SUCCEEDED(rc)) throw failure(diagnostics(SQL_HANDLE_STMT, handle_));
+  return true;
+}
+
+void Statement::execute(const String& text) {
+  std::u16string wide = toWide(text);
+  // SQL_NO_DATA is a write that met no row.
+  check(SQLExecDirectW(handle_, wideData(wide), static_cast<SQLINTEGER>(wide.size())));
+}
+
+void Statement::execute(const String& text, std::vector<Parameter>& parameters) {
+  SQLUSMALLINT position = 0;
+  for (Parameter& parameter : parameters) parameter.bind(handle_, ++position);
+  execute(text);
+}
+
+void Statement::askPrimaryKey(const String& database, const String& owner, const String& table) {
+  std::u16string names[] = {toWide(database), toWide(owner), toWide(table)};
+  const auto data = [](std::u16string& name) { return name.empty() ? nullptr : wideData(name); };
+  check(SQLPrimaryKeysW(handle_, data(names[0]), SQL_NTS, data(names[1]), SQL_NTS, data(names[2]), SQL_NTS));
+}
+
+std::size_t Statement::columnCount() const {
+  SQLSMALLINT count = 0;
+  check(SQLNumResultCols(handle_, &count));
+  return static_cast<std::size_t>(count);
+}
+
+std::pair<Column, ColumnType> Statement::describe(std::size_t ordinal) const {
+  std::u16string name(256, u'\0');
+  SQLSMALLINT length = 0;
+  SQLSMALLINT nullable = 0;
+  ColumnType type;
+  check(SQLDescribeColW(handle_, static_cast<SQLUSMALLINT>(ordinal + 1), wideData(name),
+                        static_cast<SQLSMALLINT>(name.size()), &length, &type.type, &type.size, &type.digits,
+                        &nullable));
+  name.resize(std::min(static_cast<std::size_t>(length), name.size() - 1));
+  return {Column{fromWide(name), isLong(type)}, type};
+}
+
+Long Statement::affected() const {
+  SQLLEN count = -1;
+  check(SQLRowCount(handle_, &count));
+  return static_cast<Long>(std::clamp<SQLLEN>(count, -1, std::numeric_limits<Long>::max()));
+}
+
+bool Statement::moreResults() { return check(SQLMoreResults(handle_)); }
+
+bool Statement::fetch() { return check(SQLFetch(handle_)); }
+
+}  // namespace QVSa::odbc
