@@ -1,0 +1,106 @@
+#include "QVSa/frame/Frame.h"
+
+#include "QVSa/frame/ConnectionString.h"
+#include "QVSa/resources/Messages.h"
+
+namespace QVSa {
+
+Handler Handler::number(Long value) && {
+  fixedNumber = value;
+  return std::move(*this);
+}
+
+Handler Handler::onIntegrity(Long messageId) && {
+  aloneOnIntegrity = LoadResString(messageId);
+  return std::move(*this);
+}
+
+Handler plain() { return {}; }
+
+Handler prefixed(Long messageId, const std::vector<Variant>& fill) {
+  Handler handler;
+  handler.prefix = fillMsg(LoadResString(messageId), fill);
+  return handler;
+}
+
+Handler prefixedBlank(Long messageId, const std::vector<Variant>& fill) {
+  Handler handler = prefixed(messageId, fill);
+  handler.prefix += " ";
+  return handler;
+}
+
+Handler silent() {
+  Handler handler;
+  handler.silent = true;
+  return handler;
+}
+
+Statement::Statement(SQLFactory& factory, String text) : factory_(factory), text_(std::move(text)) { factory_.Clear(); }
+
+Statement& Statement::number(const String& name, const Variant& value) {
+  factory_.AddPara(name, paraNumber, value, false, true);
+  return *this;
+}
+
+Statement& Statement::text(const String& name, const Variant& value) {
+  factory_.AddPara(name, paraText, value, false, true);
+  return *this;
+}
+
+Statement& Statement::date(const String& name, const Variant& value) {
+  factory_.AddPara(name, paraDate, value, false, true);
+  return *this;
+}
+
+Statement& Statement::list(const String& name, const String& value) {
+  factory_.AddPara(name, paraList, value, false, true);
+  return *this;
+}
+
+// A failed replacement is not reported here: the statement goes as it stands and fails in the database.
+Statement::operator String() {
+  factory_.makeSql(text_, "");
+  return text_;
+}
+
+Boolean Frame::connect(const String& server, const String& DBName) {
+  server_ = server;
+  DBName_ = DBName;
+  return operation(plain(), [&] {
+    connectionString_ = buildConnString(server, DBName, false);
+    return true;
+  });
+}
+
+Connection Frame::open() const {
+  Connection connection;
+  connection.Open(connectionString_);
+  return connection;
+}
+
+void Frame::note(Long messageId, std::initializer_list<Variant> fill) {
+  note(messageNumber(messageId), fillMsg(LoadResString(messageId), fill));
+}
+
+void Frame::note(Long number, const String& description) {
+  errNumber_ = number;
+  errDescription_ = description;
+}
+
+Frame::Refusal Frame::refuse(Long messageId, const std::vector<Variant>& fill) {
+  note(messageNumber(messageId), fillMsg(LoadResString(messageId), fill));
+  return {};
+}
+
+void Frame::fail(const String& source, Long messageId, const std::vector<Variant>& fill) {
+  throw Failure(messageNumber(messageId), source, fillMsg(LoadResString(messageId), fill));
+}
+
+void Frame::report(const Handler& handler, const Failure& failure) {
+  if (handler.silent) return;
+  const bool alone = failure.number() == number::integrity && !handler.aloneOnIntegrity.empty();
+  note(handler.fixedNumber != 0 ? handler.fixedNumber : failure.number(),
+       alone ? handler.aloneOnIntegrity : handler.prefix + failure.description());
+}
+
+}  // namespace QVSa

@@ -1,0 +1,146 @@
+#pragma once
+
+#include <initializer_list>
+#include <new>
+#include <utility>
+
+#include "QVSa/frame/Connection.h"
+#include "QVSa/frame/Failure.h"
+#include "QVSa/frame/SQLFactory.h"
+#include "QVSa/frame/Text.h"
+
+namespace QVSa {
+
+// How an operation reports the failure that ended it: a small value, made by plain(), prefixed() or prefixedBlank().
+struct Handler {
+  String prefix;            // stands before the failure's text
+  Long fixedNumber = 0;     // reported in place of the failure's number, where not 0
+  String aloneOnIntegrity;  // reported alone where a key or a not-null column refused the write
+  bool silent = false;      // the error values stay untouched
+
+  Handler number(Long value) &&;
+  Handler onIntegrity(Long messageId) &&;
+};
+
+// The failure's number and text as they are.
+Handler plain();
+// The text of a message, its places filled, directly before the failure's text.
+Handler prefixed(Long messageId, const std::vector<Variant>& fill = {});
+// The same with a blank between.
+Handler prefixedBlank(Long messageId, const std::vector<Variant>& fill = {});
+// Nothing is reported; the result alone tells.
+Handler silent();
+
+// A statement text whose tokens are filled by the object's factory, with the usual flags: an empty text goes as an
+// empty text and not as NULL, trailing blanks are cut.
+class Statement {
+ public:
+  Statement(SQLFactory& factory, String text);
+  Statement& number(const String& name, const Variant& value);
+  Statement& text(const String& name, const Variant& value);
+  Statement& date(const String& name, const Variant& value);
+  Statement& list(const String& name, const String& value);
+  operator String();
+
+ private:
+  SQLFactory& factory_;
+  String text_;
+};
+
+// The common stock of the public classes: where the database is, the last failure, the shape of an operation.
+class Frame {
+ protected:
+  Frame() = default;
+  // A copy is an object of its own with the same values.
+  Frame(const Frame&) = default;
+  Frame& operator=(const Frame&) = default;
+  ~Frame() = default;
+
+  // The number and text of this object's last failure. A success does not clear them.
+  Long errNumber() const { return errNumber_; }
+  String errDescription() const { return errDescription_; }
+
+  // Keeps both names and builds the connection string; opens nothing. An empty DBName means QVSys.
+  Boolean connect(const String& server, const String& DBName = "");
+
+  const String& server() const { return server_; }
+  const String& DBName() const { return DBName_; }
+  void setServer(const String& value) { server_ = value; }
+  void setDBName(const String& value) { DBName_ = value; }
+  const String& connectionString() const { return connectionString_; }
+  void setConnectionString(const String& value) { connectionString_ = value; }
+
+  // An open connection on the object's own string.
+  Connection open() const;
+  // Clears the object's factory and starts a statement on it.
+  Statement sql(const String& text) { return Statement(factory_, text); }
+
+  // Runs `body` and returns its result. A failure is turned into the two error values by `handler`, and the result is
+  // the body type's negative one: False, the empty text, no object. A body that also refuses names its type:
+  //   return operation(plain(), [&]() -> Boolean {
+  //     if (Id().empty()) return refuse(1002);
+  //     ...
+  //     return true;
+  //   });
+  template <class Body>
+  auto operation(const Handler& handler, Body&& body) {
+    decltype(body()) result{};
+    attempt(handler, [&] { result = body(); });
+    return result;
+  }
+
+  // The same for operations whose failure has a result of its own: `result` as the body last left it.
+  template <class Result, class Body>
+  Result operation(const Handler& handler, Result result, Body&& body) {
+    attempt(handler, [&] { body(result); });
+    return result;
+  }
+
+  // Sets the error values to a message's number and text; the operation goes on.
+  void note(Long messageId, std::initializer_list<Variant> fill = {});
+  void note(Long number, const String& description);
+
+  // Sets the error values and gives the negative result of whatever type the operation has.
+  struct Refusal {
+    operator Boolean() const { return false; }
+    operator String() const { return {}; }
+    template <class Record>
+    operator std::shared_ptr<Record>() const {
+      return nullptr;
+    }
+  };
+  Refusal refuse(Long messageId, const std::vector<Variant>& fill = {});
+  // Takes over the error values of another object of the library.
+  template <class Other>
+  Refusal refuseAs(const Other& other) {
+    note(other.errNumber(), other.errDescription());
+    return {};
+  }
+
+  // A refusal that passes through the operation's handler, and so gets its prefix.
+  [[noreturn]] static void fail(const String& source, Long messageId, const std::vector<Variant>& fill = {});
+
+ private:
+  template <class Body>
+  void attempt(const Handler& handler, Body&& body) {
+    try {
+      body();
+    } catch (const Failure& failure) {
+      report(handler, failure);
+    } catch (const std::bad_alloc&) {
+      report(handler, runtimeFailure(number::memory));
+    } catch (const std::exception& error) {
+      report(handler, Failure(number::internal, "QVSa", error.what()));
+    }
+  }
+  void report(const Handler& handler, const Failure& failure);
+
+  String server_;
+  String DBName_;
+  String connectionString_;
+  SQLFactory factory_;
+  Long errNumber_ = 0;
+  String errDescription_;
+};
+
+}  // namespace QVSa

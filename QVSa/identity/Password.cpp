@@ -1,0 +1,16 @@
+#include "QVSa/identity/Password.h"
+
+#include "platform/SecretMessage.h"
+
+namespace QVSa {
+
+Password::~Password() { platform::clearSecret(text_); }
+
+Password& Password::operator=(const Password& other) {
+  if (this == &other) return *this;
+  platform::clearSecret(text_);
+  text_ = other.text_;
+  return *this;
+}
+
+}  // namespace QVSa

@@ -1,0 +1,221 @@
+#pragma once
+
+#include "QVSa/frame/Frame.h"
+#include "QVSa/identity/Password.h"
+#include "QVSa/identity/UserTypes.h"
+
+namespace QVSa {
+
+class Department;
+class safeRule;
+
+// One user with his department, organisation, built-in roles and groups; sign-on and the change of passwords.
+//   User user;  user.connect(server, "QVApp");
+//   String session;  if (user.loginAuth("ann", password, &session)) ...
+// A plain save removes the user's jobs and re-writes his password: give the jobs back by setJobs, and load him first.
+class User : private Frame {
+ public:
+  using Frame::connect;
+  using Frame::errDescription;
+  using Frame::errNumber;
+
+  // 0 while the user is not stored. Can be set once in the life of an object; later sets are ignored.
+  Long Id() const { return Id_; }
+  void Id(Long value);
+  // The display name; the password is stored under it.
+  String Name() const { return Name_; }
+  void Name(String value) { Name_ = std::move(value); }
+  String Login() const { return Login_; }
+  void Login(String value) { Login_ = std::move(value); }
+  // In clear; it can be set only.
+  void Pwd(const String& value);
+  String MobilePhone() const { return MobilePhone_; }
+  void MobilePhone(String value) { MobilePhone_ = std::move(value); }
+  String Email() const { return Email_; }
+  void Email(String value) { Email_ = std::move(value); }
+  Boolean builtIn() const { return builtIn_; }
+  Boolean sendSms() const { return sendSms_; }
+  void sendSms(Boolean value) { sendSms_ = value; }
+  Boolean keyLogin() const { return keyLogin_; }
+  void keyLogin(Boolean value) { keyLogin_ = value; }
+  // 0 normal, 1 locked, 2 registered and waiting for audit, 3 refused at audit. Only 0 can sign on.
+  Integer regState() const { return regState_; }
+  void regState(Integer value) { regState_ = value; }
+  Boolean locked() const { return regState_ == 1; }
+  // A userTypes; not changed by the save of a stored user, nor is Domain.
+  Integer uType() const { return uType_; }
+  void uType(Integer value) { uType_ = value; }
+  // The Windows domain of an adUser.
+  String Domain() const { return Domain_; }
+  void Domain(String value) { Domain_ = std::move(value); }
+  String company() const { return company_; }
+  void company(String value) { company_ = std::move(value); }
+  String Address() const { return Address_; }
+  void Address(String value) { Address_ = std::move(value); }
+  String zipcode() const { return zipcode_; }
+  void zipcode(String value) { zipcode_ = std::move(value); }
+  String telePhone() const { return telePhone_; }
+  void telePhone(String value) { telePhone_ = std::move(value); }
+  Boolean isOuter() const { return isOuter_; }
+  void isOuter(Boolean value) { isOuter_ = value; }
+  // The distinguished name of an ldapUser.
+  String dn() const { return dn_; }
+  void dn(String value) { dn_ = std::move(value); }
+  // Addresses from which the user may sign on, "|" between: 192.168.1.7, 192.168.1.*, 192.168.1.10-20. Empty: any.
+  String ipList() const { return ipList_; }
+  void ipList(String value) { ipList_ = std::move(value); }
+  // Whether the user may be signed on from several computers at once.
+  Boolean synLogin() const { return synLogin_; }
+  void synLogin(Boolean value) { synLogin_ = value; }
+  // For the hosts; no operation here looks at the next three.
+  Boolean PwdNoChange() const { return PwdNoChange_; }
+  void PwdNoChange(Boolean value) { PwdNoChange_ = value; }
+  Boolean useOTPAuth() const { return useOTPAuth_; }
+  void useOTPAuth(Boolean value) { useOTPAuth_ = value; }
+  String OTPTokenId() const { return OTPTokenId_; }
+  void OTPTokenId(String value) { OTPTokenId_ = std::move(value); }
+
+  // The department's inner id and its number.
+  Long deptInnerId() const { return deptInnerId_; }
+  void deptInnerId(Long value) { deptInnerId_ = value; }
+  String deptId() const { return deptId_; }
+  void deptId(String value) { deptId_ = std::move(value); }
+  String deptName() const { return deptName_; }
+  String deptFullName() const { return deptFullName_; }
+  // The organisation above the user: his department itself, or the nearest above it.
+  String orgId() const { return orgId_; }
+  String orgName() const { return orgName_; }
+  String orgFullName() const { return orgFullName_; }
+  // Groups, comma-separated. A save takes it as the name of one group.
+  String grpName() const { return grpName_; }
+  void grpName(String value) { grpName_ = std::move(value); }
+  String RegUserDesc() const { return RegUserDesc_; }
+  void RegUserDesc(String value) { RegUserDesc_ = std::move(value); }
+
+  // The built-in roles that the user holds through a job.
+  Boolean isAdministrator() const { return isAdministrator_; }
+  Boolean isDesigner() const { return isDesigner_; }
+  Boolean isDeptadmin() const { return isDeptadmin_; }
+  Boolean isProcAdmin() const { return isProcAdmin_; }
+  Boolean isNoticeAdmin() const { return isNoticeAdmin_; }
+  Boolean isOwner() const { return isOwner_; }
+  // True after a full load.
+  Boolean isUser() const { return isUser_; }
+  // Days that the password has left, as loginAuth found it; -1 where it did not look.
+  Integer validDay() const { return validDay_; }
+
+  // Loads by id (`keyName` 1), name (2) or login (3); any other finds nobody. 0x8004044D where there is no such user.
+  // With `chkPwd` it tests `Pwd` and moves the counter of failed sign-ons, which may lock the account; a wrong password
+  // shows in `wrongPwd` and is no failure of the load. `authLd`: the directory need only hold an ldapUser.
+  // 0x8004046B the directory does not know him.
+  Boolean GetOne(Integer keyName, const Variant& keyValue, Boolean chkPwd = false, const String& Pwd = "",
+                 Boolean* wrongPwd = nullptr, Boolean authLd = false);
+  // Inserts or updates the user. Every save writes the password, restarts its validity and clears the date of a lock;
+  // the state is written as it stands here. `passPwdCheck` leaves out the policy and the history of passwords: pass
+  // True where the password is not new. 0x8004044E name or login empty, 0x80040460 the password was used before,
+  // 0x80040BB8 against the policy.
+  Boolean Save(Boolean passPwdCheck = false);
+  // Deletes the user (0: this one). His jobs stay in the table.
+  Boolean Delete(Long Id = 0);
+  // The job ids for the next save, comma-separated.
+  Boolean setJobs(const String& jobList);
+  Boolean setDept(const Department& dept);
+
+  // The whole sign-on. `sI` receives the session id and is empty where none was opened. `ipAddr`: the computer's
+  // addresses, "|" between; `hostName`: its name, empty for no test of other sessions. `userVerifyLevel`: 0 or below,
+  // `Pwd` is the password; 1, its md5Hex; above, the host vouches for the user.
+  // 0x8004046C address not permitted, 0x8004046D signed on elsewhere, 0x8004045E locked or in another state than 0,
+  // 0x80040452 wrong password, 0x80040463 wrong domain password. True with 0x8004045F and an empty `sI`: the password
+  // has expired, only its change is allowed. errNumber is not cleared by a success: look at the result, then at `sI`.
+  // Throws Failure 6 on level 1 where the stored password has a character that does not fit one byte.
+  Boolean loginAuth(const String& loginName, const String& Pwd, String* sI = nullptr, Boolean authLd = false,
+                    const String& ipAddr = "", const String& hostName = "", const Integer* userVerifyLevel = nullptr);
+  // Whether `pwdMd5` is the md5Hex of the user's password: no counter, no lock, no session. Throws as loginAuth does.
+  Boolean loginAuth_1(const String& loginName, const String& pwdMd5);
+  // Changes the password of the loaded user under the policy. 0x80040461 `oldPwd` is not his, 0x80040460 used before,
+  // 0x80040BB8 against the policy.
+  Boolean chgPwd(const String& oldPwd, const String& newPwd);
+  // True for every text.
+  Boolean chkRegPwd(const String& Pwd);
+  // Records nothing and gives False.
+  Boolean RecordAction(Long uid, const String& sId, String& s);
+
+ private:
+  struct Residence;
+
+  void clearRecord();
+  void clearRoles();
+  void read(Recordset& row);
+  void findOrganisation(Connection& connection, const Residence& residence);
+  void readRoles(Connection& connection);
+  void readGroups(Connection& connection);
+
+  Boolean passesPolicy(const String& password, Integer& cycle);
+  Boolean insertUser();
+  Boolean updateUser();
+  void findDepartment(Connection& connection);
+  void insertRow(Connection& connection);
+  void updateRow(Connection& connection);
+  Long insertedId(Connection& connection);
+  void saveGroup(Connection& connection);
+  String storedPwd() const;
+  Boolean pwdUsedBefore(Integer cycle, const String& Pwd = "");
+  void pushPwdHistory(Integer cycle);
+
+  Boolean testPassword(Connection& connection, const String& Pwd, Boolean* wrongPwd, Boolean authLd);
+  void countFailure(Connection& connection);
+  Boolean fromPermittedAddress(const String& ipAddr) const;
+  Boolean isLockedOut(const safeRule& rule);
+  Boolean isExpired(Integer maxDay);
+  void writePwd(const String& newPwd);
+  Boolean digestMatches(const String& digest) const;
+
+  Long Id_ = 0;
+  Boolean idGiven_ = false;
+  String Name_;
+  String Login_;
+  Password Pwd_;
+  Boolean pwdChanged_ = false;
+  String MobilePhone_;
+  String Email_;
+  Boolean builtIn_ = false;
+  Boolean sendSms_ = false;
+  Boolean keyLogin_ = false;
+  Integer regState_ = 0;
+  Date pwdDate_;
+  Long lgts_ = 0;
+  Integer uType_ = Genaral;
+  String Domain_;
+  String company_;
+  String Address_;
+  String zipcode_;
+  String telePhone_;
+  Boolean isOuter_ = false;
+  String ldsName_;
+  String dn_;
+  String ipList_;
+  Boolean synLogin_ = false;
+  Boolean PwdNoChange_ = false;
+  Boolean useOTPAuth_ = false;
+  String OTPTokenId_;
+  Long deptInnerId_ = 0;
+  String deptId_;
+  String deptName_;
+  String deptFullName_;
+  String orgId_;
+  String orgName_;
+  String orgFullName_;
+  String grpName_;
+  String RegUserDesc_;
+  Boolean isAdministrator_ = false;
+  Boolean isDesigner_ = false;
+  Boolean isDeptadmin_ = false;
+  Boolean isProcAdmin_ = false;
+  Boolean isNoticeAdmin_ = false;
+  Boolean isOwner_ = false;
+  Boolean isUser_ = false;
+  Integer validDay_ = -1;
+  String jobList_;
+};
+
+}  // namespace QVSa

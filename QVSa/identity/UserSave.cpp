@@ -1,0 +1,235 @@
+#include <optional>
+
+#include "QVSa/identity/User.h"
+#include "QVSa/identity/safeRule.h"
+#include "platform/SecretMessage.h"
+
+namespace QVSa {
+namespace {
+
+Long one(Boolean value) { return value ? 1 : 0; }
+
+}  // namespace
+
+Boolean User::Save(Boolean passPwdCheck) {
+  return operation(plain(), [&]() -> Boolean {
+    Integer cycle = 0;
+    if (uType_ == Genaral && !passPwdCheck && !passesPolicy(Pwd_.text(), cycle)) return false;
+    if (Id_ != 0) {
+      // Also where the password is the old one: callers that leave it alone pass `passPwdCheck`.
+      if (pwdUsedBefore(cycle)) return refuse(1120);
+      if (!updateUser()) return false;
+    } else if (!insertUser()) {
+      return false;
+    }
+    if (cycle > 0 && pwdChanged_) {
+      pushPwdHistory(cycle);
+      pwdChanged_ = false;
+    }
+    return true;
+  });
+}
+
+Boolean User::passesPolicy(const String& password, Integer& cycle) {
+  safeRule rule;
+  rule.connect(server(), DBName());
+  if (!rule.GetOne() || !rule.checkPwd(password)) return refuseAs(rule);
+  cycle = rule.cycle();
+  return true;
+}
+
+String User::storedPwd() const { return platform::encryptText(Pwd_.text(), Name_); }
+
+Boolean User::insertUser() {
+  if (Name_.empty() || Login_.empty()) return refuse(1102);
+  Connection connection = open();
+  connection.Execute("set nocount on");
+  findDepartment(connection);
+  connection.BeginTrans();
+  insertRow(connection);
+  Id_ = insertedId(connection);
+  if (!jobList_.empty()) {
+    connection.Execute(sql("insert into userJob(userId,jobId)"
+                           " select userId,jobId from users u,jobs j"
+                           " where u.userName=<userName> and u.isRole=0"
+                           " and jobId in (" +
+                           jobList_ + ")")
+                           .text("userName", Name_));
+  }
+  saveGroup(connection);
+  connection.CommitTrans();
+  return true;
+}
+
+Long User::insertedId(Connection& connection) {
+  Recordset row = connection.Execute("select scope_identity()");
+  if (row.EOF_()) fail("User", 1103);
+  return row[0].asLong();
+}
+
+void User::findDepartment(Connection& connection) {
+  if (deptId_.empty()) deptId_ = "_root";
+  if (deptInnerId_ != 0) return;
+  Recordset row = connection.Execute(sql("select * from departments where deptNo=<deptNo>").text("deptNo", deptId_));
+  if (row.EOF_()) return;
+  deptInnerId_ = row["deptId"].asLong();
+  deptName_ = row["deptName"].asText();
+  deptFullName_ = row["fullName"].asText();
+}
+
+void User::insertRow(Connection& connection) {
+  connection.Execute(sql(" insert into users "
+                         "( userName , userLogin , userPwd , deptId , mobilePhone , email , isAbstract , "
+                         " isRole , useSms , useKey , company , address , zipcode , Telephone , isOuter , accState "
+                         " , PwdNoChange "
+                         " , useOTPAuth "
+                         " , OTPTokenId "
+                         " , uType , Domain , ldsName , ldDn , ipList , synLogin ) "
+                         " values( <userName> , <userLogin> , <userPwd> , "
+                         "         <deptId> , <mobilePhone> , <email> , 0 , 0 , <useSms> , <useKey> , "
+                         "         <company> , <address> , <zipcode> , <Telephone> , <isOuter> , <accState> , "
+                         "         <PwdNoChange> , "
+                         "         <useOTPAuth> , "
+                         "         <OTPTokenId> , "
+                         "         <uType> , <domain> , <ldsName> , <ldDn> , <ipList> , <synLogin> "
+                         ")")
+                         .text("userName", Name_)
+                         .text("userLogin", Login_)
+                         .text("userPwd", storedPwd())
+                         .number("deptId", deptInnerId_)
+                         .text("mobilePhone", MobilePhone_)
+                         .text("email", Email_)
+                         .number("useSms", one(sendSms_))
+                         .number("useKey", one(keyLogin_))
+                         .text("company", company_)
+                         .text("address", Address_)
+                         .text("zipcode", zipcode_)
+                         .text("Telephone", telePhone_)
+                         .number("isOuter", one(isOuter_))
+                         .number("accState", regState_)
+                         .number("PwdNoChange", one(PwdNoChange_))
+                         .number("useOTPAuth", one(useOTPAuth_))
+                         .text("OTPTokenId", OTPTokenId_)
+                         .number("uType", uType_)
+                         .text("domain", Domain_)
+                         .text("ldsName", ldsName_)
+                         .text("ldDn", dn_)
+                         .text("ipList", ipList_)
+                         .number("synLogin", one(synLogin_)));
+}
+
+Boolean User::updateUser() {
+  if (Name_.empty() || Login_.empty()) return refuse(1102);
+  Connection connection = open();
+  connection.Execute("set nocount on");
+  connection.BeginTrans();
+  // Saving a locked account unlocks it. One that waits for audit, or was refused there, stays what it is.
+  if (regState_ == 1) regState_ = 0;
+  updateRow(connection);
+  if (!builtIn_) {
+    connection.Execute("delete from userjob where userId=" + text(Id_));
+    if (!jobList_.empty()) {
+      connection.Execute(
+          "insert into userJob(userId,jobId) "
+          " select " +
+          text(Id_) + ",jobId from jobs where jobId in (" + jobList_ + ")");
+    }
+  }
+  saveGroup(connection);
+  connection.CommitTrans();
+  return true;
+}
+
+// Writes the password at every save, as it is stored under the name. Leaves the account's type and domain alone.
+void User::updateRow(Connection& connection) {
+  connection.Execute(sql("update users set "
+                         "userName=<userName>"
+                         ",userLogin=<userLogin>"
+                         ",userPwd=<userPwd>"
+                         ",deptId=<deptId>"
+                         ",mobilePhone=<mobilePhone>"
+                         ",email=<email>"
+                         ",company=<company>"
+                         ",address=<address>"
+                         ",zipcode=<zipcode>"
+                         ",Telephone=<Telephone>"
+                         ",isOuter=<isOuter>"
+                         ",useSms=" +
+                         text(one(sendSms_)) + ",useKey=" + text(one(keyLogin_)) +
+                         ",accstate=<accstate>,pwdDate=getdate(),lockDate=null"
+                         ",ldsName=<ldsName>,ldDn=<ldDn>"
+                         ",ipList=<ipList>,synLogin=<synLogin>"
+                         " , PwdNoChange = <PwdNoChange> "
+                         " , useOTPAuth = <useOTPAuth> "
+                         " , OTPTokenId = <OTPTokenId> "
+                         " where userId=" +
+                         text(Id_))
+                         .text("userName", Name_)
+                         .text("userLogin", Login_)
+                         .text("userPwd", storedPwd())
+                         .number("deptId", deptInnerId_)
+                         .text("mobilePhone", MobilePhone_)
+                         .text("email", Email_)
+                         .text("company", company_)
+                         .text("address", Address_)
+                         .text("zipcode", zipcode_)
+                         .text("Telephone", telePhone_)
+                         .number("isOuter", one(isOuter_))
+                         .number("accstate", regState_)
+                         .text("ldsName", ldsName_)
+                         .text("ldDn", dn_)
+                         .text("ipList", ipList_)
+                         .number("synLogin", one(synLogin_))
+                         .number("PwdNoChange", one(PwdNoChange_))
+                         .number("useOTPAuth", one(useOTPAuth_))
+                         .text("OTPTokenId", OTPTokenId_));
+}
+
+void User::saveGroup(Connection& connection) {
+  connection.Execute("delete from grpUser where userId=" + text(Id_));
+  if (grpName_.empty()) return;
+  connection.Execute(sql("insert into grpUser(userId,gId)"
+                         " select " +
+                         text(Id_) +
+                         ", gId from ItemGroups"
+                         " where gName=<grpName>")
+                         .text("grpName", grpName_));
+}
+
+Boolean User::pwdUsedBefore(Integer cycle, const String& Pwd) {
+  const String& password = Pwd.empty() ? Pwd_.text() : Pwd;
+  Connection connection = open();
+  Recordset row = connection.Execute("select top " + text(cycle) +
+                                     " isnull(pwd,''),creDate from userPwdHis"
+                                     " where userId=" +
+                                     text(Id_) + " order by creDate desc");
+  for (; !row.EOF_(); row.MoveNext()) {
+    // Kept under the name of its time: after a change of name it no longer reads, and so no longer counts.
+    const Password earlier(platform::decryptText(row[0].asText(), Name_));
+    if (earlier.text() == password) return true;
+  }
+  return false;
+}
+
+// Keeps the newest `cycle` passwords, the present one among them.
+void User::pushPwdHistory(Integer cycle) {
+  Connection connection = open();
+  std::optional<Date> oldest;
+  {
+    Recordset row = connection.Execute("select top " + text(cycle - 1) +
+                                       " creDate from userPwdHis"
+                                       " where userId=" +
+                                       text(Id_) + " order by creDate Desc");
+    for (; !row.EOF_(); row.MoveNext()) oldest = row["creDate"].asDate();
+  }
+  if (oldest) {
+    connection.Execute("delete from userPwdHis where userId=" + text(Id_) + " and creDate<'" + oldest->sqlText() + "'");
+  }
+  connection.Execute(
+      "insert into userPwdHis(userId,creDate,pwd)"
+      " select userId,pwdDate,userPwd from users"
+      " where userId=" +
+      text(Id_));
+}
+
+}  // namespace QVSa

@@ -1,0 +1,152 @@
+#include <algorithm>
+#include <limits>
+
+#include "QVSa/identity/DomainAuthentication.h"
+#include "QVSa/identity/IpRules.h"
+#include "QVSa/identity/Sessions.h"
+#include "QVSa/identity/User.h"
+#include "QVSa/identity/safeRule.h"
+#include "platform/SecretMessage.h"
+#include "platform/Services.h"
+
+namespace QVSa {
+
+// The password stage of the load; False ends the load. A wrong password does not: it is counted here, so that the
+// counter moves in one place, and loginAuth decides later what to say.
+Boolean User::testPassword(Connection& connection, const String& Pwd, Boolean* wrongPwd, Boolean authLd) {
+  const DomainAuthentication& domain = domainAuthentication();
+  if (uType_ == ldapUser) {
+    if (!domain.ldapBind || !domain.ldapBind(dn_, Pwd, authLd)) return refuse(1131);
+    return true;
+  }
+  const Boolean right =
+      uType_ == adUser ? domain.ntlmLogon && domain.ntlmLogon(Login_, Domain_, Pwd) : Pwd == Pwd_.text();
+  if (right) {
+    lgts_ = 0;
+    connection.Execute("update users set lgts=0 where userId=" + text(Id_));
+  } else {
+    countFailure(connection);
+  }
+  if (wrongPwd != nullptr) *wrongPwd = !right;
+  return true;
+}
+
+void User::countFailure(Connection& connection) {
+  ++lgts_;
+  connection.Execute(
+      "update u set lgts=lgts+1 from users u,saferule s"
+      " where userId=" +
+      text(Id_) + " and s.id=1 and s.lockErr=1");
+  connection.Execute(
+      "update u set accstate=1,lockdate=getdate()"
+      " from users u,safeRule s"
+      " where s.id=1 and s.lockErr=1"
+      " and u.userId=" +
+      text(Id_) +
+      " and u.accstate=0"
+      " and " +
+      text(lgts_) + ">=s.errTimes");
+}
+
+Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, Boolean authLd, const String& ipAddr,
+                        const String& hostName, const Integer* userVerifyLevel) {
+  if (sI != nullptr) sI->clear();
+  const Integer level = userVerifyLevel == nullptr ? Integer{0} : *userVerifyLevel;
+  Boolean wrongPwd = false;
+  if (!GetOne(3, loginName, level <= 0, Pwd, &wrongPwd, authLd)) return false;
+  if (level == 1 && !digestMatches(Pwd)) wrongPwd = true;
+  if (!fromPermittedAddress(ipAddr)) return refuse(1132);
+
+  Sessions sessions;
+  if (!hostName.empty() && !synLogin_) {
+    sessions.connect(server(), "");
+    for (const auto& session : sessions) {
+      const Boolean elsewhere =
+          session->DBName() == DBName() && session->UserLogin() == loginName && session->Computer() != hostName;
+      if (elsewhere) return refuse(1133, {session->Computer()});
+    }
+  }
+
+  safeRule rule;
+  rule.connect(server(), DBName());
+  // Where the policy can't be read, nothing of it is tested.
+  if (rule.GetOne() && isLockedOut(rule)) return refuse(1118);
+  if (wrongPwd) {
+    clearRecord();
+    return refuse(uType_ == adUser ? 1123 : 1106);
+  }
+  // The host lets the user in as far as changing the password.
+  if (isExpired(rule.maxDay())) return true;
+
+  sessions.connect(server(), "");
+  const String id = sessions.newSession(loginName, hostName, DBName(), split(ipAddr, '|').front());
+  if (id.empty()) return refuseAs(sessions);
+  if (sI != nullptr) *sI = id;
+  return true;
+}
+
+Boolean User::fromPermittedAddress(const String& ipAddr) const {
+  if (ipAddr.empty() || ipList_.empty()) return true;
+  const std::vector<String> addresses = split(ipAddr, '|');
+  return std::any_of(addresses.begin(), addresses.end(),
+                     [&](const String& address) { return ipMatches(address, ipList_); });
+}
+
+// An account that waits for audit or was refused counts as locked.
+Boolean User::isLockedOut(const safeRule& rule) {
+  if (rule.lockErr() && lgts_ >= rule.errTimes()) regState_ = 1;
+  return regState_ != 0;
+}
+
+// Reports the expiry and tells it by the result.
+Boolean User::isExpired(Integer maxDay) {
+  if (maxDay <= 0 || uType_ == adUser) return false;
+  const double today = platform::services().localTime().dateOnly().days();
+  const double left = pwdDate_.dateOnly().days() + maxDay - today;
+  // A date far off must not make a sign-on fail.
+  validDay_ = static_cast<Integer>(
+      std::clamp<double>(left, std::numeric_limits<Integer>::min(), std::numeric_limits<Integer>::max()));
+  if (validDay_ > 0) return false;
+  note(1119);
+  return true;
+}
+
+Boolean User::digestMatches(const String& digest) const {
+  return upperCase(digest) == upperCase(platform::md5Hex(Pwd_.text()));
+}
+
+Boolean User::loginAuth_1(const String& loginName, const String& pwdMd5) {
+  if (!GetOne(3, loginName)) return false;
+  if (!digestMatches(pwdMd5)) return refuse(1106);
+  return true;
+}
+
+Boolean User::chgPwd(const String& oldPwd, const String& newPwd) {
+  return operation(plain(), [&]() -> Boolean {
+    if (oldPwd != Pwd_.text()) return refuse(1121);
+    Integer cycle = 0;
+    if (!passesPolicy(newPwd, cycle)) return false;
+    if (pwdUsedBefore(cycle, newPwd)) return refuse(1120, {cycle});
+
+    writePwd(newPwd);
+    Pwd_ = Password(newPwd);
+    if (cycle > 0) pushPwdHistory(cycle);
+    return true;
+  });
+}
+
+void User::writePwd(const String& newPwd) {
+  Connection connection = open();
+  connection.Execute("set nocount on");
+  connection.Execute(sql("update users set "
+                         "userPwd=<pwd>,pwddate=getdate() "
+                         " where userId=" +
+                         text(Id_))
+                         .text("pwd", platform::encryptText(newPwd, Name_)));
+}
+
+Boolean User::chkRegPwd(const String&) { return true; }
+
+Boolean User::RecordAction(Long, const String&, String&) { return false; }
+
+}  // namespace QVSa

@@ -1,0 +1,14 @@
+#pragma once
+
+#include <string_view>
+
+namespace QVSa::database {
+
+// The scripts that fill the three databases of an installation, each to be run once in its own, empty database: tables,
+// keys, views, synonyms and first rows, in plain T-SQL with GO between the batches. QVSys comes first, QVApp refers to
+// it.
+extern const std::string_view qvSys;
+extern const std::string_view qvApp;
+extern const std::string_view qvUpdate;
+
+}  // namespace QVSa::database

@@ -1,0 +1,72 @@
+#include "tests/support/TestInstallation.h"
+
+#include <unistd.h>
+
+#include <stdexcept>
+
+#include "QVSa/frame/ConnectionString.h"
+#include "database/Scripts.h"
+#include "providers/embedded/Installation.h"
+
+namespace QVSa::test {
+
+namespace {
+
+constexpr const char* administratorPassword = "test-admin";
+
+std::filesystem::path newFolder() {
+  const std::filesystem::path base =
+      std::filesystem::is_directory("/dev/shm") ? "/dev/shm" : std::filesystem::temp_directory_path();
+  std::string name = (base / "qvsa-test-XXXXXX").string();
+  if (!mkdtemp(name.data())) throw std::runtime_error("no folder for the test");
+  return name;
+}
+
+std::vector<embedded::DatabaseScript> shippedScripts() {
+  return {{"QVSys", std::string(database::qvSys)},
+          {"QVApp", std::string(database::qvApp)},
+          {"QVUpdate", std::string(database::qvUpdate)}};
+}
+
+// The installation that the others of this process are copies of: making the digests of the log-ins is slow by design.
+class Model : public TestFolder {
+ public:
+  explicit Model(TestInstallation::Content content) {
+    embedded::createInstallation(
+        {path(), defaultDbPwd(), administratorPassword,
+         content == TestInstallation::Content::shipped ? shippedScripts() : std::vector<embedded::DatabaseScript>{}});
+  }
+};
+
+const std::filesystem::path& modelOf(TestInstallation::Content content) {
+  if (content == TestInstallation::Content::empty) {
+    static const Model empty(content);
+    return empty.path();
+  }
+  static const Model shipped(content);
+  return shipped.path();
+}
+
+}  // namespace
+
+TestFolder::TestFolder() : path_(newFolder()) {}
+
+TestFolder::~TestFolder() {
+  std::error_code ignored;
+  std::filesystem::remove_all(path_, ignored);
+}
+
+TestInstallation::TestInstallation(Content content) : folder_(newFolder()) {
+  std::filesystem::copy(modelOf(content), folder_);
+}
+
+TestInstallation::~TestInstallation() {
+  std::error_code ignored;
+  std::filesystem::remove_all(folder_, ignored);
+}
+
+std::string TestInstallation::administratorString(const std::string& database) const {
+  return "provider=sqloledb;data source=" + server() + ";database=" + database + ";uid=sa;pwd=" + administratorPassword + ";";
+}
+
+}  // namespace QVSa::test

@@ -1,0 +1,41 @@
+#pragma once
+
+#include <filesystem>
+#include <string>
+
+namespace QVSa::test {
+
+// An installation of the embedded engine in a folder of its own, with the databases as they are shipped or empty; the
+// folder goes with the object. It lies on a memory-backed file system where there is one.
+class TestInstallation {
+ public:
+  enum class Content { shipped, empty };
+  explicit TestInstallation(Content content = Content::shipped);
+  ~TestInstallation();
+  TestInstallation(const TestInstallation&) = delete;
+  TestInstallation& operator=(const TestInstallation&) = delete;
+
+  const std::filesystem::path& folder() const { return folder_; }
+  // As `connect` of the public classes takes it.
+  std::string server() const { return "file:" + folder_.string(); }
+  // The connection string of the log-in sa.
+  std::string administratorString(const std::string& database) const;
+
+ private:
+  std::filesystem::path folder_;
+};
+
+// A folder of its own that goes with the object.
+class TestFolder {
+ public:
+  TestFolder();
+  ~TestFolder();
+  TestFolder(const TestFolder&) = delete;
+  TestFolder& operator=(const TestFolder&) = delete;
+  const std::filesystem::path& path() const { return path_; }
+
+ private:
+  std::filesystem::path path_;
+};
+
+}  // namespace QVSa::test
