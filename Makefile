@@ -1,0 +1,77 @@
+# One command for each thing that one does with the project: `make` alone lists them.
+SHELL := /bin/bash
+.SHELLFLAGS := -eu -o pipefail -c
+.DEFAULT_GOAL := help
+MAKEFLAGS += --no-print-directory
+
+JOBS ?= $(shell nproc)
+export CTEST_PARALLEL_LEVEL ?= $(JOBS)
+say = @printf '\n== %s\n'
+
+.PHONY: help packages build demo test sanitize bench fuzz format lint clean
+
+help:  ## List the targets
+	@grep -hE '^[a-z]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
+
+packages:
+	@tools/install-packages.sh
+
+build: packages  ## Build the library, the console and the tests (build/release)
+	$(say) 'Building (build/release)'
+	@cmake --preset release --log-level=NOTICE
+	@cmake --build --preset release -j $(JOBS)
+
+demo: packages  ## Make an installation, fill it with an organisation, walk the road of a sign-on
+	$(say) 'Building the demonstration (build/release)'
+	@cmake --preset release --log-level=NOTICE
+	@cmake --build --preset release -j $(JOBS) --target qvsa_console sign_on_road made_up_organisation
+	@tools/demo.sh
+
+test: build  ## Build and run all tests, then the quick ones once more under the sanitizers
+	$(say) 'Testing'
+	@ctest --preset release
+	@$(MAKE) sanitize
+
+sanitize: packages  ## Run the quick tests under the address and undefined behaviour sanitizers (build/sanitize)
+	$(say) 'Building with the sanitizers (build/sanitize)'
+	@cmake --preset sanitize --log-level=NOTICE
+	@cmake --build --preset sanitize -j $(JOBS)
+	$(say) 'Testing with the sanitizers'
+	@ctest --preset sanitize -LE slow
+
+bench: packages  ## Run the benchmarks, each operation beside its floor (build/bench)
+	$(say) 'Building the benchmarks (build/bench)'
+	@cmake --preset bench --log-level=NOTICE
+	@cmake --build --preset bench -j $(JOBS)
+	@for program in $$(find build/bench/bench -maxdepth 1 -type f -executable | sort); do \
+	  printf '\n== %s\n' "$$program"; "$$program"; done
+
+fuzz:  ## Fuzz the T-SQL front end for a minute (build/fuzz)
+	@tools/install-packages.sh fuzz
+	$(say) 'Building the fuzz target (build/fuzz)'
+	@cmake --preset fuzz --log-level=NOTICE
+	@cmake --build --preset fuzz -j $(JOBS)
+	@for program in $$(find build/fuzz -name '*_fuzz' -type f -executable); do \
+	  mkdir -p build/fuzz/corpus; "$$program" -max_total_time=60 $$(ls -1 tests/tsql/*.dict 2>/dev/null | \
+	  sed 's/^/-dict=/') build/fuzz/corpus; done
+
+sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h')
+
+format:  ## Format all sources
+	@tools/install-packages.sh lint
+	@clang-format -i $(sources)
+	@echo 'The sources are formatted.'
+
+lint:  ## Check format and run clang-tidy over all sources
+	@tools/install-packages.sh lint
+	$(say) 'Checking the format'
+	@clang-format --dry-run --Werror $(sources)
+	$(say) 'Running clang-tidy'
+	@cmake --preset release --log-level=NOTICE
+	@cmake --build --preset release -j $(JOBS) --target qvsa_database
+	@git ls-files --cached --others --exclude-standard '*.cpp' | grep -v '^bench/\|Fuzz' | \
+	  xargs -P $(JOBS) -n 4 clang-tidy -p build/release --quiet --extra-arg=-Wno-unknown-warning-option --warnings-as-errors='*'
+
+clean:  ## Remove everything that was built
+	@rm -rf build
+	@echo 'build/ is removed.'

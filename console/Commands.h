@@ -1,0 +1,18 @@
+#pragma once
+
+#include "console/Console.h"
+
+namespace QVSa::console {
+
+// Each adds a command, or a group of them, to the program.
+void addInit(Console& console);
+void addSignOn(Console& console);
+void addSessions(Console& console);
+void addDepartments(Console& console);
+void addUsers(Console& console);
+void addNumbers(Console& console);
+void addPolicy(Console& console);
+void addImport(Console& console);
+void addDoctor(Console& console);
+
+}  // namespace QVSa::console

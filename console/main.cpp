@@ -1,0 +1,15 @@
+#include "console/Commands.h"
+
+int main(int argc, char** argv) {
+  QVSa::console::Console console;
+  QVSa::console::addInit(console);
+  QVSa::console::addImport(console);
+  QVSa::console::addSignOn(console);
+  QVSa::console::addSessions(console);
+  QVSa::console::addDepartments(console);
+  QVSa::console::addUsers(console);
+  QVSa::console::addNumbers(console);
+  QVSa::console::addPolicy(console);
+  QVSa::console::addDoctor(console);
+  return console.main(argc, argv);
+}

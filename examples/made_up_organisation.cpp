@@ -1,0 +1,99 @@
+// Writes departments.csv and users.csv of a made-up organisation, for the demonstration where no real one is at hand:
+// always the same, and of a real one's size: 839 departments up to 5 levels deep, 1,509 users.
+//   made_up_organisation FOLDER
+
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <random>
+#include <string>
+#include <vector>
+
+namespace {
+
+struct Department {
+  std::string number;
+  int level;
+};
+
+constexpr std::size_t departmentCount = 839;
+constexpr int userCount = 1509;
+constexpr int deepest = 5;
+constexpr std::size_t organisationCount = 9;
+
+const char* const kinds[] = {"Admins", "Docs", "Maintainers", "Release", "Reviewers", "Security", "Support", "Tests"};
+
+class Generator {
+ public:
+  explicit Generator(std::filesystem::path folder) : folder_(std::move(folder)) {}
+
+  void departments() {
+    std::ofstream file(folder_ / "departments.csv");
+    file << "number,name,superior,isOrganisation\n_root,The Made-up Company,,1\n";
+    departments_.push_back({"_root", 1});
+    while (departments_.size() < departmentCount) writeDepartment(file);
+  }
+
+  void users() {
+    std::ofstream file(folder_ / "users.csv");
+    file << "login,name,department\n";
+    for (int i = 1; i <= userCount; ++i) {
+      char name[16];
+      std::snprintf(name, sizeof name, "%04d", i);
+      file << "user" << name << ",User " << name << "," << home(i).number << "\n";
+    }
+  }
+
+ private:
+  // The branches come first, directly below the root; names repeat under different superiors, as they do in life.
+  void writeDepartment(std::ofstream& file) {
+    const std::size_t count = departments_.size();
+    const bool isBranch = count <= organisationCount;
+    const Department superior = isBranch ? departments_[0] : superiorOfTeam();
+    const std::string number = "d" + std::to_string(count);
+    const std::string name = isBranch ? "Branch " + std::to_string(count) : kinds[below(std::size(kinds))];
+    file << number << "," << name << "," << superior.number << "," << (isBranch ? 1 : 0) << "\n";
+    departments_.push_back({number, superior.level + 1});
+  }
+
+  Department superiorOfTeam() {
+    while (true) {
+      const Department& candidate = departments_[1 + below(departments_.size() - 1)];
+      if (candidate.level < deepest) return candidate;
+    }
+  }
+
+  // The first user sits at the bottom of the tree, so that a change above him shows.
+  const Department& home(int user) {
+    if (user > 1) return departments_[below(departments_.size())];
+    for (const Department& department : departments_)
+      if (department.level == deepest) return department;
+    return departments_.back();
+  }
+
+  // Taken from the engine itself: the library's distributions differ from one implementation to the next.
+  std::size_t below(std::size_t limit) { return engine_() % limit; }
+
+  std::filesystem::path folder_;
+  std::vector<Department> departments_;
+  std::mt19937 engine_{20240229};
+};
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  if (argc != 2) {
+    std::fprintf(stderr, "usage: made_up_organisation FOLDER\n");
+    return 2;
+  }
+  try {
+    std::filesystem::create_directories(argv[1]);
+    Generator generator(argv[1]);
+    generator.departments();
+    generator.users();
+    return 0;
+  } catch (const std::exception& error) {
+    std::fprintf(stderr, "made_up_organisation: %s\n", error.what());
+    return 1;
+  }
+}

@@ -1,0 +1,243 @@
+#include <cstdio>
+#include <fstream>
+#include <gtest/gtest.h>
+#include <sstream>
+#include <sys/wait.h>
+
+#include "QVSa/frame/Connection.h"
+#include "QVSa/frame/ConnectionString.h"
+#include "console/Answer.h"
+#include "tests/support/TestInstallation.h"
+
+namespace QVSa::console {
+namespace {
+
+struct Outcome {
+  int exitCode = -1;
+  Json document;
+  String said;  // on the standard error
+  String error() const { return document["error"]["number"].get<String>(); }
+};
+
+// The program itself, run on an installation of its own that `qvsa init` made: Admin's password is Adm1n-first.
+class Program : public testing::Test {
+ protected:
+  void SetUp() override { ASSERT_EQ(run("init", "Adm1n-first\nSa-first\n").exitCode, 0); }
+
+  String server() const { return "file:" + (folder_.path() / name_).string(); }
+
+  // Runs the program with --json and `input` on its standard input.
+  Outcome run(const String& arguments, const String& input = "") {
+    const auto inputFile = folder_.path() / "input";
+    const auto errorFile = folder_.path() / "error";
+    std::ofstream(inputFile) << input;
+    const String command = String(QVSA_CONSOLE) + " --json --server '" + server() + "' " + arguments + " <'" +
+                           inputFile.string() + "' 2>'" + errorFile.string() + "'";
+    FILE* pipe = popen(command.c_str(), "r");
+    String output;
+    char buffer[4096];
+    for (std::size_t count; (count = fread(buffer, 1, sizeof buffer, pipe)) > 0;) output.append(buffer, count);
+    const int status = pclose(pipe);
+    std::stringstream said;
+    said << std::ifstream(errorFile).rdbuf();
+    return {WEXITSTATUS(status), Json::parse(output, nullptr, false), said.str()};
+  }
+
+  void execute(const String& statement, const String& database = "QVSys") {
+    Connection connection;
+    connection.Open(buildConnString(server(), database, false));
+    connection.Execute(statement);
+  }
+
+  String value(const String& query, const String& database = "QVSys") {
+    Connection connection;
+    connection.Open(buildConnString(server(), database, false));
+    Recordset row = connection.Execute(query);
+    return row[0].asText();
+  }
+
+  void addAnn() { ASSERT_EQ(run("user add ann 'Ann A'", "Ann-pass-1\n").exitCode, 0); }
+  String signOn(const String& login, const String& password) {
+    return run("sign-on " + login, password + "\n").document["session"].get<String>();
+  }
+
+  void writeOrganisation(const String& departments, const String& users) {
+    std::ofstream(folder_.path() / "departments.csv") << "number,name,superior,isOrganisation\n" << departments;
+    std::ofstream(folder_.path() / "users.csv") << "login,name,department\n" << users;
+  }
+  String import(const String& more = "") {
+    const Outcome outcome = run("import organisation '" + folder_.path().string() + "' " + more, "First-pass-1\n");
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.said << outcome.document;
+    String result;
+    for (const Json& counts : outcome.document["counts"])
+      result += counts["what"].get<String>()[0] + counts["new"].dump() + counts["changed"].dump() +
+                counts["unchanged"].dump() + counts["left"].dump() + " ";
+    return result;
+  }
+
+  test::TestFolder folder_;
+  String name_ = "installation";
+};
+
+TEST_F(Program, InitMakesAnInstallationWhoseAdministratorCanSignOn) {
+  EXPECT_NE(signOn("Admin", "Adm1n-first"), "");
+  const Json admin = run("user show Admin").document;
+  EXPECT_EQ(admin["builtInRoles"], Json::array({"Administrators"}));
+  EXPECT_EQ(admin["state"], "normal");
+  EXPECT_EQ(run("doctor").exitCode, 0);
+  EXPECT_EQ(run("init", "x\ny\n").exitCode, 1);
+  EXPECT_NE(signOn("Admin", "Adm1n-first"), "");
+}
+
+TEST_F(Program, InitShowsThePasswordsThatItMadeUp) {
+  const Outcome made = run("init '" + (folder_.path() / "other").string() + "' --make-passwords");
+  const String password = made.document["adminPassword"];
+  EXPECT_EQ(run("sign-on Admin", password + "\n").exitCode, 1);
+  name_ = "other";
+  EXPECT_NE(signOn("Admin", password), "");
+  EXPECT_NE(made.document["saPassword"], made.document["adminPassword"]);
+}
+
+TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
+  const Outcome wrong = run("sign-on Admin", "wrong\n");
+  EXPECT_EQ(wrong.exitCode, 1);
+  EXPECT_EQ(wrong.error(), "0x80040452");
+  EXPECT_EQ(run("sign-on nobody", "x\n").error(), "0x8004044D");
+  for (const char* misuse :
+       {"", "dept show", "sign-on Admin --password x", "no-such-command", "number rule add x --reuse often"})
+    EXPECT_EQ(run(misuse, "x\n").exitCode, 2) << misuse;
+  EXPECT_EQ(run("sign-on Admin", "").exitCode, 2);
+  name_ = "missing";
+  EXPECT_EQ(run("doctor").exitCode, 1);
+}
+
+TEST_F(Program, AnExpiredPasswordCanStillBeChanged) {
+  addAnn();
+  ASSERT_EQ(run("policy set --max-days 5").exitCode, 0);
+  execute("update users set pwdDate='20200101' where userLogin='ann'");
+  EXPECT_EQ(run("sign-on ann", "Ann-pass-1\n").error(), "0x8004045F");
+  EXPECT_EQ(run("password ann", "wrong\nAnn-pass-2\n").error(), "0x80040452");
+  EXPECT_EQ(run("password ann", "Ann-pass-1\nAnn-pass-2\n").exitCode, 0);
+  EXPECT_NE(signOn("ann", "Ann-pass-2"), "");
+}
+
+TEST_F(Program, AChangeOfPasswordLeavesNoSessionAndHeedsTheFlagAgainstIt) {
+  addAnn();
+  ASSERT_EQ(run("password ann", "Ann-pass-1\nAnn-pass-2\n").exitCode, 0);
+  execute("update users set PwdNoChange=1 where userLogin='ann'");
+  EXPECT_EQ(run("password ann", "Ann-pass-2\nAnn-pass-3\n").exitCode, 1);
+  EXPECT_EQ(value("select count(*) from seslog"), "0");
+  EXPECT_NE(signOn("ann", "Ann-pass-2"), "");
+}
+
+TEST_F(Program, UnlockKeepsPasswordAndGroupAndRefusesWhereJobsWouldGo) {
+  addAnn();
+  execute("insert into ItemGroups(gName) values('Friends')");
+  execute("insert into GrpUser(gId,userId) select 1,userId from users where userLogin='ann'");
+  run("policy set --lock-after 1");
+  EXPECT_EQ(run("sign-on ann", "wrong\n").error(), "0x8004045E");
+  execute("insert into userJob(userId,jobId) select userId,2 from users where userLogin='ann'");
+  EXPECT_EQ(run("user unlock ann").exitCode, 1);
+  EXPECT_EQ(value("select count(*) from userJob where jobId=2"), "1");
+  execute("delete from userJob where jobId=2");
+
+  EXPECT_EQ(run("user unlock ann").exitCode, 0);
+  EXPECT_EQ(run("user show ann").document["groups"], "Friends");
+  EXPECT_NE(signOn("ann", "Ann-pass-1"), "");
+  EXPECT_EQ(run("user unlock ann").exitCode, 1);
+}
+
+TEST_F(Program, UnlockRefusesWhatASaveCouldNotKeep) {
+  addAnn();
+  execute("insert into ItemGroups(gName) values('Friends') insert into ItemGroups(gName) values('Others')");
+  execute("insert into GrpUser(gId,userId) select g.gId,u.userId from users u,ItemGroups g where userLogin='ann'");
+  execute("update users set accstate=1 where userLogin='ann'");
+  EXPECT_EQ(run("user unlock ann").exitCode, 1);
+  EXPECT_EQ(value("select count(*) from GrpUser"), "2");
+  execute("delete from GrpUser where gId=2 update users set userPwd='of another key' where userLogin='ann'");
+  EXPECT_EQ(run("user unlock ann").exitCode, 1);
+  EXPECT_EQ(value("select userPwd from users where userLogin='ann'"), "of another key");
+}
+
+TEST_F(Program, PruneEndsIdleSessionsAloneAndTheirNumbersComeBack) {
+  const String idle = signOn("Admin", "Adm1n-first");
+  const String busy = signOn("Admin", "Adm1n-first");
+  run("number rule add invoice --prefix I --digits 3 --reuse any");
+  const String number = run("number issue invoice --record r1 --session " + idle).document["number"];
+  execute("update seslog set lastActTime=dateadd(minute,-31,getdate()) where sesId='" + idle + "'");
+  EXPECT_EQ(run("sessions prune --idle 30").document["ended"], Json::array({idle}));
+  const Json left = run("sessions list").document["sessions"];
+  ASSERT_EQ(left.size(), 1U);
+  EXPECT_EQ(left[0]["session"], busy);
+  EXPECT_EQ(run("number issue invoice --record r2").document["number"], number);
+  EXPECT_EQ(run("sessions end " + idle).exitCode, 1);
+  EXPECT_EQ(run("sessions end " + busy).exitCode, 0);
+}
+
+TEST_F(Program, NumbersFollowTheirRuleAndItsStart) {
+  run("number rule add order --prefix O- --date none --digits 4");
+  EXPECT_EQ(run("number issue order").document["number"], "O-0001");
+  run("number start order 50");
+  EXPECT_EQ(run("number issue order").document["number"], "O-0050");
+  EXPECT_EQ(run("number rule list").document["rules"].size(), 1U);
+  EXPECT_EQ(run("number rule add order").error(), "0x80040E2F");
+  EXPECT_EQ(run("number issue nothing").error(), "0x800405DE");
+}
+
+TEST_F(Program, ThePolicyKeepsWhatIsNotNamed) {
+  run("policy set --min-length 8 --mixed-case --lock-after 3");
+  const Json policy = run("policy set --no-mixed-case --history 2").document;
+  EXPECT_EQ(policy["minLength"], 8);
+  EXPECT_EQ(policy["lockAfter"], 3);
+  EXPECT_EQ(policy["mixedCase"], false);
+  EXPECT_EQ(policy["history"], 2);
+  EXPECT_TRUE(run("policy set --lock-after 0").document["lockAfter"].is_null());
+}
+
+TEST_F(Program, DepartmentsMoveWithTheirBranchButNeverBelowThemselves) {
+  run("dept add a A");
+  run("dept add b B --under a");
+  run("dept add c C --organisation");
+  EXPECT_EQ(run("dept move a b").exitCode, 1);
+  EXPECT_EQ(run("dept move a a").exitCode, 1);
+  EXPECT_EQ(run("dept move a c").exitCode, 0);
+  EXPECT_EQ(run("dept show b").document["fullName"], "C-A-B");
+  EXPECT_EQ(run("dept show b").document["organisation"], "c");
+  EXPECT_EQ(run("dept rename c See").document["fullName"], "See");
+  EXPECT_EQ(run("dept show b").document["fullName"], "See-A-B");
+  EXPECT_EQ(run("dept add a Again").exitCode, 1);
+  EXPECT_EQ(run("dept remove a").error(), "0x800403EC");
+  EXPECT_EQ(run("dept remove _out").exitCode, 1);
+  EXPECT_EQ(run("dept remove b").exitCode, 0);
+  EXPECT_EQ(run("dept show b").error(), "0x800403E9");
+}
+
+TEST_F(Program, AnImportCanBeRunAgainAndChangesWhatDiffers) {
+  writeOrganisation("_root,Top,,1\nd1,One,_root,1\nd2,Two,d1,0\n", "ann,Ann,d2\nbob,Bob,d1\n");
+  EXPECT_EQ(import("--dry-run"), "d2100 u2000 ");
+  EXPECT_EQ(value("select count(*) from departments"), "2");
+  EXPECT_EQ(import(), "d2100 u2000 ");
+  EXPECT_EQ(import(), "d0030 u0020 ");
+  EXPECT_EQ(run("dept show d2").document["fullName"], "One-Two");
+  EXPECT_NE(signOn("ann", "First-pass-1"), "");
+
+  writeOrganisation("_root,Another,,1\nd1,Uno,_root,1\nd2,Two,d1,0\n", "ann,Ann,d1\nbob,Bob B,d1\n");
+  execute("insert into userJob(userId,jobId) select userId,2 from users where userLogin='bob'");
+  EXPECT_EQ(import(), "d0111 u0101 ");
+  EXPECT_EQ(run("dept show d2").document["fullName"], "Uno-Two");
+  EXPECT_EQ(run("dept show _root").document["name"], "Top");
+  EXPECT_EQ(run("user show ann").document["departmentNumber"], "d1");
+  EXPECT_EQ(value("select count(*) from userJob where jobId=2"), "1");
+  EXPECT_NE(signOn("ann", "First-pass-1"), "");
+}
+
+TEST_F(Program, DoctorTellsWhatASignOnWouldPassOver) {
+  execute("drop table saferule");
+  const Outcome outcome = run("doctor");
+  EXPECT_EQ(outcome.exitCode, 1);
+  EXPECT_EQ(outcome.document["points"][0]["state"], "BAD");
+  EXPECT_EQ(outcome.document["points"][1]["state"], "good");
+}
+
+}  // namespace
+}  // namespace QVSa::console

@@ -1,0 +1,47 @@
+#!/bin/sh
+# Installs the Debian packages that the project needs, as far as they are missing; asks no server when all are there.
+#   tools/install-packages.sh          what building, testing and benchmarks need
+#   tools/install-packages.sh lint     clang-format and clang-tidy as well
+#   tools/install-packages.sh fuzz     clang as well
+set -eu
+
+packages="build-essential cmake ninja-build ccache
+  libsqlite3-dev libssl-dev unixodbc-dev tdsodbc libsqliteodbc
+  libpugixml-dev libcli11-dev nlohmann-json3-dev libfccp-dev
+  libgtest-dev libbenchmark-dev"
+
+case "${1:-}" in
+  "") ;;
+  lint) packages="$packages clang-format clang-tidy" ;;
+  fuzz) packages="$packages clang" ;;
+  *)
+    echo "usage: $0 [lint | fuzz]" >&2
+    exit 2
+    ;;
+esac
+
+if ! command -v dpkg-query >/dev/null; then
+  echo "This script knows Debian's packages only. Needed here are: $packages" >&2
+  exit 1
+fi
+
+missing=""
+for package in $packages; do
+  status=$(dpkg-query --show --showformat='${db:Status-Status}' "$package" 2>/dev/null || true)
+  [ "$status" = installed ] || missing="$missing $package"
+done
+[ -n "$missing" ] || exit 0
+
+echo "Installing:$missing"
+as_root=""
+if [ "$(id -u)" -ne 0 ]; then
+  if ! command -v sudo >/dev/null; then
+    echo "Installing packages needs root, and there is no sudo. As root: apt-get install$missing" >&2
+    exit 1
+  fi
+  as_root="sudo"
+fi
+export DEBIAN_FRONTEND=noninteractive
+$as_root apt-get update --quiet=2
+# shellcheck disable=SC2086  # one word a package
+$as_root apt-get install --yes --quiet=2 --no-install-recommends $missing
