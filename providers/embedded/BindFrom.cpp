@@ -40,6 +40,7 @@ void Binder::bindJoin(const tsql::TableSource& join, Scope& scope, BoundCore& co
     throw tsql::sqlFailure(40515, "This form of outer join is not supported by the embedded engine.");
   bindSource(first, scope, core);
   bindSource(second, scope, core);
+  core.from.back().crossJoin = join.join == Join::cross;
   if (!join.on) return;
   BoundPtr on = bind(*join.on, scope);
   if (outer) {

@@ -88,6 +88,8 @@ struct BoundSource {
   BoundSelectPtr derived{};          // a derived table, a view
   // Left joins hang on what stands before them.
   bool leftJoin = false;
+  // Written as a cross join: read after what stands before it, as the text's author chose.
+  bool crossJoin = false;
   BoundPtr on{};
 };
 

@@ -47,7 +47,7 @@ std::string emitSource(const BoundSource& source) {
 std::string emitFrom(const std::vector<BoundSource>& from) {
   std::string text;
   for (const auto& source : from) {
-    if (!text.empty()) text += source.leftJoin ? " left join " : ",";
+    if (!text.empty()) text += source.leftJoin ? " left join " : source.crossJoin ? " cross join " : ",";
     text += emitSource(source);
   }
   return text;

@@ -225,7 +225,7 @@ TableSourcePtr Block::build() {
                 : std::move(tables_[i].source);
   };
   for (std::size_t i = 0; i < tables_.size(); ++i)
-    if (!tables_[i].isInner) place(i, TableSource::Join::cross, nullptr);
+    if (!tables_[i].isInner) place(i, TableSource::Join::product, nullptr);
   if (!tree) refuseRequest();
   for (;;) {
     std::size_t next = 0;

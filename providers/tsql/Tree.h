@@ -91,7 +91,8 @@ struct SelectItem {
 
 struct TableSource {
   enum class Kind { table, derived, join };
-  enum class Join { inner, left, right, full, cross };
+  // product is what a comma of a from list means where it has to stand beside joins: printed as a cross join.
+  enum class Join { inner, left, right, full, cross, product };
 
   Kind kind = Kind::table;
   ObjectName table;

@@ -8,6 +8,12 @@
 // Trees as text with every level in parentheses, operators first: what a printed statement leaves to precedence shows.
 namespace QVSa::tsql {
 
+// A product is written as a cross join, and so is read as one.
+inline TableSource::Join joinOf(const TableSource& source) {
+  using Join = tsql::TableSource::Join;
+  return source.join == Join::product ? Join::cross : source.join;
+}
+
 inline String treeOf(const Select& select);
 inline String treeOf(const Expression& expression);
 
@@ -82,7 +88,7 @@ inline String treeOf(const OrderItem& item) { return treeOf(item.expression) + (
 
 inline String treeOf(const TableSource& source) {
   if (source.kind == TableSource::Kind::join)
-    return "(join" + std::to_string(static_cast<int>(source.join)) + " " + treeOf(*source.left) + " " +
+    return "(join" + std::to_string(static_cast<int>(joinOf(source))) + " " + treeOf(*source.left) + " " +
            treeOf(*source.right) + " " + treeOf(source.on) + ")";
   String text = source.derived ? treeOf(*source.derived) : source.table.database + "." + source.table.name;
   if (source.alias) text += ":" + *source.alias;
