@@ -72,9 +72,9 @@ BoundPtr Binder::coerce(BoundPtr value, const Type& to, Purpose purpose, int sty
 }
 
 Type Binder::common(const Type& a, const Type& b) {
-  static constexpr Base precedence[] = {Base::unknown, Base::image,    Base::varchar, Base::nvarchar, Base::ntext,
-                                        Base::bit,     Base::tinyint,  Base::smallint, Base::integer, Base::bigint,
-                                        Base::decimal, Base::real,     Base::smalldatetime, Base::datetime};
+  static constexpr Base precedence[] = {Base::unknown, Base::image,   Base::varchar,       Base::nvarchar, Base::ntext,
+                                        Base::bit,     Base::tinyint, Base::smallint,      Base::integer,  Base::bigint,
+                                        Base::decimal, Base::real,    Base::smalldatetime, Base::datetime};
   const auto rank = [](const Type& type) {
     return std::find(std::begin(precedence), std::end(precedence), type.base) - std::begin(precedence);
   };

@@ -78,8 +78,9 @@ BoundPtr Binder::bind(const tsql::Expression& expression, const Scope& scope) {
       subquery->select = bindSelect(*expression.select, &scope);
       const auto& items = subquery->select->parts.front().core.items;
       if (items.size() != 1)
-        throw tsql::sqlFailure(116, "Only one expression can be specified in the select list when the subquery is not "
-                                    "introduced with EXISTS.");
+        throw tsql::sqlFailure(116,
+                               "Only one expression can be specified in the select list when the subquery is not "
+                               "introduced with EXISTS.");
       subquery->type = items.front().expression->type;
       return subquery;
     }
@@ -174,8 +175,7 @@ BoundPtr Binder::arithmetic(const std::string& op, BoundPtr left, BoundPtr right
   static const std::map<std::string, std::string> functions = {
       {"+", "t_add"}, {"-", "t_subtract"}, {"*", "t_multiply"}, {"/", "t_divide"}, {"%", "t_modulo"}};
   Type type = common(left->type, right->type);
-  if (!type.isNumber())
-    throw tsql::sqlFailure(402, "The data types are incompatible in the operator '" + op + "'.");
+  if (!type.isNumber()) throw tsql::sqlFailure(402, "The data types are incompatible in the operator '" + op + "'.");
   left = coerce(std::move(left), type, Purpose::compute);
   right = coerce(std::move(right), type, Purpose::compute);
   if (type.isWhole() && type.base < Base::integer) type = {Base::integer, -1};
@@ -250,7 +250,8 @@ BoundPtr Binder::bindLike(const tsql::Expression& expression, const Scope& scope
   }
   BoundPtr like = call("t_like", {Base::bit, -1}, std::move(operands));
   if (indexable)
-    return infix("and", {Base::bit, -1}, infix("and", {Base::bit, -1}, std::move(low), std::move(high)), std::move(like));
+    return infix("and", {Base::bit, -1}, infix("and", {Base::bit, -1}, std::move(low), std::move(high)),
+                 std::move(like));
   if (!expression.negated) return like;
   BoundPtr negation = make(BoundExpression::Kind::prefix);
   negation->text = "not";
@@ -296,8 +297,9 @@ BoundPtr Binder::bindInSelect(const tsql::Expression& expression, BoundPtr value
   in->select = bindSelect(*expression.select, &scope);
   for (auto& part : in->select->parts) {
     if (part.core.items.size() != 1)
-      throw tsql::sqlFailure(116, "Only one expression can be specified in the select list when the subquery is not "
-                                  "introduced with EXISTS.");
+      throw tsql::sqlFailure(116,
+                             "Only one expression can be specified in the select list when the subquery is not "
+                             "introduced with EXISTS.");
     BoundPtr& item = part.core.items.front().expression;
     const Type type = common(value->type, item->type);
     value = coerce(std::move(value), type, Purpose::compute);

@@ -117,14 +117,15 @@ void Binder::bindDerived(const tsql::TableSource& source, Scope& scope, BoundCor
   BoundSelectPtr select = bindSelect(*source.derived, scope.outer);
   auto& items = select->parts.front().core.items;
   if (!source.columnNames.empty() && source.columnNames.size() != items.size())
-    throw tsql::sqlFailure(8158, "'" + source.alias.value_or("") + "' has a different number of columns than were "
-                                 "specified in the column list.");
+    throw tsql::sqlFailure(8158, "'" + source.alias.value_or("") +
+                                     "' has a different number of columns than were "
+                                     "specified in the column list.");
   for (std::size_t i = 0; i < source.columnNames.size(); ++i) items[i].name = source.columnNames[i];
   ScopeSource found{source.alias.value_or(""), newAlias(), resultColumns(*select), nullptr};
   for (std::size_t i = 0; i < found.columns.size(); ++i)
     if (found.columns[i].name.empty())
-      throw tsql::sqlFailure(8155, "No column name was specified for column " + std::to_string(i + 1) + " of '" +
-                                       found.name + "'.");
+      throw tsql::sqlFailure(
+          8155, "No column name was specified for column " + std::to_string(i + 1) + " of '" + found.name + "'.");
   core.from.push_back({.alias = found.alias, .derived = std::move(select)});
   addScope(scope, std::move(found));
 }

@@ -71,9 +71,9 @@ BoundPtr Binder::bindFunction(const tsql::Expression& expression, const Scope& s
   if (signature == signatures().end()) return bindDateFunction(expression, scope);
   std::vector<BoundPtr> operands;
   for (std::size_t i = 0; i < expression.operands.size(); ++i)
-    operands.push_back(
-        coerce(bind(*expression.operands[i], scope), signature->second.arguments[i], Purpose::compute));
-  const Type result = signature->second.result == keep && !operands.empty() ? operands[0]->type : signature->second.result;
+    operands.push_back(coerce(bind(*expression.operands[i], scope), signature->second.arguments[i], Purpose::compute));
+  const Type result =
+      signature->second.result == keep && !operands.empty() ? operands[0]->type : signature->second.result;
   return call(signature->second.function, result, std::move(operands));
 }
 
@@ -98,8 +98,9 @@ BoundPtr Binder::bindAggregate(const tsql::Expression& expression, const Scope& 
   std::vector<BoundPtr> operands;
   operands.push_back(argument.kind == tsql::Expression::Kind::star ? constant("*") : bind(argument, scope));
   if (operands[0]->aggregate)
-    throw tsql::sqlFailure(130, "Cannot perform an aggregate function on an expression containing an aggregate or a "
-                                "subquery.");
+    throw tsql::sqlFailure(130,
+                           "Cannot perform an aggregate function on an expression containing an aggregate or a "
+                           "subquery.");
   const Type type = operands[0]->type;
   if ((expression.name == "sum" || expression.name == "avg") && !type.isNumber())
     throw tsql::sqlFailure(8117, "Operand data type is invalid for " + expression.name + " operator.");

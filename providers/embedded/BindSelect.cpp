@@ -96,9 +96,10 @@ BoundCore Binder::bindCore(const tsql::SelectCore& core, Scope& scope) {
   if (core.where) {
     bound.where.push_back(bind(*core.where, scope));
     if (bound.where.back()->aggregate)
-      throw tsql::sqlFailure(147, "An aggregate may not appear in the WHERE clause unless it is in a subquery contained "
-                                  "in a HAVING clause or a select list, and the column being aggregated is an outer "
-                                  "reference.");
+      throw tsql::sqlFailure(147,
+                             "An aggregate may not appear in the WHERE clause unless it is in a subquery contained "
+                             "in a HAVING clause or a select list, and the column being aggregated is an outer "
+                             "reference.");
   }
   bindItems(core, scope, bound);
   for (const auto& expression : core.groupBy) bound.groupBy.push_back(collate(bind(*expression, scope)));
@@ -144,12 +145,14 @@ void Binder::addStar(const tsql::Expression& star, const Scope& scope, BoundCore
   }
   if (known) return;
   if (star.qualifier.empty()) throw tsql::sqlFailure(263, "Must specify table to select from.");
-  throw tsql::sqlFailure(107, "The column prefix '" + star.qualifier.back() + "' does not match with a table name or "
-                              "alias name used in the query.");
+  throw tsql::sqlFailure(107, "The column prefix '" + star.qualifier.back() +
+                                  "' does not match with a table name or "
+                                  "alias name used in the query.");
 }
 
 void Binder::checkGroup(const BoundCore& core, const Scope& scope) {
-  const bool aggregates = std::ranges::any_of(core.items, [](const BoundItem& item) { return item.expression->aggregate; });
+  const bool aggregates =
+      std::ranges::any_of(core.items, [](const BoundItem& item) { return item.expression->aggregate; });
   if (core.groupBy.empty() && !core.having && !aggregates) return;
   for (const auto& item : core.items) checkGrouped(*item.expression, core, scope);
   if (core.having) checkGrouped(*core.having, core, scope);
@@ -157,15 +160,18 @@ void Binder::checkGroup(const BoundCore& core, const Scope& scope) {
 
 // Every column that is read outside an aggregate is one of the group's expressions or stands inside one.
 void Binder::checkGrouped(const BoundExpression& expression, const BoundCore& core, const Scope& scope) {
-  if (std::ranges::any_of(core.groupBy, [&](const BoundPtr& group) { return sameExpression(*group, expression); })) return;
+  if (std::ranges::any_of(core.groupBy, [&](const BoundPtr& group) { return sameExpression(*group, expression); }))
+    return;
   const bool isAggregate = expression.kind == BoundExpression::Kind::call && expression.aggregate &&
                            std::ranges::none_of(expression.operands, [](const BoundPtr& o) { return o->aggregate; });
   if (isAggregate) return;
-  const bool own = expression.kind == BoundExpression::Kind::column &&
-                   std::ranges::any_of(scope.sources, [&](const ScopeSource& s) { return s.alias == expression.source; });
+  const bool own =
+      expression.kind == BoundExpression::Kind::column &&
+      std::ranges::any_of(scope.sources, [&](const ScopeSource& s) { return s.alias == expression.source; });
   if (own)
-    throw tsql::sqlFailure(8120, "Column " + expression.text + " is invalid in the select list because it is not "
-                                 "contained in either an aggregate function or the GROUP BY clause.");
+    throw tsql::sqlFailure(8120, "Column " + expression.text +
+                                     " is invalid in the select list because it is not "
+                                     "contained in either an aggregate function or the GROUP BY clause.");
   for (const auto& operand : expression.operands) checkGrouped(*operand, core, scope);
 }
 
@@ -195,8 +201,9 @@ void Binder::unifyParts(BoundSelect& select) {
   auto& first = select.parts.front().core.items;
   for (auto& part : select.parts)
     if (part.core.items.size() != first.size())
-      throw tsql::sqlFailure(205, "All queries combined using a UNION, INTERSECT or EXCEPT operator must have an equal "
-                                  "number of expressions in their target lists.");
+      throw tsql::sqlFailure(205,
+                             "All queries combined using a UNION, INTERSECT or EXCEPT operator must have an equal "
+                             "number of expressions in their target lists.");
   for (std::size_t i = 0; i < first.size(); ++i) {
     Type type;
     for (const auto& part : select.parts) type = common(type, part.core.items[i].expression->type);
@@ -209,7 +216,8 @@ void Binder::unifyParts(BoundSelect& select) {
 
 // Rows are told apart by the dialect's collation.
 void Binder::collateResult(BoundSelect& select) {
-  const bool distinct = std::ranges::any_of(select.parts, [](const BoundSelect::Part& part) { return part.core.distinct; });
+  const bool distinct =
+      std::ranges::any_of(select.parts, [](const BoundSelect::Part& part) { return part.core.distinct; });
   if (select.parts.size() == 1 && !distinct) return;
   for (auto& part : select.parts)
     for (auto& item : part.core.items) item.expression = collate(std::move(item.expression));
@@ -227,7 +235,8 @@ std::optional<std::size_t> Binder::ordinalOf(const tsql::Expression& expression,
   if (expression.kind != Kind::column || !expression.qualifier.empty()) return std::nullopt;
   // An alias hides a column of its name. In a union the result's names are all that there is.
   for (std::size_t i = 0; i < core.items.size(); ++i)
-    if ((core.items[i].aliased || select.parts.size() > 1) && sameName(core.items[i].name, expression.name)) return i + 1;
+    if ((core.items[i].aliased || select.parts.size() > 1) && sameName(core.items[i].name, expression.name))
+      return i + 1;
   return std::nullopt;
 }
 
@@ -244,8 +253,9 @@ void Binder::bindOrder(const tsql::Select& select, BoundSelect& bound, const Sco
       continue;
     }
     if (select.parts.size() > 1)
-      throw tsql::sqlFailure(104, "ORDER BY items must appear in the select list if the statement contains a UNION, "
-                                  "INTERSECT or EXCEPT operator.");
+      throw tsql::sqlFailure(104,
+                             "ORDER BY items must appear in the select list if the statement contains a UNION, "
+                             "INTERSECT or EXCEPT operator.");
     order.expression = collate(bind(*item.expression, scope));
     if (core.distinct) {
       const auto same = std::ranges::find_if(core.items, [&](const BoundItem& candidate) {
@@ -263,7 +273,8 @@ void Binder::bindOrder(const tsql::Select& select, BoundSelect& bound, const Sco
 std::vector<Binder::SourceColumn> Binder::resultColumns(const BoundSelect& select) {
   std::vector<SourceColumn> columns;
   for (const auto& item : select.parts.front().core.items)
-    columns.push_back({item.name, "\"c" + std::to_string(columns.size()) + "\"", item.expression->type, false, std::nullopt});
+    columns.push_back(
+        {item.name, "\"c" + std::to_string(columns.size()) + "\"", item.expression->type, false, std::nullopt});
   return columns;
 }
 

@@ -30,8 +30,9 @@ const TableInfo& Binder::writeTarget(const tsql::ObjectName& target,
   const tsql::TableSource* source = sourceNamed(from, target);
   const Object object = catalogue_.find(source ? source->table : target, database_);
   if (const auto* table = std::get_if<const TableInfo*>(&object)) return **table;
-  throw tsql::sqlFailure(4406, "Update or insert of view or function '" + target.name + "' failed because it is not "
-                               "updatable by the embedded engine.");
+  throw tsql::sqlFailure(4406, "Update or insert of view or function '" + target.name +
+                                   "' failed because it is not "
+                                   "updatable by the embedded engine.");
 }
 
 std::size_t Binder::bindWriteScope(const tsql::ObjectName& target, const std::vector<tsql::TableSourcePtr>& from,
@@ -68,8 +69,9 @@ BoundSelectPtr Binder::keysOf(const tsql::ObjectName& target, const std::vector<
 BoundPtr Binder::bindStored(const tsql::Expression& expression, const ColumnInfo& column, const Scope& scope) {
   BoundPtr value = bind(expression, scope);
   if (value->type.isDate() && column.type.isNumber() && column.type.isWhole())
-    throw tsql::sqlFailure(257, "Implicit conversion from data type datetime to int is not allowed. Use the CONVERT "
-                                "function to run this query.");
+    throw tsql::sqlFailure(257,
+                           "Implicit conversion from data type datetime to int is not allowed. Use the CONVERT "
+                           "function to run this query.");
   return coerce(std::move(value), column.type, Purpose::store);
 }
 
@@ -84,8 +86,9 @@ std::vector<std::size_t> Binder::insertColumns(const tsql::Insert& insert, const
     const auto column = table.find(name);
     if (!column) throw tsql::sqlFailure(207, "Invalid column name '" + name + "'.");
     if (std::ranges::find(columns, *column) != columns.end())
-      throw tsql::sqlFailure(264, "The column name '" + name + "' is specified more than once in the SET clause or column "
-                                  "list of an INSERT.");
+      throw tsql::sqlFailure(264, "The column name '" + name +
+                                      "' is specified more than once in the SET clause or column "
+                                      "list of an INSERT.");
     columns.push_back(*column);
   }
   return columns;
@@ -95,7 +98,8 @@ BoundInsert Binder::bindInsert(const tsql::Insert& insert) {
   BoundInsert bound;
   bound.table = &writeTarget(insert.table, {});
   bound.columns = insertColumns(insert, *bound.table);
-  bound.givesIdentity = bound.table->identity && std::ranges::find(bound.columns, *bound.table->identity) != bound.columns.end();
+  bound.givesIdentity =
+      bound.table->identity && std::ranges::find(bound.columns, *bound.table->identity) != bound.columns.end();
   const std::size_t given = bound.columns.size();
   const auto countFailure = [] {
     return tsql::sqlFailure(213, "Column name or number of supplied values does not match table definition.");
@@ -105,11 +109,13 @@ BoundInsert Binder::bindInsert(const tsql::Insert& insert) {
     for (const auto& part : bound.select->parts)
       if (part.core.items.size() != given)
         throw insert.columns.empty() ? countFailure()
-              : part.core.items.size() < given
-                  ? tsql::sqlFailure(120, "The select list for the INSERT statement contains fewer items than the insert "
-                                          "list. The number of SELECT values must match the number of INSERT columns.")
-                  : tsql::sqlFailure(121, "The select list for the INSERT statement contains more items than the insert "
-                                          "list. The number of SELECT values must match the number of INSERT columns.");
+        : part.core.items.size() < given
+            ? tsql::sqlFailure(120,
+                               "The select list for the INSERT statement contains fewer items than the insert "
+                               "list. The number of SELECT values must match the number of INSERT columns.")
+            : tsql::sqlFailure(121,
+                               "The select list for the INSERT statement contains more items than the insert "
+                               "list. The number of SELECT values must match the number of INSERT columns.");
   }
   for (const auto& values : insert.values) {
     if (values.size() != given) throw countFailure();
@@ -127,8 +133,8 @@ BoundInsert Binder::bindInsert(const tsql::Insert& insert) {
 void Binder::addDefaults(BoundInsert& insert, std::size_t given) {
   for (std::size_t i = 0; i < insert.table->columns.size(); ++i) {
     const ColumnInfo& column = insert.table->columns[i];
-    const bool named = std::find(insert.columns.begin(), insert.columns.begin() + static_cast<std::ptrdiff_t>(given), i) !=
-                       insert.columns.begin() + static_cast<std::ptrdiff_t>(given);
+    const bool named = std::find(insert.columns.begin(), insert.columns.begin() + static_cast<std::ptrdiff_t>(given),
+                                 i) != insert.columns.begin() + static_cast<std::ptrdiff_t>(given);
     if (named || !column.defaultValue) continue;
     insert.columns.push_back(i);
     const auto value = [&] {
@@ -164,7 +170,8 @@ BoundUpdate Binder::bindUpdate(const tsql::Update& update) {
     if (column == bound.table->identity)
       throw tsql::sqlFailure(8102, "Cannot update identity column '" + assignment.column + "'.");
     BoundPtr value = bindStored(*assignment.value, bound.table->columns[*column], scope);
-    if (value->aggregate) throw tsql::sqlFailure(157, "An aggregate may not appear in the set list of an UPDATE statement.");
+    if (value->aggregate)
+      throw tsql::sqlFailure(157, "An aggregate may not appear in the set list of an UPDATE statement.");
     bound.assignments.emplace_back(*column, std::move(value));
   }
   if (update.where) core.where.push_back(bind(*update.where, scope));

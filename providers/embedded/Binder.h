@@ -84,8 +84,8 @@ class Binder {
   // BindWrite.cpp
   const TableInfo& writeTarget(const tsql::ObjectName& target, const std::vector<tsql::TableSourcePtr>& from) const;
   // Brings the target and the from clause into scope; gives the target's place among the sources.
-  std::size_t bindWriteScope(const tsql::ObjectName& target, const std::vector<tsql::TableSourcePtr>& from, Scope& scope,
-                             BoundCore& core);
+  std::size_t bindWriteScope(const tsql::ObjectName& target, const std::vector<tsql::TableSourcePtr>& from,
+                             Scope& scope, BoundCore& core);
   BoundSelectPtr keysOf(const tsql::ObjectName& target, const std::vector<tsql::TableSourcePtr>& from,
                         const tsql::Expression* where);
   BoundPtr bindStored(const tsql::Expression& expression, const ColumnInfo& column, const Scope& scope);

@@ -21,21 +21,21 @@ using BoundSelectPtr = std::unique_ptr<BoundSelect>;
 struct BoundExpression {
   enum class Kind {
     null,
-    parameter,   // ?n
-    column,      // source.name
-    rowid,       // source.rowid
-    constant,    // a text of the storage library's own, such as a type code
-    call,        // text(operands), `distinct` for an aggregate; count(*) has the operand constant *
-    prefix,      // text operands[0]
-    infix,       // operands[0] text operands[1]
-    isNull,      // operands[0] is [not] null
-    between,     // operands[0] [not] between operands[1] and operands[2]
-    caseOf,      // case when o[0] then o[1] when o[2] then o[3] ... [else o.back()]
-    inValues,    // operands[0] [not] in (operands[1], ...)
-    inList,      // operands[0] [not] in the list bound to `parameter`
-    inSelect,    // operands[0] [not] in (select)
-    exists,      // [not] exists (select)
-    subquery,    // (select)
+    parameter,  // ?n
+    column,     // source.name
+    rowid,      // source.rowid
+    constant,   // a text of the storage library's own, such as a type code
+    call,       // text(operands), `distinct` for an aggregate; count(*) has the operand constant *
+    prefix,     // text operands[0]
+    infix,      // operands[0] text operands[1]
+    isNull,     // operands[0] is [not] null
+    between,    // operands[0] [not] between operands[1] and operands[2]
+    caseOf,     // case when o[0] then o[1] when o[2] then o[3] ... [else o.back()]
+    inValues,   // operands[0] [not] in (operands[1], ...)
+    inList,     // operands[0] [not] in the list bound to `parameter`
+    inSelect,   // operands[0] [not] in (select)
+    exists,     // [not] exists (select)
+    subquery,   // (select)
   };
 
   Kind kind = Kind::null;
@@ -98,7 +98,7 @@ struct BoundCore {
   std::optional<std::size_t> top;  // parameter
   std::vector<BoundItem> items;
   std::vector<BoundSource> from;
-  std::vector<BoundPtr> where;     // all of them hold
+  std::vector<BoundPtr> where;  // all of them hold
   std::vector<BoundPtr> groupBy;
   BoundPtr having;
 };

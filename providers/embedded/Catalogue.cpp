@@ -21,7 +21,8 @@ TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition) {
                                 });
                        });
     if (column.identity) table.identity = table.columns.size();
-    table.columns.push_back({column.name, typeOf(column.type), !inKey && !column.identity && column.nullable.value_or(true),
+    table.columns.push_back({column.name, typeOf(column.type),
+                             !inKey && !column.identity && column.nullable.value_or(true),
                              std::move(column.defaultValue)});
   }
   return table;
@@ -89,7 +90,9 @@ Object Catalogue::find(const tsql::ObjectName& name, std::size_t currentDatabase
   throw tsql::sqlFailure(208, "Invalid object name '" + name.name + "'.");
 }
 
-bool Catalogue::exists(std::size_t database, const std::string& name) const { return lookUp(database, name) != nullptr; }
+bool Catalogue::exists(std::size_t database, const std::string& name) const {
+  return lookUp(database, name) != nullptr;
+}
 
 const SynonymInfo* Catalogue::synonym(std::size_t database, const std::string& name) const {
   const Entry* entry = lookUp(database, name);
@@ -104,13 +107,13 @@ std::optional<std::size_t> databaseByName(const std::string& name) {
 
 Type typeOf(const tsql::TypeName& name) {
   static const std::map<std::string, Base> known = {
-      {"bit", Base::bit},           {"tinyint", Base::tinyint},   {"smallint", Base::smallint},
-      {"int", Base::integer},       {"integer", Base::integer},   {"bigint", Base::bigint},
-      {"decimal", Base::decimal},   {"numeric", Base::decimal},   {"money", Base::decimal},
-      {"float", Base::real},        {"real", Base::real},         {"smalldatetime", Base::smalldatetime},
-      {"datetime", Base::datetime}, {"varchar", Base::varchar},   {"char", Base::varchar},
-      {"nvarchar", Base::nvarchar}, {"nchar", Base::nvarchar},    {"text", Base::ntext},
-      {"ntext", Base::ntext},       {"image", Base::image},       {"binary", Base::image},
+      {"bit", Base::bit},           {"tinyint", Base::tinyint}, {"smallint", Base::smallint},
+      {"int", Base::integer},       {"integer", Base::integer}, {"bigint", Base::bigint},
+      {"decimal", Base::decimal},   {"numeric", Base::decimal}, {"money", Base::decimal},
+      {"float", Base::real},        {"real", Base::real},       {"smalldatetime", Base::smalldatetime},
+      {"datetime", Base::datetime}, {"varchar", Base::varchar}, {"char", Base::varchar},
+      {"nvarchar", Base::nvarchar}, {"nchar", Base::nvarchar},  {"text", Base::ntext},
+      {"ntext", Base::ntext},       {"image", Base::image},     {"binary", Base::image},
       {"varbinary", Base::image}};
   const auto base = known.find(name.name);
   if (base == known.end()) throw tsql::sqlFailure(2715, "Cannot find data type " + name.name + ".");

@@ -151,8 +151,10 @@ void createIndex(Handle& handle, const Catalogue& catalogue, std::size_t current
                    columnList(index.columns) + ")");
   } catch (const Failure& failure) {
     if (failure.number() != number::integrity) throw;
-    throw tsql::sqlFailure(1505, "The CREATE UNIQUE INDEX statement terminated because a duplicate key was found for the "
-                                 "object name '" + table.name + "' and the index name '" + index.name + "'.");
+    throw tsql::sqlFailure(1505,
+                           "The CREATE UNIQUE INDEX statement terminated because a duplicate key was found for the "
+                           "object name '" +
+                               table.name + "' and the index name '" + index.name + "'.");
   }
 }
 
@@ -165,8 +167,9 @@ void createLogin(Handle& handle, const tsql::CreateLogin& login) {
 }
 
 [[noreturn]] void refuseDrop(const std::string& kind, const std::string& name) {
-  throw tsql::sqlFailure(3701, "Cannot drop the " + kind + " '" + name + "', because it does not exist or you do not have "
-                               "permission.");
+  throw tsql::sqlFailure(3701, "Cannot drop the " + kind + " '" + name +
+                                   "', because it does not exist or you do not have "
+                                   "permission.");
 }
 
 template <class Info>

@@ -36,7 +36,7 @@ std::string emitCase(const BoundExpression& expression) {
 }
 
 std::string emitSource(const BoundSource& source) {
-  std::string text = source.table              ? tableName(*source.table)
+  std::string text = source.table                 ? tableName(*source.table)
                      : source.commonTable.empty() ? "(" + emit(*source.derived) + ")"
                                                   : source.commonTable;
   text += " as " + source.alias;
@@ -71,11 +71,14 @@ std::string emitCore(const BoundCore& core) {
 
 std::string emitWith(const std::vector<BoundSelect::CommonTable>& with) {
   if (with.empty()) return "";
-  return "with recursive " + joined(with, ",", [](const BoundSelect::CommonTable& table) {
-           std::string columns;
-           for (std::size_t i = 0; i < table.columns; ++i) columns += (i ? ",c" : "c") + std::to_string(i);
-           return table.name + "(" + columns + ") as (" + emit(*table.select) + ")";
-         }) + " ";
+  return "with recursive " +
+         joined(with, ",",
+                [](const BoundSelect::CommonTable& table) {
+                  std::string columns;
+                  for (std::size_t i = 0; i < table.columns; ++i) columns += (i ? ",c" : "c") + std::to_string(i);
+                  return table.name + "(" + columns + ") as (" + emit(*table.select) + ")";
+                }) +
+         " ";
 }
 
 std::string emitOrder(const std::vector<BoundOrder>& orderBy) {
@@ -151,9 +154,10 @@ std::string emit(const BoundSelect& select) {
 }
 
 std::string emit(const BoundInsert& insert) {
-  std::string text = "insert into " + tableName(*insert.table) + "(" + joined(insert.columns, ",", [&](std::size_t column) {
-                       return quoteName(insert.table->columns[column].name);
-                     }) + ") ";
+  std::string text =
+      "insert into " + tableName(*insert.table) + "(" +
+      joined(insert.columns, ",", [&](std::size_t column) { return quoteName(insert.table->columns[column].name); }) +
+      ") ";
   if (insert.select) return text + emit(*insert.select);
   return text + "values " +
          joined(insert.rows, ",", [](const std::vector<BoundPtr>& row) { return "(" + expressions(row) + ")"; });

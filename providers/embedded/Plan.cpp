@@ -147,7 +147,8 @@ void PlanCache::add(const std::string& shape, const std::vector<tsql::Token>& to
   if (known.plans.empty()) {
     known.patterns = facts.patterns;
     forEachLiteral(tokens, [&](const tsql::Token& token) {
-      if (std::ranges::find(facts.parameters, token.literal) == facts.parameters.end()) known.values.push_back(token.literal);
+      if (std::ranges::find(facts.parameters, token.literal) == facts.parameters.end())
+        known.values.push_back(token.literal);
     });
   }
   known.plans[variant(known, tokens)] = std::move(plan);

@@ -47,8 +47,8 @@ struct Step {
   bool locks = false;                // xlock
   bool skips = false;                // readpast
   bool givesIdentity = false;
-  bool updatable = false;            // the row's key stands behind the last column
-  tsql::Statement control;           // of kind control: run as it is
+  bool updatable = false;   // the row's key stands behind the last column
+  tsql::Statement control;  // of kind control: run as it is
 };
 
 // What a batch of one shape runs, with the catalogue that it was bound against.

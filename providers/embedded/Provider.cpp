@@ -21,8 +21,9 @@ class EmbeddedProvider : public QVSa::Provider {
     if (!options.integrated) checkLogin(*handle, options.user, options.password);
     const auto database = databaseByName(options.database);
     if (!database)
-      throw tsql::sqlFailure(4060, "Cannot open database \"" + options.database + "\" requested by the login. The login "
-                                   "failed.");
+      throw tsql::sqlFailure(4060, "Cannot open database \"" + options.database +
+                                       "\" requested by the login. The login "
+                                       "failed.");
     const bool mayDefineLogins = options.integrated || sameName(options.user, administrator);
     return std::make_unique<EmbeddedSession>(std::move(handle), *database, mayDefineLogins);
   }

@@ -56,13 +56,13 @@ Variant EmbeddedRows::value(std::size_t ordinal) const {
 
 void EmbeddedRows::update(const std::vector<std::pair<std::size_t, Variant>>& changes) {
   if (!session_ || !step_.updatable)
-    throw Failure(number::of(0x800A0CB3), "QVSa",
+    throw Failure(number::readOnly, "QVSa",
                   "Current Recordset does not support updating. This may be a limitation of the provider, or of the "
                   "selected locktype.");
   std::vector<std::pair<std::size_t, Value>> values;
   for (const auto& [ordinal, variant] : changes) {
     const auto column = step_.results.at(ordinal).tableColumn;
-    if (!column) throw Failure(number::of(0x800A0CB3), "QVSa", "A computed column cannot be written back.");
+    if (!column) throw Failure(number::readOnly, "QVSa", "A computed column cannot be written back.");
     Value value = valueOf(variant, step_.table->columns[*column].type);
     current_[ordinal] = value;
     values.emplace_back(*column, std::move(value));

@@ -11,8 +11,8 @@ namespace QVSa::embedded {
 
 class EmbeddedSession;
 
-// A row set of the engine. It streams from its statement until the session needs the handle for a write, and then goes on
-// from memory.
+// A row set of the engine. It streams from its statement until the session needs the handle for a write, and then goes
+// on from memory.
 class EmbeddedRows : public Rows {
  public:
   EmbeddedRows(EmbeddedSession& session, std::shared_ptr<Plan> plan, Step& step, Prepared statement);

@@ -53,9 +53,26 @@ std::shared_ptr<const ValueList> listValue(const Parameter& parameter, const tsq
   return values;
 }
 
+// The time that one run may take. Fetching rows afterwards, and ending a transaction, have no limit.
+class TimeLimit {
+ public:
+  TimeLimit(Handle& handle, std::chrono::seconds limit) : handle_(handle) {
+    if (limit.count() > 0) handle_.deadline(std::chrono::steady_clock::now() + limit);
+  }
+  ~TimeLimit() { handle_.deadline(std::nullopt); }
+  TimeLimit(const TimeLimit&) = delete;
+  TimeLimit& operator=(const TimeLimit&) = delete;
+
+ private:
+  Handle& handle_;
+};
+
+constexpr std::chrono::seconds rowWriteLimit{30};
+
 Failure deadlock() {
-  return tsql::sqlFailure(1205, "Transaction was deadlocked on lock resources with another process and has been chosen as "
-                                "the deadlock victim. Rerun the transaction.");
+  return tsql::sqlFailure(1205,
+                          "Transaction was deadlocked on lock resources with another process and has been chosen as "
+                          "the deadlock victim. Rerun the transaction.");
 }
 
 }  // namespace
@@ -85,10 +102,7 @@ void EmbeddedSession::refreshCatalogue() {
 
 BatchResult EmbeddedSession::run(const Batch& batch) {
   handle_->requireOwnProcess();
-  if (batch.timeout.count() > 0)
-    handle_->deadline(std::chrono::steady_clock::now() + batch.timeout);
-  else
-    handle_->deadline(std::nullopt);
+  const TimeLimit limit(*handle_, batch.timeout);
   auto tokens = tsql::tokenize(batch.text);
   BatchResult result;
   if (const auto plan = planFor(batch, tokens)) {
@@ -254,11 +268,13 @@ Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) 
 
 void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
                                const std::vector<std::pair<std::size_t, Value>>& values) {
+  const TimeLimit limit(*handle_, rowWriteLimit);
   prepareWrite(table.database);
   std::string text;
-  for (const auto& [column, value] : values) text += (text.empty() ? "" : ",") + quoteName(table.columns[column].name) + "=?";
-  Prepared statement(handle_->get(), std::string("update ") + databaseNames[table.database] + "." + quoteName(table.name) +
-                                         " set " + text + " where rowid=?");
+  for (const auto& [column, value] : values)
+    text += (text.empty() ? "" : ",") + quoteName(table.columns[column].name) + "=?";
+  Prepared statement(handle_->get(), std::string("update ") + databaseNames[table.database] + "." +
+                                         quoteName(table.name) + " set " + text + " where rowid=?");
   int place = 0;
   for (const auto& [column, value] : values) statement.bind(++place, value);
   statement.bind(++place, key);
@@ -275,8 +291,9 @@ void EmbeddedSession::control(const tsql::Statement& statement) {
   if (const auto* use = std::get_if<tsql::Use>(&statement)) {
     const auto database = databaseByName(use->database);
     if (!database)
-      throw tsql::sqlFailure(911, "Database '" + use->database + "' does not exist. Make sure that the name is entered "
-                                  "correctly.");
+      throw tsql::sqlFailure(911, "Database '" + use->database +
+                                      "' does not exist. Make sure that the name is entered "
+                                      "correctly.");
     database_ = *database;
     return;
   }
@@ -291,8 +308,9 @@ void EmbeddedSession::setOption(const tsql::SetOption& option) {
   const Object object = cache_->catalogue->find(*option.table, database_);
   const auto* table = std::get_if<const TableInfo*>(&object);
   if (!table || !(*table)->identity)
-    throw tsql::sqlFailure(8106, "Table '" + option.table->name + "' does not have the identity property. Cannot perform "
-                                 "SET operation.");
+    throw tsql::sqlFailure(8106, "Table '" + option.table->name +
+                                     "' does not have the identity property. Cannot perform "
+                                     "SET operation.");
   identityInsert_ = option.on ? tableKey(**table) : std::pair<std::size_t, std::string>();
 }
 
@@ -327,8 +345,9 @@ void EmbeddedSession::commit() {
   // A failed statement for want of room ends the storage library's transaction by itself.
   if (started_ && !handle_->inTransaction()) {
     endTransaction();
-    throw tsql::sqlFailure(3930, "The current transaction cannot be committed and cannot support operations that write to "
-                                 "the log file. Roll back the transaction.");
+    throw tsql::sqlFailure(3930,
+                           "The current transaction cannot be committed and cannot support operations that write to "
+                           "the log file. Roll back the transaction.");
   }
   if (started_) handle_->execute("commit");
   started_ = false;
@@ -336,7 +355,8 @@ void EmbeddedSession::commit() {
 }
 
 void EmbeddedSession::rollback() {
-  if (!marked_) throw tsql::sqlFailure(3903, "The ROLLBACK TRANSACTION request has no corresponding BEGIN TRANSACTION.");
+  if (!marked_)
+    throw tsql::sqlFailure(3903, "The ROLLBACK TRANSACTION request has no corresponding BEGIN TRANSACTION.");
   for (auto* rows : rows_) rows->buffer();
   if (handle_->inTransaction()) handle_->execute("rollback");
   endTransaction();

@@ -14,8 +14,8 @@ class EmbeddedRows;
 // A session of the engine: one handle, its current database, its transaction.
 //
 // Isolation is read committed. `begin` only marks: the storage library's transaction starts with the first write, after
-// open row sets were read into memory and the writer's place was taken, so that what a statement reads is newer than its
-// wait. A read before that would end the transaction in a failure that no retry mends.
+// open row sets were read into memory and the writer's place was taken, so that what a statement reads is newer than
+// its wait. A read before that would end the transaction in a failure that no retry mends.
 class EmbeddedSession : public ProviderSession {
  public:
   EmbeddedSession(PooledHandle handle, std::size_t database, bool administrator);
@@ -40,7 +40,8 @@ class EmbeddedSession : public ProviderSession {
   // A batch that changes names on its way is bound statement by statement, as it runs.
   BatchResult runUncached(std::vector<tsql::Statement> statements, const Batch& batch,
                           const std::vector<tsql::Token>& tokens);
-  void runStep(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens, BatchResult& result);
+  void runStep(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens,
+               BatchResult& result);
   std::unique_ptr<Rows> query(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens);
   Long write(Step& step, const std::vector<tsql::Token>& tokens);
   void control(const tsql::Statement& statement);
@@ -61,9 +62,9 @@ class EmbeddedSession : public ProviderSession {
   std::shared_ptr<Cache> cache_;
   std::size_t database_;
   bool administrator_;
-  bool marked_ = false;                // begin was called
-  bool started_ = false;               // the storage library's transaction is open
-  std::set<std::size_t> writing_;      // databases whose writer's place is taken
+  bool marked_ = false;            // begin was called
+  bool started_ = false;           // the storage library's transaction is open
+  std::set<std::size_t> writing_;  // databases whose writer's place is taken
   std::vector<EmbeddedRows*> rows_;
   std::pair<std::size_t, std::string> identityInsert_;  // the table that takes identity values as they are given
 };

@@ -88,7 +88,8 @@ void Writer::write(const TableSource& source) {
 }
 
 void Writer::writeJoin(const TableSource& source) {
-  static constexpr const char* kWords[] = {" join ", " left join ", " right join ", " full join ", " cross join ", " cross join "};
+  static constexpr const char* kWords[] = {" join ",      " left join ",  " right join ",
+                                           " full join ", " cross join ", " cross join "};
   const bool isOpen = source.right->kind == TableSource::Kind::join;
   write(*source.left);
   add(kWords[static_cast<std::size_t>(source.join)]);

@@ -4,7 +4,8 @@
 
 namespace QVSa::tsql {
 
-// A statement failure by SQL Server's number: the number that callers see follows from it. `description` is the whole text.
+// A statement failure by SQL Server's number: the number that callers see follows from it. `description` is the whole
+// text.
 Failure sqlFailure(Long native, const String& description);
 
 // The failure number for SQL Server's own: integrity for 2627, 2601 and 515, no table for 208, and so on; `statement`

@@ -49,7 +49,8 @@ struct Expression {
     star,        // * or qualifier.*; in a select list, in count(*) and in exists
     unary,       // `op` -, + or ~ on operands[0]
     binary,      // `op` + - * / % & | ^ on two operands
-    comparison,  // `op` = <> < <= > >= and the old joins *= and =* on two operands; != is read as <>, !< as >=, !> as <=
+    comparison,  // `op` = <> < <= > >= and the old joins *= and =* on two operands; != is read as <>, !< as >=, !> as
+                 // <=
     logical,     // `op` and, or on two operands
     negation,    // not operands[0]
     isNull,      // operands[0] is [not] null
@@ -97,9 +98,9 @@ struct TableSource {
   Kind kind = Kind::table;
   ObjectName table;
   std::optional<String> alias;
-  std::vector<String> hints;         // lower case: rowlock, xlock, readpast, ...
+  std::vector<String> hints;  // lower case: rowlock, xlock, readpast, ...
   SelectPtr derived;
-  std::vector<String> columnNames;   // of a derived table: as x(a, b)
+  std::vector<String> columnNames;  // of a derived table: as x(a, b)
   Join join = Join::inner;
   std::unique_ptr<TableSource> left;
   std::unique_ptr<TableSource> right;
@@ -149,7 +150,7 @@ struct Assignment {
 
 struct Insert {
   ObjectName table;
-  std::vector<String> columns;                    // empty: all but the identity column
+  std::vector<String> columns;                     // empty: all but the identity column
   std::vector<std::vector<ExpressionPtr>> values;  // rows; or
   SelectPtr select;
 };

@@ -1,10 +1,9 @@
 // Runs the data-driven cases: recorded ones of another T-SQL server, and the project's own.
 
-#include <gtest/gtest.h>
-
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
+#include <gtest/gtest.h>
 #include <sstream>
 
 #include "QVSa/frame/ConnectionString.h"
@@ -126,8 +125,6 @@ TEST(TheEngine, AnswersAsTheRecordedServerDid) {
   runFolder(recorded);
 }
 
-TEST(TheEngine, AnswersTheProjectsOwnCases) {
-  runFolder(std::filesystem::path(QVSA_SOURCE_DIR) / "tests" / "tsql");
-}
+TEST(TheEngine, AnswersTheProjectsOwnCases) { runFolder(std::filesystem::path(QVSA_SOURCE_DIR) / "tests" / "tsql"); }
 
 }  // namespace QVSa::test

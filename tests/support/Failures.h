@@ -6,15 +6,20 @@
 
 namespace QVSa::test {
 
-// The number of the failure that `body` throws; 0 where it throws none.
+// The failure that `body` throws; its number is 0 where it throws none.
 template <class Body>
-Long failureOf(Body body) {
+Failure thrownBy(Body body) {
   try {
     body();
-    return 0;
   } catch (const Failure& failure) {
-    return failure.number();
+    return failure;
   }
+  return Failure(0, "", "");
+}
+
+template <class Body>
+Long failureOf(Body body) {
+  return thrownBy(body).number();
 }
 
 }  // namespace QVSa::test

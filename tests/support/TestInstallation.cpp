@@ -1,8 +1,7 @@
 #include "tests/support/TestInstallation.h"
 
-#include <unistd.h>
-
 #include <stdexcept>
+#include <unistd.h>
 
 #include "QVSa/frame/ConnectionString.h"
 #include "database/Scripts.h"
@@ -66,7 +65,8 @@ TestInstallation::~TestInstallation() {
 }
 
 std::string TestInstallation::administratorString(const std::string& database) const {
-  return "provider=sqloledb;data source=" + server() + ";database=" + database + ";uid=sa;pwd=" + administratorPassword + ";";
+  return "provider=sqloledb;data source=" + server() + ";database=" + database +
+         ";uid=sa;pwd=" + administratorPassword + ";";
 }
 
 }  // namespace QVSa::test

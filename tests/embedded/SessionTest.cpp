@@ -1,0 +1,144 @@
+#include <gtest/gtest.h>
+#include <thread>
+
+#include "QVSa/frame/ConnectionString.h"
+#include "providers/embedded/Provider.h"
+#include "tests/support/Failures.h"
+#include "tests/support/TestInstallation.h"
+
+namespace QVSa::test {
+
+namespace {
+
+// Two sessions on one small table.
+class Sessions : public testing::Test {
+ protected:
+  Sessions() {
+    first_->run(
+        {"create table t (id int identity primary key, no nvarchar(20) not null unique, n int null, x image null)"});
+    first_->run({"insert into t(no,n) values ('a',1), ('b',2), ('c',3)"});
+  }
+
+  std::unique_ptr<ProviderSession> open() {
+    return embedded::provider().open(parseConnectionString(buildConnString(installation_.server(), "QVSys", false)));
+  }
+
+  static std::string all(ProviderSession& session, const std::string& text) {
+    const auto result = session.run({text});
+    return rest(*result.rows);
+  }
+
+  static std::string rest(Rows& rows) {
+    std::string found;
+    while (rows.next())
+      found += (found.empty() ? "" : " ") + (rows.value(0).isNull() ? "NULL" : rows.value(0).toText());
+    return found;
+  }
+
+  static Long numberOf(ProviderSession& session, const std::string& text, int seconds = 1) {
+    return failureOf([&] { session.run({text, false, std::chrono::seconds(seconds)}); });
+  }
+
+  TestInstallation installation_{TestInstallation::Content::empty};
+  std::unique_ptr<ProviderSession> first_ = open();
+  std::unique_ptr<ProviderSession> second_ = open();
+};
+
+const std::string claim = "select n from t with (rowlock xlock readpast) where no='a'";
+
+}  // namespace
+
+TEST_F(Sessions, ARowSetGoesOnFromMemoryWhenItsSessionWrites) {
+  const auto result = first_->run({"select no from t order by no"});
+  ASSERT_TRUE(result.rows->next());
+  first_->run({"delete from t"});
+  EXPECT_EQ(rest(*result.rows), "b c");
+  EXPECT_EQ(all(*first_, "select count(*) from t"), "0");
+}
+
+TEST_F(Sessions, ATransactionReadsWhatOthersHaveCommittedAndOthersSeeItsWorkAtItsEnd) {
+  first_->begin();
+  EXPECT_EQ(all(*first_, "select n from t where no='a'"), "1");
+  second_->run({"update t set n=5 where no='a'"});
+  EXPECT_EQ(all(*first_, "select n from t where no='a'"), "5");
+  first_->run({"update t set n=n+1 where no='a'"});
+  EXPECT_EQ(all(*second_, "select n from t where no='a'"), "5");
+  first_->commit();
+  EXPECT_EQ(all(*second_, "select n from t where no='a'"), "6");
+}
+
+TEST_F(Sessions, AFailedStatementLeavesTheTransactionAndASessionThatEndsTakesItBack) {
+  first_->begin();
+  first_->run({"insert into t(no) values ('d')"});
+  EXPECT_EQ(numberOf(*first_, "insert into t(no) select 'e' union all select 'A'"), number::integrity);
+  EXPECT_EQ(all(*first_, "select count(*) from t"), "4");
+  first_.reset();
+  EXPECT_EQ(all(*second_, "select count(*) from t"), "3");
+}
+
+TEST_F(Sessions, AClaimedRowIsPassedOverWaitedForOrRefused) {
+  first_->begin();
+  EXPECT_EQ(all(*first_, claim), "1");
+  EXPECT_EQ(all(*second_, claim), "");
+  EXPECT_EQ(numberOf(*second_, "select n from t with (xlock) where no='a'"), number::timeout);
+  EXPECT_EQ(numberOf(*second_, "update t set n=0 where no='a'"), number::timeout);
+  second_->run({"update t set n=0 where no='b'"});
+
+  // Who has the writer's place and would wait for a row is refused at once: the row's holder waits for that place.
+  second_->begin();
+  second_->run({"update t set n=9 where no='c'"});
+  EXPECT_EQ(thrownBy([&] { second_->run({"update t set n=0 where no='a'"}); }).native(), 1205);
+  second_->rollback();
+
+  first_->commit();
+  EXPECT_EQ(all(*second_, "select n from t with (xlock) where no='a'"), "1");
+  EXPECT_EQ(all(*second_, "select n from t order by no"), "1 0 3");
+}
+
+TEST_F(Sessions, AWaitingWriteSeesWhatItWaitedFor) {
+  first_->begin();
+  EXPECT_EQ(all(*first_, claim), "1");
+  std::thread other([&] { second_->run({"update t set n=n*10 where no='a'"}); });
+  std::this_thread::sleep_for(std::chrono::milliseconds(100));
+  first_->run({"update t set n=7 where no='a'"});
+  first_->commit();
+  other.join();
+  EXPECT_EQ(all(*first_, "select n from t where no='a'"), "70");
+}
+
+TEST_F(Sessions, ALimitEndsARunningStatementAndNotAFetch) {
+  const std::string large = "select a.n from t a,t b,t c,t d,t e,t f,t g,t h,t i,t j,t k,t l,t m,t o,t p,t q,t r";
+  EXPECT_EQ(numberOf(*first_, "select count(*) from (" + large + ") as x"), number::timeout);
+  const auto result = first_->run({large, false, std::chrono::seconds(1)});
+  std::this_thread::sleep_for(std::chrono::milliseconds(1100));
+  for (int i = 0; i < 10000; ++i) ASSERT_TRUE(result.rows->next());
+}
+
+TEST_F(Sessions, WhatAnotherSessionDefinesIsKnownAtOnce) {
+  EXPECT_EQ(numberOf(*second_, "select a from later"), number::noTable);
+  first_->run({"create table later (a int)\ninsert into later values (4)"});
+  EXPECT_EQ(all(*second_, "select a from later"), "4");
+  first_->begin();
+  first_->run({"create table never (a int)"});
+  first_->rollback();
+  EXPECT_EQ(numberOf(*first_, "select a from never"), number::noTable);
+  first_->run({"create table never (b int)"});
+  EXPECT_EQ(all(*first_, "select count(b) from never"), "0");
+}
+
+TEST_F(Sessions, RowsAreWrittenBackByTheirKeyAndComputedColumnsAreNot) {
+  const auto result = first_->run({"select no,n,x,n+1 from t where n<3 order by no", true});
+  ASSERT_TRUE(result.rows->next());
+  const Bytes picture(300000, 0xFF);
+  result.rows->update({{1, Variant(Long(41))}, {2, Variant(picture)}});
+  EXPECT_EQ(failureOf([&] { result.rows->update({{3, Variant(Long(1))}}); }), number::readOnly);
+  EXPECT_EQ(failureOf([&] { result.rows->update({{0, Variant("b")}}); }), number::integrity);
+  // The row set has the rows that it was opened with.
+  ASSERT_TRUE(result.rows->next());
+  EXPECT_EQ(result.rows->value(0).toText(), "b");
+  const auto stored = second_->run({"select x from t where n=41"});
+  ASSERT_TRUE(stored.rows->next());
+  EXPECT_EQ(stored.rows->value(0).toBytes(), picture);
+}
+
+}  // namespace QVSa::test
