@@ -2,8 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Connection.h"
-#include "QVSa/frame/ConnectionString.h"
+#include "tests/support/PlainSession.h"
 #include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {
@@ -11,31 +10,14 @@ namespace QVSa::test {
 // The databases as they are shipped, spoken to in statements.
 class Shipped : public testing::Test {
  protected:
-  Connection open(const String& database = "QVSys") {
-    Connection connection;
-    connection.Open(buildConnString(installation_.server(), database, false));
-    return connection;
-  }
+  void run(const String& batch, const String& database = "QVSys") { session(database).run(batch); }
 
-  void run(const String& batch, const String& database = "QVSys") { open(database).Execute(batch); }
-
-  // The rows of a query, a "|" between the values and "-" for NULL.
-  std::vector<String> rows(const String& query, const String& database = "QVSys") {
-    Connection connection = open(database);
-    Recordset set = connection.Execute(query);
-    std::vector<String> result;
-    for (const auto& row : set.GetRows()) {
-      String line;
-      for (const Variant& value : row) line += (&value == &row[0] ? "" : "|") + (value.isNull() ? "-" : value.toText());
-      result.push_back(line);
-    }
-    return result;
-  }
+  Lines rows(const String& query, const String& database = "QVSys") { return session(database).rows(query); }
 
  private:
+  PlainSession session(const String& database) const { return PlainSession(installation_.server(), database); }
+
   TestInstallation installation_;
 };
-
-using Lines = std::vector<String>;
 
 }  // namespace QVSa::test

@@ -1,0 +1,152 @@
+#include <algorithm>
+#include <gtest/gtest.h>
+
+#include "providers/embedded/Pool.h"
+#include "tests/faults/Operations.h"
+#include "tests/support/FakeClock.h"
+#include "tests/support/PlainSession.h"
+#include "tests/support/RecordingProvider.h"
+#include "tests/support/TestInstallation.h"
+
+namespace QVSa::test {
+
+void PrintTo(const Operation& operation, std::ostream* out) { *out << operation.name; }
+
+namespace {
+
+const Failure madeUp(number::of(0x80041234), "a test", "This failure is made up.");
+
+// A filled installation of its own for each attempt, all copies of one.
+class Ground {
+ public:
+  Ground() { std::filesystem::copy(filled(), folder_.path()); }
+
+  String server() const { return "file:" + folder_.path().string(); }
+
+  // All that the operations write.
+  Lines tables() const {
+    const PlainSession session(server());
+    Lines result;
+    for (const char* table : {"users", "userPwdHis", "userJob", "GrpUser", "agentuser", "saferule", "seslog",
+                              "departments", "jobs", "idRule", "idRec", "idDel", "QVSys..idRec"})
+      result.push_back(session.text(String("select * from ") + table));
+    return result;
+  }
+
+ private:
+  static const std::filesystem::path& filled() {
+    static const TestInstallation installation;
+    static const bool done = [] {
+      fillGround(installation.server());
+      // Closes the files, which brings all of the content into them.
+      embedded::discardIdleHandle(installation.folder());
+      return true;
+    }();
+    static_cast<void>(done);
+    return installation.folder();
+  }
+
+  TestFolder folder_;
+};
+
+bool beginsWith(const String& text, const String& beginning) { return text.rfind(beginning, 0) == 0; }
+
+bool isStatement(const String& event) {
+  return !beginsWith(event, "open ") && event != "set nocount on" && event != "begin" && event != "commit" &&
+         event != "rollback" && event != "close";
+}
+
+bool isWrite(const String& event) {
+  return isStatement(event) && !beginsWith(event, "select ") && !beginsWith(event, "use ");
+}
+
+Lines eventsOf(const RecordingProvider& recorder) {
+  Lines events = recorder.log();
+  std::erase_if(events, [](const String& event) { return event == "rollback" || event == "close"; });
+  return events;
+}
+
+// The statement that an event belongs to: a commit to the one before it, an opening or a beginning to the next one.
+String statementAt(const Lines& events, std::size_t place) {
+  const auto at = events.begin() + static_cast<std::ptrdiff_t>(place);
+  if (*at == "commit") return *std::find_if(std::make_reverse_iterator(at), events.rend(), isStatement);
+  return *std::find_if(at, events.end(), isStatement);
+}
+
+const LetPass* passing(const Operation& operation, const String& statement) {
+  const auto found = std::ranges::find_if(letPass(), [&](const LetPass& point) {
+    return String(point.operation) == operation.name && beginsWith(statement, point.statement);
+  });
+  return found == letPass().end() ? nullptr : &*found;
+}
+
+void expectReported(const Operation& operation, const String& statement, const Outcome& outcome) {
+  if (const LetPass* const point = passing(operation, statement)) {
+    EXPECT_TRUE(outcome.positive) << point->reason;
+    EXPECT_EQ(outcome.errNumber == madeUp.number(), point->reported);
+    return;
+  }
+  const auto report = std::ranges::find_if(
+      operation.reports, [&](const Report& candidate) { return beginsWith(statement, candidate.statement); });
+  const bool told = report != operation.reports.end();
+  const bool silent = told && report->silent;
+  EXPECT_FALSE(outcome.positive);
+  EXPECT_EQ(outcome.errNumber, silent ? 0 : madeUp.number());
+  EXPECT_EQ(outcome.errDescription, silent ? "" : (told ? report->prefix : "") + madeUp.description());
+}
+
+class EveryOperation : public testing::TestWithParam<Operation> {
+ protected:
+  // The events of an undisturbed call.
+  Lines undisturbed() {
+    const Ground ground;
+    const auto call = GetParam().prepare(ground.server());
+    const RecordingProvider recorder;
+    const Outcome outcome = call();
+    EXPECT_TRUE(outcome.positive) << outcome.errDescription;
+    EXPECT_EQ(recorder.openSessions(), 0);
+    return eventsOf(recorder);
+  }
+
+  void failAt(const Lines& events, std::size_t place) {
+    const Operation& operation = GetParam();
+    const Ground ground;
+    const auto call = operation.prepare(ground.server());
+    const Lines before = ground.tables();
+    {
+      RecordingProvider recorder;
+      recorder.failAt(static_cast<int>(place) + 1, madeUp);
+      const Outcome outcome = call();
+      ASSERT_TRUE(recorder.hasFailed());
+      EXPECT_EQ(recorder.openSessions(), 0);
+      expectReported(operation, statementAt(events, place), outcome);
+    }
+    const auto end = events.begin() + static_cast<std::ptrdiff_t>(place);
+    const bool mayHaveWritten =
+        operation.atomic ? std::find(events.begin(), end, "commit") != end : std::any_of(events.begin(), end, isWrite);
+    if (mayHaveWritten || passing(operation, statementAt(events, place))) return;
+    EXPECT_EQ(ground.tables(), before);
+    const Outcome again = operation.prepare(ground.server())();
+    EXPECT_TRUE(again.positive) << "nothing stands in the way of a second try: " << again.errDescription;
+  }
+
+  FakeClock clock_{Date(2024, 3, 7, 10, 0, 0)};
+};
+
+TEST_P(EveryOperation, ReportsTheFailureOfEachStepAndLeavesNothingHalfDone) {
+  const Lines events = undisturbed();
+  ASSERT_FALSE(events.empty());
+  for (std::size_t place = 0; place < events.size() && !HasFatalFailure(); ++place) {
+    SCOPED_TRACE("event " + std::to_string(place + 1) + ": " + events[place]);
+    failAt(events, place);
+  }
+}
+
+INSTANTIATE_TEST_SUITE_P(Faults, EveryOperation, testing::ValuesIn(operations()), [](const auto& operation) {
+  String name;
+  for (const char* c = operation.param.name; *c != '\0'; ++c) name += std::isalnum(*c) != 0 ? *c : '_';
+  return name;
+});
+
+}  // namespace
+}  // namespace QVSa::test

@@ -1,0 +1,47 @@
+#pragma once
+
+#include <functional>
+#include <vector>
+
+#include "QVSa/frame/Values.h"
+
+namespace QVSa::test {
+
+struct Outcome {
+  bool positive;
+  Long errNumber;
+  String errDescription;
+};
+
+// How a failure is told that comes with a statement of this beginning.
+struct Report {
+  String statement;
+  String prefix;
+  bool silent = false;
+};
+
+struct Operation {
+  const char* name;
+  // Makes the object and loads what the operation needs; the result is the operation itself.
+  std::function<std::function<Outcome()>(const String& server)> prepare;
+  // The first that fits holds; without one the failure is told as it is.
+  std::vector<Report> reports;
+  // Whether it writes in one transaction: up to the commit nothing may have changed.
+  bool atomic;
+};
+
+// What the library lets pass.
+struct LetPass {
+  const char* operation;
+  const char* statement;
+  bool reported;  // in errNumber, in spite of the positive result
+  const char* reason;
+};
+
+// Makes what the operations work on, in an installation as it is shipped.
+void fillGround(const String& server);
+
+const std::vector<Operation>& operations();
+const std::vector<LetPass>& letPass();
+
+}  // namespace QVSa::test

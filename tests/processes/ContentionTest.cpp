@@ -1,0 +1,135 @@
+#include <algorithm>
+#include <chrono>
+#include <random>
+#include <set>
+#include <thread>
+
+#include "tests/processes/Worker.h"
+#include "tests/support/Scene.h"
+
+namespace QVSa::test {
+namespace {
+
+class Contention : public Scene {
+ protected:
+  void addRule(const String& name, Integer style = yyyymmdd) {
+    auto rule = connected<IdMgr>();
+    rule.idName(name);
+    rule.DateFormat(style);
+    rule.numPlace(5);
+    ASSERT_TRUE(rule.Save()) << rule.errDescription();
+  }
+  std::vector<Worker> start(int count, const std::string& work, std::vector<std::string> arguments) {
+    arguments.insert(arguments.begin(), server());
+    std::vector<Worker> workers;
+    for (int i = 0; i < count; ++i) workers.emplace_back(work, arguments);
+    return workers;
+  }
+  static void go(std::vector<Worker>& workers) {
+    for (Worker& worker : workers) worker.go();
+  }
+  // The numbers from 1 on, as a rule without prefix issues them on the day of the scene.
+  static std::set<String> numbersUpTo(Long last) {
+    std::set<String> result;
+    for (Long number = 1; number <= last; ++number)
+      result.insert("20240307" + std::to_string(100000 + number).substr(1));
+    return result;
+  }
+};
+
+TEST_F(Contention, AThousandWrongPasswordsFromEightProcessesAreAllCounted) {
+  addUser("ann");
+  savePolicy([](safeRule& rule) {
+    rule.lockErr(true);
+    rule.errTimes(3);
+  });
+  auto workers = start(8, "wrong-passwords", {"125"});
+  go(workers);
+  for (Worker& worker : workers) EXPECT_EQ(worker.lines(), Lines{"done"});
+  EXPECT_EQ(tables_.text("select lgts,accstate from users where userLogin='ann'"), "1000|1");
+
+  auto ann = connected<User>();
+  EXPECT_FALSE(ann.loginAuth("ann", "right"));
+  EXPECT_EQ(ann.errDescription(), "The account has been locked.");
+  EXPECT_EQ(tables_.text("select lgts,accstate from users where userLogin='ann'"), "0|1");
+}
+
+TEST_F(Contention, NoNumberIsIssuedTwiceAndNoneIsLost) {
+  for (const char* name : {"inv", "own1", "own2"}) addRule(name);
+  auto workers = start(8, "issue", {"inv", "100"});
+  auto first = start(1, "issue", {"own1", "150"});
+  auto second = start(1, "issue", {"own2", "150"});
+  for (auto* group : {&workers, &first, &second}) go(*group);
+
+  std::set<String> issued;
+  for (Worker& worker : workers) {
+    const Lines lines = worker.lines();
+    ASSERT_EQ(lines.size(), 101U) << lines.back();
+    for (std::size_t i = 0; i < 100; ++i) EXPECT_TRUE(issued.insert(lines[i]).second) << lines[i] << " twice";
+  }
+  EXPECT_EQ(issued, numbersUpTo(800));
+  for (auto* group : {&first, &second}) {
+    Lines lines = group->front().lines();
+    EXPECT_EQ(lines.back(), "collisions 0") << "who works on another rule sees nothing of it";
+    lines.pop_back();
+    EXPECT_EQ(std::set<String>(lines.begin(), lines.end()), numbersUpTo(150));
+  }
+}
+
+TEST_F(Contention, KilledProcessesLeaveNoLockAndTakeNoMoreThanTheNumberInTheirHands) {
+  constexpr int rounds = 8, each = 4;
+  addRule("inv");
+  std::mt19937 random(20240307);
+  std::uniform_int_distribution<int> moment(0, 30000);
+  std::set<String> issued;
+  String last;
+  for (int round = 0; round < rounds; ++round) {
+    auto workers = start(each, "issue", {"inv", "1000000"});
+    go(workers);
+    for (Worker& worker : workers) {
+      const String number = worker.line();
+      EXPECT_TRUE(issued.insert(number).second) << number;
+    }
+    for (Worker& worker : workers) {
+      std::this_thread::sleep_for(std::chrono::microseconds(moment(random)));
+      worker.kill();
+    }
+    for (Worker& worker : workers)
+      for (const String& number : worker.lines()) EXPECT_TRUE(issued.insert(number).second) << number;
+    auto survivor = connected<IdMgr>();
+    last = survivor.newId("inv");
+    EXPECT_TRUE(issued.insert(last).second) << last << survivor.errDescription();
+  }
+  ASSERT_EQ(last.size(), 13U) << last;
+  EXPECT_EQ(*issued.rbegin(), last);
+  EXPECT_EQ(tables_.text("select maxId from idRec where idName='inv'"), last);
+  const std::set<String> all = numbersUpTo(std::stoi(last.substr(8)));
+  EXPECT_TRUE(std::ranges::includes(all, issued));
+  EXPECT_LE(all.size() - issued.size(), static_cast<std::size_t>(rounds * each));
+}
+
+TEST_F(Contention, WhoHoldsARowIsNotWaitedForAndItsDeathFreesTheRow) {
+  addRule("inv");
+  addRule("other");
+  auto rule = connected<IdMgr>();
+  EXPECT_EQ(rule.newId("inv"), "2024030700001");
+  auto holder = start(1, "hold", {"inv"});
+  go(holder);
+  ASSERT_EQ(holder.front().line(), "holding");
+  const auto before = std::chrono::steady_clock::now();
+  EXPECT_EQ(rule.newId("inv"), "");
+  EXPECT_EQ(rule.errNumber(), number::integrity);
+  EXPECT_LT(std::chrono::steady_clock::now() - before, std::chrono::seconds(10)) << "a third of the time-out";
+  EXPECT_EQ(rule.newId("other"), "2024030700001");
+  holder.front().kill();
+  EXPECT_EQ(rule.newId("inv"), "2024030700002") << rule.errDescription();
+
+  auto writer = start(1, "hold", {"inv", "written"});
+  go(writer);
+  ASSERT_EQ(writer.front().line(), "holding");
+  writer.front().kill();
+  EXPECT_EQ(rule.newId("inv"), "2024030700003") << rule.errDescription();
+}
+
+}  // namespace
+}  // namespace QVSa::test

@@ -1,0 +1,92 @@
+#include "tests/processes/Work.h"
+
+#include <iostream>
+#include <unistd.h>
+
+#include "QVSa/QVSa.h"
+#include "QVSa/frame/ConnectionString.h"
+#include "tests/support/FakeClock.h"
+
+namespace QVSa::test {
+
+namespace {
+
+using Words = std::vector<std::string>;
+
+void writeLine(const std::string& text) { std::cout << text + '\n' << std::flush; }
+
+std::string failureText(Long errNumber, const String& errDescription) {
+  std::ostringstream text;
+  text << std::hex << static_cast<std::uint32_t>(errNumber) << ' ' << errDescription;
+  return text.str();
+}
+
+void wrongPasswords(const Words& words) {
+  for (int left = std::stoi(words.at(1)); left > 0; --left) {
+    User ann;
+    ann.connect(words.at(0), "QVApp");
+    const bool refused = !ann.loginAuth("ann", "wrong") &&
+                         (ann.errNumber() == messageNumber(1106) || ann.errNumber() == messageNumber(1118));
+    if (!refused) writeLine(failureText(ann.errNumber(), ann.errDescription()));
+  }
+  writeLine("done");
+}
+
+bool isCollision(const IdMgr& rule) {
+  return rule.errNumber() == number::integrity &&
+         rule.errDescription().rfind("Error in creating new table ID.", 0) == 0;
+}
+
+void issue(const Words& words) {
+  int collisions = 0;
+  for (int left = std::stoi(words.at(2)); left > 0;) {
+    IdMgr rule;
+    rule.connect(words.at(0), "QVApp");
+    const String number = rule.newId(words.at(1));
+    if (!number.empty()) {
+      writeLine(number);
+      --left;
+    } else if (isCollision(rule)) {
+      ++collisions;
+    } else {
+      writeLine(failureText(rule.errNumber(), rule.errDescription()));
+      return;
+    }
+  }
+  writeLine("collisions " + std::to_string(collisions));
+}
+
+void hold(const Words& words) {
+  Connection connection;
+  connection.Open(buildConnString(words.at(0), "QVApp", false));
+  connection.BeginTrans();
+  connection.Execute("select maxId=max(maxId) from idRec with (rowlock xlock readpast) where idName='" + words.at(1) +
+                     "'");
+  if (words.size() > 2) connection.Execute("update idRec set maxId='half' where idName='" + words.at(1) + "'");
+  writeLine("holding");
+  ::pause();
+}
+
+void loadAsNobody(const Words& words) {
+  constexpr uid_t nobody = 65534;
+  if (::setgid(nobody) != 0 || ::setuid(nobody) != 0) return;
+  User user;
+  user.connect(words.at(0));
+  user.GetOne(3, "Admin");
+  writeLine(failureText(user.errNumber(), user.errDescription()));
+}
+
+}  // namespace
+
+int doWork(const Words& words) {
+  const FakeClock clock(Date(2024, 3, 7, 10, 0, 0));
+  std::cin.get();
+  const Words arguments(words.begin() + 1, words.end());
+  if (words.at(0) == "wrong-passwords") wrongPasswords(arguments);
+  if (words.at(0) == "issue") issue(arguments);
+  if (words.at(0) == "hold") hold(arguments);
+  if (words.at(0) == "load-as-nobody") loadAsNobody(arguments);
+  return 0;
+}
+
+}  // namespace QVSa::test

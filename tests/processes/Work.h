@@ -1,0 +1,20 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+namespace QVSa::test {
+
+// What a worker does. All begin when their standard input ends, live on 7 March 2024, and write lines:
+//   wrong-passwords SERVER COUNT    signs Ann on with a wrong password; a line for each other answer than the two
+//                                   right ones, then "done"
+//   issue SERVER RULE COUNT         asks for numbers until it has so many: a line for each, one with "collisions" and
+//                                   their count at the end, and one for each failure that is no clean collision
+//   hold SERVER RULE [written]      locks the rule's row as an issuer does, or has written to it too, without a
+//                                   commit; then "holding", and stays
+//   load-as-nobody SERVER           gives up the rights of root and loads the administrator; the failure's number in
+//                                   hexadecimal and its text
+// Gives the exit code.
+int doWork(const std::vector<std::string>& words);
+
+}  // namespace QVSa::test

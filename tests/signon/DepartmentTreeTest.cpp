@@ -1,0 +1,162 @@
+#include "tests/support/Scene.h"
+
+namespace QVSa {
+namespace {
+
+using test::Lines;
+
+// Sales (3) with East (4) and in that Hub (5); Overseas (6).
+class DepartmentTree : public test::Scene {
+ protected:
+  DepartmentTree() {
+    add("S", "Sales", "_root");
+    add("E", "East", "S");
+    add("H", "Hub", "E");
+    add("O", "Overseas", "_root");
+  }
+
+  void add(const String& id, const String& name, const String& super) {
+    auto department = connected<Department>();
+    department.Id(id);
+    department.Name(name);
+    department.Super(super);
+    ASSERT_TRUE(department.Save()) << department.errDescription();
+    EXPECT_EQ(department.fullId(), "") << "the path comes with the next load";
+  }
+  Department department(const String& id) {
+    auto result = connected<Department>();
+    EXPECT_TRUE(result.GetOne(1, id)) << result.errDescription();
+    return result;
+  }
+  void change(const String& id, const std::function<void(Department&)>& change) {
+    Department changed = department(id);
+    change(changed);
+    ASSERT_TRUE(changed.Save()) << changed.errDescription();
+  }
+  void move(const String& id, const String& super) {
+    change(id, [&](Department& moved) { moved.Super(super); });
+  }
+  void expectRefused(Department& subject, Boolean result, Long message) {
+    EXPECT_FALSE(result);
+    EXPECT_EQ(subject.errNumber(), messageNumber(message)) << subject.errDescription();
+  }
+  Lines tree() const {
+    return tables_.rows("select deptNo,path,fullName from departments where deptId>2 order by deptId");
+  }
+};
+
+TEST_F(DepartmentTree, GrowsWithPathsAndFullNamesThatLeaveOutTheRoot) {
+  add("T", " Top ", "");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|.1.3.4.|Sales-East", "H|.1.3.4.5.|Sales-East-Hub", "O|.1.6.|Overseas",
+                           "T|.7.|Top"}));
+  const Department hub = department("h");
+  EXPECT_EQ(hub.InnerId(), 5);
+  EXPECT_EQ(hub.Super(), "E");
+  EXPECT_EQ(hub.superInnerId(), 4);
+  EXPECT_EQ(hub.fullId(), ".1.3.4.5.");
+  auto same = connected<Department>();
+  EXPECT_TRUE(same.GetOne(2, "hub"));
+  EXPECT_TRUE(same.GetOne(3, "5"));
+}
+
+TEST_F(DepartmentTree, AMoveOrANewNameGoesThroughAllThatLiesBelow) {
+  move("E", "O");
+  EXPECT_EQ(tree(),
+            (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Overseas-East", "H|.1.6.4.5.|Overseas-East-Hub", "O|.1.6.|Overseas"}));
+  EXPECT_EQ(tables_.text("select superDept from departments where deptNo='E'"), "6");
+  change("E", [](Department& east) { east.Name("West"); });
+  EXPECT_EQ(tree(),
+            (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Overseas-West", "H|.1.6.4.5.|Overseas-West-Hub", "O|.1.6.|Overseas"}));
+  move("E", "");
+  EXPECT_EQ(tree()[1], "E|.4.|West");
+  EXPECT_EQ(tree()[2], "H|.4.5.|West-Hub");
+  move("E", "_root");
+  EXPECT_EQ(tree()[2], "H|.1.4.5.|West-Hub");
+}
+
+TEST_F(DepartmentTree, AMoveBelowItselfIsNotRefused) {
+  move("S", "H");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.4.5.3.|Sales-East-Hub-Sales", "E|.1.3.4.5.3.4.|Sales-East-Hub-Sales-East",
+                           "H|.1.3.4.5.3.4.5.|Sales-East-Hub-Sales-East-Hub", "O|.1.6.|Overseas"}));
+}
+
+TEST_F(DepartmentTree, ARefusedSaveChangesNothing) {
+  const Lines before = tree();
+  auto empty = connected<Department>();
+  empty.Id("X");
+  expectRefused(empty, empty.Save(), 1002);
+  empty.Name("X");
+  empty.Super("nowhere");
+  expectRefused(empty, empty.Save(), 1003);
+
+  Department east = department("E");
+  east.Super("nowhere");
+  expectRefused(east, east.Save(), 1003);
+  east.Name("");
+  expectRefused(east, east.Save(), 1002);
+  EXPECT_EQ(tree(), before);
+}
+
+TEST_F(DepartmentTree, WhetherItIsForOutsidersIsWrittenOnce) {
+  change("E", [](Department& east) {
+    east.isOuter(true);
+    east.isOrg(true);
+  });
+  EXPECT_EQ(tables_.text("select isOuter,isOrg from departments where deptNo='E'"), "0|1");
+  EXPECT_EQ(department("H").Org(), "E");
+  EXPECT_EQ(department("E").Org(), "E");
+  EXPECT_EQ(department("O").Org(), "_root");
+}
+
+TEST_F(DepartmentTree, NullsInTheColumnsOfTheTree) {
+  tables_.run("update departments set superDept=null where deptNo='O'");
+  EXPECT_TRUE(department("O").isOrg()) << "nothing above it";
+  EXPECT_EQ(department("O").Super(), "");
+
+  tables_.run("update departments set path=null where deptNo='E'");
+  auto east = connected<Department>();
+  EXPECT_FALSE(east.GetOne(1, "E"));
+  EXPECT_EQ(east.errNumber(), number::nullUse);
+  EXPECT_EQ(east.Name(), "East") << "the fields are there";
+  add("N", "New", "E");
+  EXPECT_EQ(tree().back(), "N|7.|Sales-East-New");
+  tables_.run("update departments set fullName=null where deptNo='E'");
+  add("M", "More", "E");
+  EXPECT_EQ(tree().back(), "M|8.|");
+}
+
+TEST_F(DepartmentTree, AnUnknownNumberLeavesTheRootAsOrganisation) {
+  auto none = connected<Department>();
+  expectRefused(none, none.GetOne(1, "nowhere"), 1001);
+  EXPECT_EQ(none.Org(), "_root");
+}
+
+TEST_F(DepartmentTree, ADeleteIsRefusedWhileSomebodyIsLeftAndTakesTheJobs) {
+  addUser("ann", [](User& user) { user.deptId("E"); });
+  addUser("ben", [](User& user) { user.deptId("H"); });
+  auto subject = connected<Department>();
+  expectRefused(subject, subject.Delete("nowhere"), 1001);
+  expectRefused(subject, subject.Delete("E"), 1004);
+  expectRefused(subject, subject.Delete("H"), 1006);
+
+  // Job 5 is the one of the department that goes, job 1 one that stays.
+  tables_.run("delete from users where userLogin='ben' insert into jobs(roleId,deptId) values(1,5)");
+  const auto hangingOn = [&] {
+    String counts;
+    for (const char* table : {"jobs", "userJob", "userMgr", "repAcl", "fldAcl", "cftJob"})
+      counts += tables_.text(String("select count(*) from ") + table + " where jobId in (1,5)");
+    return counts;
+  };
+  for (const char* job : {"1", "5"})
+    tables_.run(String("insert into userJob(userId,jobId) values(9,") + job +
+                ") insert into userMgr(UserId,flag,jobId) values(9,1," + job +
+                ") insert into repAcl(repId,jobId) values(1," + job + ") insert into fldAcl(fldId,jobId) values(1," +
+                job + ") insert into cftJob(tId,jobId) values(1," + job + ")");
+  ASSERT_EQ(hangingOn(), "232222");
+  EXPECT_TRUE(subject.Delete("H")) << subject.errDescription();
+  EXPECT_EQ(hangingOn(), "121111");
+  EXPECT_EQ(tree().size(), 3U);
+}
+
+}  // namespace
+}  // namespace QVSa

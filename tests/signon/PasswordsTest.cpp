@@ -1,0 +1,108 @@
+#include "tests/support/Scene.h"
+
+namespace QVSa {
+namespace {
+
+using test::Lines;
+
+// Ann, under a policy that keeps three passwords. Each change is made an hour after the last one.
+class Passwords : public test::Scene {
+ protected:
+  Passwords() {
+    savePolicy([](safeRule& rule) { rule.cycle(3); });
+    addUser("ann");
+    ann_ = loaded("ann");
+  }
+
+  Boolean change(const String& from, const String& to) {
+    clock_.set(Date(2024, 3, 7, 10 + ++hours_));
+    return ann_.chgPwd(from, to);
+  }
+  Lines history() const { return tables_.rows("select creDate from userPwdHis where userId=2 order by creDate"); }
+
+  User ann_;
+  int hours_ = 0;
+};
+
+TEST_F(Passwords, AsManyAsThePolicySaysAreKeptAndRefused) {
+  EXPECT_FALSE(change("Right", "two"));
+  EXPECT_EQ(ann_.errDescription(), "Error in inputing old password.");
+  EXPECT_FALSE(change("right", "right"));
+  EXPECT_EQ(ann_.errNumber(), messageNumber(1120));
+  EXPECT_EQ(ann_.errDescription(), "Set duplicate password [3] times recently.");
+  EXPECT_TRUE(change("right", "two"));
+  EXPECT_TRUE(change("two", "three"));
+  EXPECT_FALSE(change("three", "right"));
+  EXPECT_TRUE(change("three", "four"));
+  EXPECT_EQ(history(), (Lines{"2024-03-07 13:00:00", "2024-03-07 14:00:00", "2024-03-07 16:00:00"}));
+  EXPECT_TRUE(change("four", "RIGHT")) << "passwords differ by case";
+  EXPECT_TRUE(change("RIGHT", "right")) << "the first one is forgotten";
+  EXPECT_EQ(history().size(), 3U);
+  EXPECT_TRUE(loaded("ann").chgPwd("right", "last"));
+}
+
+TEST_F(Passwords, ASaveKeepsTheHistoryToo) {
+  EXPECT_EQ(history(), (Lines{"2024-03-07 10:00:00"})) << "the first password";
+  EXPECT_FALSE(ann_.Save()) << "an unchanged password is refused as well";
+  EXPECT_EQ(ann_.errNumber(), messageNumber(1120));
+  EXPECT_EQ(ann_.errDescription(), "Set duplicate password @ times recently.");
+  EXPECT_TRUE(ann_.Save(true));
+  EXPECT_EQ(history().size(), 1U) << "nor was the policy asked for the length of the history";
+
+  clock_.set(Date(2024, 3, 8));
+  ann_.Pwd("two");
+  EXPECT_TRUE(ann_.Save());
+  EXPECT_EQ(history(), (Lines{"2024-03-07 10:00:00", "2024-03-08 00:00:00"}));
+  EXPECT_EQ(tables_.text("select pwdDate from users where userId=2"), "2024-03-08 00:00:00");
+}
+
+TEST_F(Passwords, UnderANewNameThePasswordIsStoredAnewAndTheOldOnesReadNoMore) {
+  EXPECT_TRUE(change("right", "two"));
+  ann_.Name("王小明");
+  EXPECT_TRUE(ann_.Save(true));
+  ann_ = loaded("ann");
+  EXPECT_EQ(ann_.Name(), "王小明");
+  EXPECT_TRUE(change("two", "right")) << ann_.errDescription();
+}
+
+TEST_F(Passwords, ThePolicyHoldsForEveryChangeButForTheSaveOfForeignAccounts) {
+  savePolicy([](safeRule& rule) {
+    rule.minLen(6);
+    rule.caseMixed(true);
+    rule.numCharMixed(true);
+  });
+  const String problems =
+      "The length of password is less than [6] .Password should include capital and lowercase letters."
+      "Password should include number and letters at samee time.";
+  EXPECT_FALSE(change("right", "abc"));
+  EXPECT_EQ(ann_.errNumber(), messageNumber(3000));
+  EXPECT_EQ(ann_.errDescription(), problems);
+
+  for (const Integer type : {Genaral, adUser, autoReg, ldapUser}) {
+    auto user = connected<User>();
+    user.Name("Ben");
+    user.Login("ben" + text(type));
+    user.Pwd("abc");
+    user.uType(type);
+    EXPECT_EQ(user.Save(), type != Genaral);
+    EXPECT_EQ(user.errDescription(), type == Genaral ? problems : "");
+  }
+  EXPECT_EQ(history().size(), 1U);
+}
+
+TEST_F(Passwords, APolicyWithoutARowIsMadeByItsFirstSave) {
+  tables_.run("delete from saferule");
+  auto rule = connected<safeRule>();
+  EXPECT_TRUE(rule.GetOne());
+  EXPECT_TRUE(rule.checkPwd(""));
+  rule.minLen(6);
+  rule.lockErr(true);
+  rule.hasSpecialChar(true);
+  EXPECT_TRUE(rule.Save());
+  EXPECT_EQ(tables_.text("select * from saferule"), "1|6|0|001|0|0|-1|0|0|0|0");
+  EXPECT_FALSE(rule.checkPwd("longer"));
+  EXPECT_TRUE(rule.checkPwd("密码密码密码")) << "any other character will do";
+}
+
+}  // namespace
+}  // namespace QVSa

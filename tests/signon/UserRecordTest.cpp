@@ -1,0 +1,136 @@
+#include "tests/support/Scene.h"
+
+namespace QVSa {
+namespace {
+
+using test::Lines;
+
+class UserRecord : public test::Scene {
+ protected:
+  UserRecord() {
+    tables_.run("insert into ItemGroups(gName) values('one') insert into ItemGroups(gName) values('two')");
+  }
+
+  String jobs(Long id) const { return join(tables_.rows("select jobId from userJob where userId=" + text(id)), ","); }
+  String groups(Long id) const { return join(tables_.rows("select gId from GrpUser where userId=" + text(id)), ","); }
+};
+
+TEST_F(UserRecord, WhatASaveWroteALoadFinds) {
+  addUser("ann", [](User& user) {
+    user.Name("Ann O'Hara");
+    user.MobilePhone("1");
+    user.Email("ann@example.com");
+    user.company("Firm");
+    user.Address("Street");
+    user.zipcode("2");
+    user.telePhone("3");
+    user.ipList("10.0.0.*");
+    user.OTPTokenId("token");
+    user.sendSms(true);
+    user.keyLogin(true);
+    user.isOuter(true);
+    user.synLogin(true);
+    user.PwdNoChange(true);
+    user.useOTPAuth(true);
+    user.setJobs("2,3,99");
+    user.grpName("two");
+  });
+  auto ann = connected<User>();
+  ASSERT_TRUE(ann.GetOne(2, "ann o'hara"));
+  EXPECT_EQ(ann.Login(), "ann");
+  EXPECT_EQ(ann.MobilePhone() + ann.Email() + ann.company() + ann.Address() + ann.zipcode() + ann.telePhone(),
+            "1ann@example.comFirmStreet23");
+  EXPECT_EQ(ann.ipList() + ann.OTPTokenId(), "10.0.0.*token");
+  EXPECT_TRUE(ann.sendSms() && ann.keyLogin() && ann.isOuter() && ann.synLogin() && ann.PwdNoChange() &&
+              ann.useOTPAuth());
+  EXPECT_EQ(ann.deptId(), "_root") << "nobody is without a department";
+  EXPECT_TRUE(ann.isDesigner() && ann.isOwner());
+  EXPECT_FALSE(ann.isAdministrator() || ann.isDeptadmin());
+  EXPECT_EQ(ann.grpName(), "two");
+  EXPECT_TRUE(connected<User>().GetOne(1, ann.Id()));
+  EXPECT_FALSE(ann.GetOne(9, "ann"));
+  EXPECT_EQ(ann.errDescription(), "User does not exist.");
+}
+
+TEST_F(UserRecord, TheOrganisationIsTheDepartmentItselfOrTheNearestAbove) {
+  for (const auto& [id, super, isOrg] : {std::tuple("A", "_root", true), {"B", "A", false}, {"C", "B", true}}) {
+    auto department = connected<Department>();
+    department.Id(id);
+    department.Name(String("Department ") + id);
+    department.Super(super);
+    department.isOrg(isOrg);
+    ASSERT_TRUE(department.Save());
+  }
+  for (const auto& [place, organisation] : {std::pair("A", "A"), {"B", "A"}, {"C", "C"}, {"_out", "_root"}}) {
+    addUser(String("in") + place, [id = place](User& user) { user.deptId(id); });
+    EXPECT_EQ(loaded(String("in") + place).orgId(), organisation);
+  }
+  EXPECT_EQ(loaded("inB").orgFullName(), "Department A");
+  EXPECT_EQ(loaded("inB").deptFullName(), "Department A-Department B");
+}
+
+TEST_F(UserRecord, ASaveReplacesJobsAndGroupsByThoseItWasGiven) {
+  addUser("ann", [](User& user) { user.setJobs("1,2"); });
+  tables_.run("insert into GrpUser(gId,userId) values(1,2) insert into GrpUser(gId,userId) values(2,2)");
+  User ann = loaded("ann");
+  EXPECT_EQ(ann.grpName(), "one,two");
+  ann.setJobs("2,4");
+  EXPECT_TRUE(ann.Save());
+  EXPECT_EQ(jobs(2), "2,4");
+  EXPECT_EQ(groups(2), "") << "the two names were taken as one";
+
+  ann = loaded("ann");
+  ann.grpName("one");
+  EXPECT_TRUE(ann.Save());
+  EXPECT_EQ(jobs(2), "") << "the list of jobs is not loaded";
+  EXPECT_EQ(groups(2), "1");
+
+  User administrator = loaded("admin");
+  administrator.setJobs("2");
+  EXPECT_TRUE(administrator.Save());
+  EXPECT_EQ(jobs(1), "1") << "a built-in user keeps his jobs";
+}
+
+TEST_F(UserRecord, ARefusedSaveWritesNothing) {
+  addUser("ann", [](User& user) { user.setJobs("1"); });
+  auto second = connected<User>();
+  EXPECT_FALSE(second.Save());
+  EXPECT_EQ(second.errDescription(), "Incomplete input, please reenter user name and account name.");
+  second.Name("Second");
+  second.Login("ANN ");
+  EXPECT_FALSE(second.Save());
+  EXPECT_EQ(second.errNumber(), number::integrity) << "log-ins are unique without regard to case";
+  // The jobs of a new user are found by his name, and Ann's own are among them.
+  second.Name("Ann");
+  second.Login("ann2");
+  second.setJobs("1");
+  EXPECT_FALSE(second.Save());
+  EXPECT_EQ(second.errNumber(), number::integrity);
+  EXPECT_EQ(tables_.text("select count(*) from users"), "2");
+
+  User ann = loaded("ann");
+  ann.Name("Other");
+  ann.setJobs("1,");
+  EXPECT_FALSE(ann.Save());
+  EXPECT_EQ(ann.errNumber(), number::statement);
+  EXPECT_EQ(loaded("ann").Name(), "Ann");
+  EXPECT_EQ(jobs(2), "1");
+}
+
+TEST_F(UserRecord, ADeleteTakesTheGroupsAndLeavesTheJobs) {
+  addUser("ann", [](User& user) {
+    user.setJobs("1");
+    user.grpName("one");
+  });
+  tables_.run("insert into agentuser(agentuserid) values(2)");
+  EXPECT_TRUE(connected<User>().Delete());
+  EXPECT_EQ(tables_.text("select count(*) from users"), "2") << "nobody has the id 0";
+  EXPECT_TRUE(loaded("ann").Delete());
+  EXPECT_EQ(tables_.text("select count(*) from users"), "1");
+  EXPECT_EQ(tables_.text("select count(*) from agentuser"), "0");
+  EXPECT_EQ(groups(2), "");
+  EXPECT_EQ(jobs(2), "1");
+}
+
+}  // namespace
+}  // namespace QVSa

@@ -1,0 +1,54 @@
+#pragma once
+
+#include <functional>
+#include <gtest/gtest.h>
+
+#include "QVSa/QVSa.h"
+#include "tests/support/FakeClock.h"
+#include "tests/support/PlainSession.h"
+#include "tests/support/TestInstallation.h"
+
+namespace QVSa::test {
+
+// An installation as it is shipped, on the morning of 7 March 2024.
+class Scene : public testing::Test {
+ protected:
+  template <class Class>
+  Class connected(const String& database = "QVApp") {
+    Class object;
+    object.connect(server(), database);
+    return object;
+  }
+
+  void savePolicy(const std::function<void(safeRule&)>& change) {
+    auto rule = connected<safeRule>();
+    ASSERT_TRUE(rule.GetOne());
+    change(rule);
+    ASSERT_TRUE(rule.Save()) << rule.errDescription();
+  }
+
+  // A user of the password "right"; his name is the login with a capital.
+  void addUser(
+      const String& login, const std::function<void(User&)>& change = [](User&) {}) {
+    auto user = connected<User>();
+    user.Name(upperCase(login.substr(0, 1)) + login.substr(1));
+    user.Login(login);
+    user.Pwd("right");
+    change(user);
+    ASSERT_TRUE(user.Save()) << user.errDescription();
+  }
+
+  User loaded(const String& login) {
+    auto user = connected<User>();
+    EXPECT_TRUE(user.GetOne(3, login)) << user.errDescription();
+    return user;
+  }
+
+  String server() const { return installation_.server(); }
+
+  FakeClock clock_{Date(2024, 3, 7, 10, 0, 0)};
+  TestInstallation installation_;
+  PlainSession tables_{installation_.server()};
+};
+
+}  // namespace QVSa::test
