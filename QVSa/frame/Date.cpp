@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
-#include <cstdio>
 
 #include "QVSa/frame/Failure.h"
 
@@ -72,11 +71,32 @@ int daysInMonth(int year, std::int64_t month) {
   return static_cast<int>(dayNumber(year, month + 1, 1) - dayNumber(year, month, 1));
 }
 
-template <class... Numbers>
-String formatted(const char* format, Numbers... numbers) {
-  std::array<char, 64> buffer;
-  const int length = std::snprintf(buffer.data(), buffer.size(), format, numbers...);
-  return String(buffer.data(), static_cast<std::size_t>(length));
+// Writes the number's last digits, `width` of them, and moves behind them.
+void putDigits(char*& at, int number, int width) {
+  for (int digit = width; digit-- > 0; number /= 10) at[digit] = static_cast<char>('0' + number % 10);
+  at += width;
+}
+
+// The date in front of the time where it is wanted, a mark between the date's parts where one is given.
+String written(const Parts& parts, bool withDate, std::optional<char> mark) {
+  std::array<char, 20> text;
+  char* at = text.data();
+  if (withDate) {
+    const Calendar date = calendarOf(parts.day);
+    putDigits(at, date.year, 4);
+    if (mark) *at++ = *mark;
+    putDigits(at, date.month, 2);
+    if (mark) *at++ = *mark;
+    putDigits(at, date.day, 2);
+    *at++ = ' ';
+  }
+  const int seconds = static_cast<int>(parts.millisecond / 1000);
+  putDigits(at, seconds / 3600, 2);
+  *at++ = ':';
+  putDigits(at, seconds / 60 % 60, 2);
+  *at++ = ':';
+  putDigits(at, seconds % 60, 2);
+  return String(text.data(), at);
 }
 
 // Reads a text from left to right; every step says whether it found what it was to find.
@@ -193,15 +213,9 @@ Date Date::addMonths(int months) const {
 
 String Date::text() const {
   const Parts parts = partsOf(days_);
-  String time = formatted("%02d:%02d:%02d", hour(), minute(), second());
-  if (parts.day == 0) return time;
-  const Calendar date = calendarOf(parts.day);
-  return formatted("%04d-%02d-%02d ", date.year, date.month, date.day) + time;
+  return written(parts, parts.day != 0, '-');
 }
 
-String Date::sqlText() const {
-  const Calendar date = calendarOf(partsOf(days_).day);
-  return formatted("%04d%02d%02d %02d:%02d:%02d", date.year, date.month, date.day, hour(), minute(), second());
-}
+String Date::sqlText() const { return written(partsOf(days_), true, std::nullopt); }
 
 }  // namespace QVSa

@@ -41,8 +41,8 @@ Date Field::asDate() const {
 }
 
 String Field::asText() const {
-  const Variant value = Value();
-  return value.isNull() ? String() : value.toText();
+  Variant value = Value();
+  return value.isNull() ? String() : std::move(value).toText();
 }
 
 Boolean Field::asBoolean() const {

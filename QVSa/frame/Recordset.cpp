@@ -154,8 +154,6 @@ void Recordset::Update() {
   for (const auto& [ordinal, value] : pending) settle(ordinal, value);
 }
 
-bool Recordset::isOpen() const { return open_ && (!source_ || *source_); }
-
 void Recordset::requireOpen() const {
   if (!isOpen()) throw Failure(number::closed, "Recordset", "Operation is not allowed when the object is closed.");
 }
@@ -181,9 +179,12 @@ std::size_t Recordset::ordinalOf(const String& name) {
   if (ordinals_.empty()) {
     for (std::size_t i = 0; i < columns_.size(); ++i) ordinals_.emplace(lowerCase(columns_[i].name), i);
   }
-  const auto entry = ordinals_.find(lowerCase(name));
+  auto entry = ordinals_.find(name);
+  if (entry != ordinals_.end()) return entry->second;
+  entry = ordinals_.find(lowerCase(name));
   if (entry == ordinals_.end()) throw noSuchField();
-  return entry->second;
+  // Row by row the same names are asked for.
+  return ordinals_.emplace(name, entry->second).first->second;
 }
 
 Recordset::Row Recordset::sourceRow() const {

@@ -109,7 +109,7 @@ class Recordset {
   };
 
   void start(AttachedRows source, bool keep);
-  bool isOpen() const;
+  bool isOpen() const { return open_ && (!source_ || *source_); }
   bool isCurrent() const { return position_ < fetched_; }
   void requireOpen() const;
   void requireRow() const;

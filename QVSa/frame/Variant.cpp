@@ -6,6 +6,7 @@
 #include <limits>
 #include <optional>
 #include <string_view>
+#include <utility>
 
 #include "QVSa/frame/Failure.h"
 
@@ -149,7 +150,9 @@ Date Variant::toDate() const {
   return *date;
 }
 
-String Variant::toText() const {
+String Variant::toText() && { return isText() ? std::get<String>(std::move(value_)) : std::as_const(*this).toText(); }
+
+String Variant::toText() const& {
   struct Writer {
     String operator()(std::monostate) const { return {}; }
     String operator()(NullValue) const { throw runtimeFailure(number::nullUse); }

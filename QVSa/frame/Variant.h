@@ -51,7 +51,8 @@ class Variant {
   Boolean toBoolean() const;
   Date toDate() const;
   // The default text form: decimal digits, Date::text().
-  String toText() const;
+  String toText() const&;
+  String toText() &&;
   // The bytes held; of a text its UTF-8. Throws 13 for anything else.
   Bytes toBytes() const;
 

@@ -37,9 +37,10 @@ BoundQuery Binder::bindQuery(const tsql::Select& select, bool updatable) {
   Parameter locked;
   locked.source = Parameter::Source::lockedRows;
   BoundPtr mine = std::make_unique<BoundExpression>();
-  mine->kind = BoundExpression::Kind::inList;
-  mine->parameter = parameter(locked)->parameter;
+  mine->kind = BoundExpression::Kind::call;
+  mine->text = "t_listed";
   mine->operands.push_back(rowid(core.from.front().alias));
+  mine->operands.push_back(parameter(locked));
   core.where.push_back(std::move(mine));
   query.claim = std::move(claim);
   return query;

@@ -28,10 +28,7 @@ char32_t mapped(std::span<const CaseRange> ranges, char32_t point) {
 
 }  // namespace
 
-char32_t foldCase(char32_t point) {
-  if (point < 0x80) return point >= U'A' && point <= U'Z' ? point + 32 : point;
-  return mapped(foldRanges, point);
-}
+char32_t foldWideCase(char32_t point) { return mapped(foldRanges, point); }
 
 char32_t upperCase(char32_t point) {
   if (point < 0x80) return point >= U'a' && point <= U'z' ? point - 32 : point;

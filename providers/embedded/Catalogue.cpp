@@ -36,16 +36,8 @@ std::optional<std::size_t> TableInfo::find(const std::string& column) const {
   return std::nullopt;
 }
 
-Catalogue::Catalogue(Handle& handle) : version_(currentVersion(handle)) {
+Catalogue::Catalogue(Handle& handle) : version_(handle.catalogueVersion()) {
   for (std::size_t database = 0; database < databaseNames.size(); ++database) load(handle, database);
-}
-
-std::int64_t Catalogue::currentVersion(Handle& handle) {
-  Prepared query(handle.get(),
-                 "select (select catalogue from master.engine) + (select catalogue from QVSys.engine) + "
-                 "(select catalogue from QVApp.engine) + (select catalogue from QVUpdate.engine)");
-  query.step();
-  return std::get<std::int64_t>(query.column(0));
 }
 
 void Catalogue::load(Handle& handle, std::size_t database) {

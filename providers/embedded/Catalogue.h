@@ -48,8 +48,7 @@ class Catalogue {
  public:
   explicit Catalogue(Handle& handle);
 
-  // Changes with every definition in any database, by whichever session: a catalogue of another version is out of date.
-  static std::int64_t currentVersion(Handle& handle);
+  // A catalogue of another version than the handle's is out of date.
   std::int64_t version() const { return version_; }
 
   // The table or view of that name, through synonyms. Throws 208 where there is none, 911 for an unknown database.

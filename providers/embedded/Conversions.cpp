@@ -272,9 +272,9 @@ Date dateOf(std::int64_t ticks) {
 
 std::int64_t lengthOf(const std::string& text) { return unitsOf(withoutTrailingBlanks(text)); }
 
-Variant variantOf(const Value& value, const Type& type) {
-  if (const auto* text = std::get_if<std::string>(&value)) return Variant(*text);
-  if (const auto* bytes = std::get_if<Bytes>(&value)) return Variant(*bytes);
+Variant variantOf(Value value, const Type& type) {
+  if (auto* text = std::get_if<std::string>(&value)) return Variant(std::move(*text));
+  if (auto* bytes = std::get_if<Bytes>(&value)) return Variant(std::move(*bytes));
   if (const auto* real = std::get_if<double>(&value)) return numberVariant(*real, type.base);
   const auto* whole = std::get_if<std::int64_t>(&value);
   if (whole == nullptr) return Variant::null();

@@ -33,7 +33,7 @@ std::int64_t lengthOf(const std::string& text);
 
 // What a caller of the provider sees of a value: bit as Boolean, tinyint and smallint as Integer, int as Long, bigint
 // and decimal as Long where they are whole and fit and as Double otherwise.
-Variant variantOf(const Value& value, const Type& type);
+Variant variantOf(Value value, const Type& type);
 // The way back, for a value that is to be written to a column of `type`.
 Value valueOf(const Variant& variant, const Type& type);
 

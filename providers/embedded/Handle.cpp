@@ -83,7 +83,6 @@ Handle::Handle(const std::filesystem::path& folder)
     open();
     deadline_.reset();
   } catch (...) {
-    login_.reset();
     gates_.clear();
     sqlite3_close_v2(handle_);
     throw;
@@ -94,7 +93,7 @@ Handle::~Handle() {
   attachment_.reset();
   // A forked child has the library's record of its locks but not the locks: even closing could harm the files.
   if (::getpid() != process_) return;
-  login_.reset();
+  for (auto* const statement : {&begin_, &commit_, &login_, &version_}) statement->reset();
   gates_.clear();
   sqlite3_close_v2(handle_);
 }
@@ -183,11 +182,38 @@ void Handle::execute(const std::string& text) {
 
 bool Handle::inTransaction() const { return sqlite3_get_autocommit(handle_) == 0; }
 
+Prepared& Handle::kept(std::optional<Prepared>& statement, const char* text) {
+  if (!statement) statement.emplace(handle_, text);
+  return *statement;
+}
+
+void Handle::begin() {
+  Prepared& statement = kept(begin_, "begin");
+  statement.step();
+  statement.reset();
+}
+
+void Handle::commit() {
+  Prepared& statement = kept(commit_, "commit");
+  statement.step();
+  statement.reset();
+}
+
+std::int64_t Handle::catalogueVersion() {
+  Prepared& statement = kept(version_,
+                             "select m.catalogue+s.catalogue+a.catalogue+u.catalogue "
+                             "from master.engine m, QVSys.engine s, QVApp.engine a, QVUpdate.engine u");
+  statement.step();
+  const Value version = statement.column(0);
+  statement.reset();
+  return std::get<std::int64_t>(version);
+}
+
 std::string Handle::loginDigest(const std::string& user) {
-  if (!login_) login_.emplace(handle_, "select digest from master.logins where name=?");
-  login_->bind(1, user);
-  const Value digest = login_->step() ? login_->column(0) : Value();
-  login_->reset();
+  Prepared& statement = kept(login_, "select digest from master.logins where name=?");
+  statement.bind(1, user);
+  const Value digest = statement.step() ? statement.column(0) : Value();
+  statement.reset();
   const auto* const text = std::get_if<std::string>(&digest);
   return text == nullptr ? std::string() : *text;
 }

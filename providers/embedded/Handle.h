@@ -58,12 +58,18 @@ class Handle {
   void waitShortly();
   // Takes the writer's place of one database, inside a transaction of the handle: a write that changes nothing.
   void takeWriter(std::size_t database);
+  // Begins and ends a transaction of the storage library.
+  void begin();
+  void commit();
   // Runs statements of the storage library that give no rows.
   void execute(const std::string& text);
   // Whether a transaction of the storage library is open.
   bool inTransaction() const;
   // The stored digest of a log-in's password; empty for a log-in that does not exist.
   std::string loginDigest(const std::string& user);
+
+  // Changes with every definition in any database, by whichever session.
+  std::int64_t catalogueVersion();
 
   // Ends what a session may have left: running statements, a transaction, row locks, the deadline, the last identity.
   void clear();
@@ -75,6 +81,7 @@ class Handle {
   void open();
   void attach(std::size_t database);
   void check(const std::string& database);
+  Prepared& kept(std::optional<Prepared>& statement, const char* text);
   void resetStatements();
   bool isLate() const;
   void sleep();
@@ -88,7 +95,11 @@ class Handle {
   FunctionContext context_;
   std::array<std::unique_ptr<RowLocks>, databaseNames.size()> locks_;
   std::vector<Prepared> gates_;
+  // Statements that every session runs, compiled at their first use.
+  std::optional<Prepared> begin_;
+  std::optional<Prepared> commit_;
   std::optional<Prepared> login_;
+  std::optional<Prepared> version_;
   std::shared_ptr<void> attachment_;
   std::optional<std::chrono::steady_clock::time_point> deadline_;
   std::minstd_rand random_;

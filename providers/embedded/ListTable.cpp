@@ -1,5 +1,6 @@
 #include "providers/embedded/ListTable.h"
 
+#include <algorithm>
 #include <sqlite3.h>
 
 #include "providers/embedded/StorageFailure.h"
@@ -19,6 +20,17 @@ struct Cursor : sqlite3_vtab_cursor {
   const ValueList* values = nullptr;
   std::size_t at = 0;
 };
+
+// Null where no list is bound.
+const ValueList* listOf(sqlite3_value* argument) {
+  const void* const bound = sqlite3_value_pointer(argument, pointerType);
+  return bound == nullptr ? nullptr : static_cast<const std::shared_ptr<const ValueList>*>(bound)->get();
+}
+
+void isListed(sqlite3_context* context, int, sqlite3_value** arguments) {
+  const ValueList* const list = listOf(arguments[1]);
+  sqlite3_result_int(context, list != nullptr && std::ranges::binary_search(*list, readValue(arguments[0])));
+}
 
 Cursor& of(sqlite3_vtab_cursor* cursor) { return *static_cast<Cursor*>(cursor); }
 
@@ -60,10 +72,7 @@ int closeCursor(sqlite3_vtab_cursor* cursor) {
 
 int filter(sqlite3_vtab_cursor* cursor, int, const char*, int count, sqlite3_value** arguments) {
   of(cursor).at = 0;
-  of(cursor).values = nullptr;
-  if (count == 0) return SQLITE_OK;
-  const void* const bound = sqlite3_value_pointer(arguments[0], pointerType);
-  if (bound != nullptr) of(cursor).values = static_cast<const std::shared_ptr<const ValueList>*>(bound)->get();
+  of(cursor).values = count == 0 ? nullptr : listOf(arguments[0]);
   return SQLITE_OK;
 }
 
@@ -108,7 +117,9 @@ const sqlite3_module& module() {
 }  // namespace
 
 void registerListTable(sqlite3* handle) {
-  const int code = sqlite3_create_module_v2(handle, "list", &module(), nullptr, nullptr);
+  int code = sqlite3_create_module_v2(handle, "list", &module(), nullptr, nullptr);
+  if (code == SQLITE_OK)
+    code = sqlite3_create_function_v2(handle, "t_listed", 2, SQLITE_UTF8, nullptr, isListed, nullptr, nullptr, nullptr);
   if (code != SQLITE_OK) throwStorageFailure(handle, code);
 }
 

@@ -44,14 +44,22 @@ bool EmbeddedRows::next() {
     buffered_.pop_front();
     return true;
   }
+  if (statement_ && !ahead_) advance();
   if (!ahead_) return false;
-  current_ = read();
-  advance();
+  // A row set of one row lets its statement go before the caller looks at it.
+  if (current_.empty()) {
+    current_ = read();
+    advance();
+  } else {
+    ahead_ = false;
+  }
   return true;
 }
 
 Variant EmbeddedRows::value(std::size_t ordinal) const {
-  return variantOf(current_.at(ordinal), step_.results.at(ordinal).type);
+  const Type& type = step_.results.at(ordinal).type;
+  if (statement_ && !ahead_) return variantOf(statement_->column(static_cast<int>(ordinal)), type);
+  return variantOf(current_.at(ordinal), type);
 }
 
 void EmbeddedRows::update(const std::vector<std::pair<std::size_t, Variant>>& changes) {
@@ -71,6 +79,10 @@ void EmbeddedRows::update(const std::vector<std::pair<std::size_t, Variant>>& ch
 }
 
 void EmbeddedRows::buffer() {
+  if (statement_ && !ahead_) {
+    current_ = read();
+    advance();
+  }
   while (ahead_) {
     buffered_.push_back(read());
     advance();

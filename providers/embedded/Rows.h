@@ -40,9 +40,9 @@ class EmbeddedRows : public Rows {
   std::shared_ptr<Plan> plan_;
   Step& step_;
   std::optional<Prepared> statement_;
-  bool ahead_ = false;  // the statement stands on a row that next() has not given yet
+  bool ahead_ = false;  // the statement stands on a row that next() has not given yet; else on the current row
   std::deque<Row> buffered_;
-  Row current_;
+  Row current_;  // where the statement does not stand on it
 };
 
 }  // namespace QVSa::embedded

@@ -95,7 +95,7 @@ EmbeddedSession::~EmbeddedSession() {
 }
 
 void EmbeddedSession::refreshCatalogue() {
-  if (cache_->catalogue && cache_->catalogue->version() == Catalogue::currentVersion(*handle_)) return;
+  if (cache_->catalogue && cache_->catalogue->version() == handle_->catalogueVersion()) return;
   for (auto& plans : cache_->plans) plans.clear();
   cache_->catalogue = std::make_shared<const Catalogue>(*handle_);
 }
@@ -126,7 +126,7 @@ std::shared_ptr<Plan> EmbeddedSession::planFor(const Batch& batch, std::vector<t
       plan->steps.push_back(compile(std::move(statement), *plan->catalogue, database_, batch.updatable, facts));
   } catch (const Failure& failure) {
     // Another session may have made the object since this one looked.
-    if (cache_->catalogue->version() == Catalogue::currentVersion(*handle_)) throw;
+    if (cache_->catalogue->version() == handle_->catalogueVersion()) throw;
     refreshCatalogue();
     return planFor(batch, tokens);
   }
@@ -218,6 +218,7 @@ std::shared_ptr<const ValueList> EmbeddedSession::claimRows(Step& step, const st
     }
     if (have) mine->push_back(std::move(key));
   }
+  std::ranges::sort(*mine);
   return mine;
 }
 
@@ -241,7 +242,7 @@ void EmbeddedSession::prepareWrite(std::size_t database) {
 }
 
 void EmbeddedSession::takeWriter(std::size_t database) {
-  if (!started_) handle_->execute("begin");
+  if (!started_) handle_->begin();
   started_ = true;
   if (writing_.contains(database)) return;
   handle_->takeWriter(database);
@@ -349,7 +350,7 @@ void EmbeddedSession::commit() {
                            "The current transaction cannot be committed and cannot support operations that write to "
                            "the log file. Roll back the transaction.");
   }
-  if (started_) handle_->execute("commit");
+  if (started_) handle_->commit();
   started_ = false;
   endTransaction();
 }

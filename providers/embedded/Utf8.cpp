@@ -32,9 +32,8 @@ int unitsOfSymbol(char32_t symbol) { return symbol >= 0x10000 && symbol < strayB
 
 }  // namespace
 
-char32_t nextSymbol(const char*& at, const char* end) {
+char32_t nextWideSymbol(const char*& at, const char* end) {
   const unsigned char first = byteAt(at++);
-  if (first < 0x80) return first;
   const Lead lead = leadOf(first);
   if (lead.following == 0 || end - at < lead.following) return strayByte + first;
   char32_t point = lead.bits;

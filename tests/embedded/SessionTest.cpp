@@ -49,10 +49,15 @@ const std::string claim = "select n from t with (rowlock xlock readpast) where n
 }  // namespace
 
 TEST_F(Sessions, ARowSetGoesOnFromMemoryWhenItsSessionWrites) {
-  const auto result = first_->run({"select no from t order by no"});
-  ASSERT_TRUE(result.rows->next());
+  const auto atFirst = first_->run({"select no from t order by no"});
+  const auto behind = first_->run({"select no from t order by no"});
+  ASSERT_TRUE(atFirst.rows->next());
+  ASSERT_TRUE(behind.rows->next() && behind.rows->next());
   first_->run({"delete from t"});
-  EXPECT_EQ(rest(*result.rows), "b c");
+  EXPECT_EQ(atFirst.rows->value(0).toText(), "a");
+  EXPECT_EQ(rest(*atFirst.rows), "b c");
+  EXPECT_EQ(behind.rows->value(0).toText(), "b");
+  EXPECT_EQ(rest(*behind.rows), "c");
   EXPECT_EQ(all(*first_, "select count(*) from t"), "0");
 }
 
