@@ -111,8 +111,8 @@ Boolean userGroup::insertGroup() {
     connection.BeginTrans();
     connection.Execute(sql("insert into ItemGroups(gName,gDesc)"
                            " values(<gName>,<gDesc>)")
-                           .text("gName", Name_)
-                           .text("gDesc", description_));
+                           .text("gDesc", description_)
+                           .text("gName", Name_));
     {
       Recordset row = connection.Execute("select scope_identity()");
       if (row.EOF_()) return refuse(1802);
@@ -132,8 +132,8 @@ Boolean userGroup::updateGroup() {
                            "gDesc=<gDesc>"
                            " where gId=" +
                            text(Id_))
-                           .text("gName", Name_)
-                           .text("gDesc", description_));
+                           .text("gDesc", description_)
+                           .text("gName", Name_));
     return true;
   });
 }
