@@ -2,6 +2,7 @@
 
 #include <libfccp/csv.h>
 #include <set>
+#include <tuple>
 
 #include "console/Answer.h"
 
@@ -49,11 +50,10 @@ std::vector<DepartmentRow> readDepartments(const std::filesystem::path& file, Ke
   return rows;
 }
 
-std::vector<UserRow> readUsers(const std::filesystem::path& file, const Keys& departments) {
+std::vector<UserRow> readUsers(const std::filesystem::path& file, const Keys& departments, Keys& logins) {
   Reader<3> reader(file.string());
   reader.read_header(io::ignore_no_column, "login", "name", "department");
   std::vector<UserRow> rows;
-  Keys logins;
   UserRow row;
   while (reader.read_row(row.login, row.name, row.department)) {
     const unsigned line = reader.get_file_line();
@@ -65,14 +65,33 @@ std::vector<UserRow> readUsers(const std::filesystem::path& file, const Keys& de
   return rows;
 }
 
+std::vector<HoldingRow> readHoldings(const std::filesystem::path& file, const Keys& departments, const Keys& logins) {
+  if (!std::filesystem::exists(file)) return {};
+  Reader<3> reader(file.string());
+  reader.read_header(io::ignore_no_column, "login", "role", "department");
+  std::vector<HoldingRow> rows;
+  std::set<std::tuple<String, String, String>> seen;
+  HoldingRow row;
+  while (reader.read_row(row.login, row.role, row.department)) {
+    const unsigned line = reader.get_file_line();
+    if (row.role.empty()) refuse(file, line, "the role is empty");
+    if (logins.count(row.login) == 0) refuse(file, line, "there is no user " + row.login);
+    if (departments.count(row.department) == 0) refuse(file, line, "there is no department " + row.department);
+    if (!seen.emplace(row.login, row.role, row.department).second) refuse(file, line, "the holding stands there twice");
+    rows.push_back(row);
+  }
+  return rows;
+}
+
 }  // namespace
 
 Organisation readOrganisation(const std::filesystem::path& folder) {
   try {
     Organisation organisation;
-    Keys numbers;
+    Keys numbers, logins;
     organisation.departments = readDepartments(folder / "departments.csv", numbers);
-    organisation.users = readUsers(folder / "users.csv", numbers);
+    organisation.users = readUsers(folder / "users.csv", numbers, logins);
+    organisation.holdings = readHoldings(folder / "holdings.csv", numbers, logins);
     return organisation;
   } catch (const io::error::base& error) {
     throw Refusal(error.what());

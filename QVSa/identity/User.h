@@ -7,6 +7,7 @@
 namespace QVSa {
 
 class Department;
+class Users;
 class safeRule;
 
 // One user with his department, organisation, built-in roles and groups; sign-on and the change of passwords.
@@ -135,12 +136,22 @@ class User : private Frame {
   // Changes the password of the loaded user under the policy. 0x80040461 `oldPwd` is not his, 0x80040460 used before,
   // 0x80040BB8 against the policy.
   Boolean chgPwd(const String& oldPwd, const String& newPwd);
+  // Sets the user's supervisor: whoever holds job `jobId` (`flag` 1), or user `userId` (2). Any other flag: none; both
+  // ids are stored all the same. 0x80040458 flag 1 without a job, 0x80040459 flag 2 without a user.
+  Boolean setManager(Integer flag, Long jobId = 0, Long userId = 0);
+  // True also where no supervisor was ever set: the arguments then stay as they are.
+  Boolean getManager(Integer& flag, Long& jobId, Long& userId);
+  // Who is supervised by this user or by a job that he holds: ids, names and logins, not connected. No object on
+  // failure, two of one name among them.
+  std::shared_ptr<Users> getSubUsers();
   // True for every text.
   Boolean chkRegPwd(const String& Pwd);
   // Records nothing and gives False.
   Boolean RecordAction(Long uid, const String& sId, String& s);
 
  private:
+  friend class Users;
+
   struct Residence;
 
   void clearRecord();

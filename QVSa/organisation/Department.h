@@ -6,6 +6,9 @@
 
 namespace QVSa {
 
+class Departments;
+class Users;
+
 // One row of the department tree.
 //   Department sales;  sales.connect(server);
 //   sales.Id("S1");  sales.Name("Sales");  sales.Super("_root");  sales.Save();
@@ -52,7 +55,18 @@ class Department : private Frame {
   // sub departments, 0x800403EE it has users. Not one transaction: the jobs stay removed where the last step fails.
   Boolean Delete(const String& Id = "");
 
+  // This department and all below it, in no order, each under its number. The result is not connected: its records
+  // can't reach the database. No object on failure.
+  std::shared_ptr<Departments> GetAllSub();
+  // An empty collection where nothing lies directly below; no object and 13 where something does. Use GetAllSub.
+  std::shared_ptr<Departments> GetSub();
+  // The users of the department whose number reads as this one's inner id: not this one's users, unless number and
+  // inner id are the same. No object on failure.
+  std::shared_ptr<Users> GetUsers();
+
  private:
+  friend class Departments;
+
   struct Place;
   struct Superior;
   struct Stored;

@@ -1,0 +1,31 @@
+#include "QVSa/organisation/Roles.h"
+
+namespace QVSa {
+
+std::shared_ptr<Role> Roles::Add(Long Id, const String& Name) {
+  auto role = std::make_shared<Role>();
+  role->Id(Id);
+  role->Name(Name);
+  role->connect(server(), DBName());
+  add(role, Name);
+  return role;
+}
+
+Boolean Roles::GetAll() {
+  return operation(prefixedBlank(1207), [&] {
+    clearItems();
+    Connection connection = open();
+    Recordset row = connection.Execute(
+        " select roleId,roleName,roleDesc,builtIn , "
+        " CreUId , CreUName , CreateTime , UpdUId , UpdUName , UpdTime , OtherCanUpd from roles    ");
+    for (; !row.EOF_(); row.MoveNext()) {
+      auto role = std::make_shared<Role>();
+      role->read(row);
+      role->connect(server(), DBName());
+      add(role, role->Name());
+    }
+    return true;
+  });
+}
+
+}  // namespace QVSa

@@ -1,0 +1,80 @@
+#include "tests/organisation/Company.h"
+
+namespace QVSa {
+namespace {
+
+// Texts that would break a statement, an XML text or a pattern which does not hold them apart from its own signs.
+const String hardTexts[] = {"O'Brien''s",
+                            "<roleDesc>x<gId>",
+                            "[brackets] and ]]",
+                            "100 % _under_",
+                            "-- ; drop table roles",
+                            "\xF0\x9F\x98\x80 smiles",
+                            "\xE9\x94\x80\xE5\x94\xAE\xE9\x83\xA8",
+                            "a|b\"c\\d\te"};
+
+class HardTextsTest : public test::Company {};
+
+TEST_F(HardTextsTest, ARoleAGroupAndADepartmentAreFoundByThemAgain) {
+  for (const String& name : hardTexts) {
+    SCOPED_TRACE(name);
+    auto role = connected<Role>();
+    role.Name(name);
+    ASSERT_TRUE(role.Save()) << role.errDescription();
+    auto loaded = connected<Role>();
+    ASSERT_TRUE(loaded.GetOne(2, name)) << loaded.errDescription();
+    EXPECT_EQ(loaded.Name(), name);
+    EXPECT_EQ(loaded.Id(), role.Id());
+
+    userGroup group = addGroup(name, "1", name);
+    String roles;
+    ASSERT_TRUE(group.GetRoles(roles));
+    EXPECT_EQ(roles, name);
+
+    addDepartment("no " + name, name, "S");
+    const Department below = department("no " + name);
+    EXPECT_EQ(below.fullName(), "Sales-" + name);
+    Jobs jobs = connected<Jobs>();
+    ASSERT_TRUE(role.setJobs(text(below.InnerId())));
+    ASSERT_TRUE(jobs.GetAll(below.Id(), name)) << jobs.errDescription();
+    EXPECT_EQ(test::names(jobs), (test::Lines{"Sales-" + name + "--" + name}));
+  }
+  EXPECT_EQ(tables_.text("select count(*) from roles where builtIn=1"), "6");
+  auto groups = connected<userGroups>();
+  EXPECT_TRUE(groups.GetAll()) << groups.errDescription();
+}
+
+TEST_F(HardTextsTest, AnXmlKeepsThem) {
+  const Long hub = job(manager_, "H");
+  for (const String& name : {hardTexts[0], hardTexts[5], hardTexts[6]})
+    manager_.UpdateUsers(text(addUser(name, "H")) + "," + text(hub), "");
+  String xml;
+  ASSERT_TRUE(manager_.GetUsers2(xml));
+  for (const String& name : {hardTexts[0], hardTexts[5], hardTexts[6]})
+    EXPECT_NE(xml.find(" name=\"" + name + "\" "), String::npos) << xml;
+}
+
+TEST_F(HardTextsTest, ATextOfFourThousandCharactersIsRefusedWhereItsColumnIsShorterAndStoredWhereNot) {
+  const String longText(4000, 'x');
+  auto role = connected<Role>();
+  role.Name(longText);
+  EXPECT_FALSE(role.Save());
+  EXPECT_EQ(role.errNumber(), number::range);
+  auto group = connected<userGroup>();
+  group.Name("G");
+  group.description(longText);
+  EXPECT_FALSE(group.Save());
+  EXPECT_EQ(group.errNumber(), number::range);
+  EXPECT_EQ(tables_.text("select count(*) from ItemGroups"), "0");
+  EXPECT_FALSE(role.GetOne(2, longText));
+  EXPECT_EQ(role.errNumber(), messageNumber(1201));
+  tables_.run(
+      "insert into users(userName,userLogin,uType,accstate) values('r','r',2,2)"
+      "insert into QVUserRegInfo(UserId,userDesc) select userId,replicate('x',4000) from users where userName='r'");
+  auto users = connected<Users>();
+  ASSERT_TRUE(users.GetAllReg()) << users.errDescription();
+  EXPECT_EQ(users.Item("r")->RegUserDesc(), longText);
+}
+
+}  // namespace
+}  // namespace QVSa
