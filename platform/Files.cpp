@@ -16,29 +16,18 @@ namespace {
 
 class Descriptor {
  public:
-  Descriptor(const std::filesystem::path& path, int flags) : handle_(::open(path.c_str(), flags | O_CLOEXEC, 0666)) {}
+  Descriptor(const std::filesystem::path& path, int flags) : handle_(::open(path.c_str(), flags | O_CLOEXEC)) {}
   Descriptor(const Descriptor&) = delete;
   Descriptor& operator=(const Descriptor&) = delete;
-  ~Descriptor() { close(); }
+  ~Descriptor() {
+    if (isOpen()) ::close(handle_);
+  }
 
   bool isOpen() const { return handle_ >= 0; }
   int handle() const { return handle_; }
-  bool close() { return handle_ < 0 || ::close(std::exchange(handle_, -1)) == 0; }
 
  private:
   int handle_;
-};
-
-// A file under a passing name: removed at the end, where it was not renamed before.
-class PassingFile {
- public:
-  explicit PassingFile(std::filesystem::path path) : path_(std::move(path)) {}
-  PassingFile(const PassingFile&) = delete;
-  PassingFile& operator=(const PassingFile&) = delete;
-  ~PassingFile() { ::unlink(path_.c_str()); }
-
- private:
-  std::filesystem::path path_;
 };
 
 bool folderExists(const std::filesystem::path& file) {
@@ -61,13 +50,12 @@ bool folderExists(const std::filesystem::path& file) {
   }
 }
 
-void writeAll(const Descriptor& file, const Bytes& content, const std::filesystem::path& path) {
-  for (std::size_t written = 0; written < content.size();) {
-    const ssize_t count = ::write(file.handle(), content.data() + written, content.size() - written);
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) fail(path);
-    written += static_cast<std::size_t>(count);
-  }
+// The target is replaced and not opened, so its own permission has to be asked for.
+void requireWritable(const std::filesystem::path& target) {
+  struct stat state {};
+  if (::stat(target.c_str(), &state) != 0) return;
+  if (!S_ISREG(state.st_mode)) throw runtimeFailure(number::pathAccess);
+  if (::access(target.c_str(), W_OK) != 0) fail(target);
 }
 
 std::filesystem::path nameBeside(const std::filesystem::path& target) {
@@ -111,15 +99,36 @@ Bytes readFile(const String& path) {
 }
 
 void writeFile(const String& path, const Bytes& content) {
-  const std::filesystem::path target = localPath(path);
-  const std::filesystem::path beside = nameBeside(target);
-  Descriptor file(beside, O_WRONLY | O_CREAT | O_EXCL);
-  if (!file.isOpen()) fail(target);
-  const PassingFile passing(beside);
-  writeAll(file, content, target);
-  if (::fsync(file.handle()) != 0 || !file.close()) fail(target);
-  if (::rename(beside.c_str(), target.c_str()) != 0) fail(target);
-  syncFolderOf(target);
+  NewFile file(path);
+  file.write({reinterpret_cast<const char*>(content.data()), content.size()});
+  file.keep();
+}
+
+NewFile::NewFile(const String& path) : target_(localPath(path)), beside_(nameBeside(target_)) {
+  requireWritable(target_);
+  handle_ = ::open(beside_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
+  if (handle_ < 0) fail(target_);
+}
+
+NewFile::~NewFile() {
+  if (handle_ < 0) return;
+  ::close(handle_);
+  ::unlink(beside_.c_str());
+}
+
+void NewFile::write(std::string_view bytes) {
+  while (!bytes.empty()) {
+    const ssize_t count = ::write(handle_, bytes.data(), bytes.size());
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) fail(target_);
+    bytes.remove_prefix(static_cast<std::size_t>(count));
+  }
+}
+
+void NewFile::keep() {
+  if (::fsync(handle_) != 0 || ::rename(beside_.c_str(), target_.c_str()) != 0) fail(target_);
+  ::close(std::exchange(handle_, -1));
+  syncFolderOf(target_);
 }
 
 }  // namespace QVSa::platform

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <filesystem>
+#include <string_view>
 
 #include "QVSa/frame/Values.h"
 
@@ -9,10 +10,31 @@ namespace QVSa::platform {
 // A path as texts of the system hold it: "\" and "/" both separate. Texts that go to the database stay as they are.
 std::filesystem::path localPath(const String& path);
 
-// Whole files in binary. Throw Failure with the run-time's numbers: 53 file not found, 76 path not found, 70 access
-// denied, 75 path/file access.
+// All of these throw Failure with the run-time's numbers: 53 file not found, 76 path not found, 70 access denied, 75
+// path/file access.
+
+// A whole file in binary.
 Bytes readFile(const String& path);
-// Writes beside the target, then renames: the file is complete or not there.
+// The file is complete or not there, as NewFile has it.
 void writeFile(const String& path, const Bytes& content);
+
+// A file that is written piece by piece beside its target and takes its place at the end: nobody ever sees a part of
+// it. A target that is there and can't be written, or is no plain file, is refused at once.
+class NewFile {
+ public:
+  explicit NewFile(const String& path);
+  // What was not kept is gone, and the target as it was.
+  ~NewFile();
+  NewFile(const NewFile&) = delete;
+  NewFile& operator=(const NewFile&) = delete;
+
+  void write(std::string_view bytes);
+  void keep();
+
+ private:
+  std::filesystem::path target_;
+  std::filesystem::path beside_;
+  int handle_;
+};
 
 }  // namespace QVSa::platform

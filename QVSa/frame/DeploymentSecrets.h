@@ -24,6 +24,10 @@ inline constexpr const char* connPwdTail = "_k3Zt";
 inline constexpr std::array<unsigned char, 10> rotatedKeyCharacters{0x4B, 0x39, 0x74, 0x5F, 0x52,
                                                                     0x32, 0x78, 0x2D, 0x4D, 0x6A};
 
+// The key of the passwords that protect report templates, and the password of a template that nobody gave one.
+inline constexpr const char* templatePwdKey = "+2741Wq$53";
+inline constexpr const char* defaultTemplatePwd = "HoBart";
+
 }  // namespace QVSa::secrets
 
 #endif

@@ -32,8 +32,9 @@ void Recordset::Open(const String& Source, Connection& ActiveConnection, Long Cu
   const bool updatable = canUpdate(cursorType_, lockType_);
   BatchResult result = ActiveConnection.run(Source, updatable);
   if (!result.rows) return;
-  start(ActiveConnection.attach(std::move(result.rows)),
-        ActiveConnection.CursorLocation() == clientCursor || cursorType_ == staticCursor);
+  // A dynamic cursor is neither counted nor walked back, so the client keeps nothing of it, however many rows it has.
+  const bool atClient = ActiveConnection.CursorLocation() == clientCursor && cursorType_ != dynamic;
+  start(ActiveConnection.attach(std::move(result.rows)), atClient || cursorType_ == staticCursor);
   updatable_ = updatable;
 }
 

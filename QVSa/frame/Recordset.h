@@ -48,7 +48,8 @@ class Field {
 };
 
 // A row set, by ADO's names: forward-only and streaming by default. With a static cursor, or on a connection whose
-// cursor location is the client, it keeps its rows as they come, to be counted and walked back.
+// cursor location is the client, it keeps its rows as they come, to be counted and walked back; with a dynamic cursor
+// it streams in any case.
 // Throws 0x800A0E78 on a closed one, 0x800A0CC1 for a field that it does not have.
 class Recordset {
  public:

@@ -9,8 +9,6 @@ EmbeddedRows::EmbeddedRows(EmbeddedSession& session, std::shared_ptr<Plan> plan,
   // The first row is fetched at once, so that a statement that fails does so when it is run.
   advance();
   session.attach(*this);
-  // A row set that is written back has the rows that it was opened with.
-  if (step_.updatable) buffer();
 }
 
 EmbeddedRows::~EmbeddedRows() {

@@ -27,8 +27,9 @@ class Ground {
   Lines tables() const {
     const PlainSession session(server());
     Lines result;
-    for (const char* table : {"users", "userPwdHis", "userJob", "GrpUser", "agentuser", "saferule", "seslog",
-                              "departments", "jobs", "idRule", "idRec", "idDel", "QVSys..idRec"})
+    for (const char* table :
+         {"users", "userPwdHis", "userJob", "GrpUser", "agentuser", "saferule", "seslog", "departments", "jobs",
+          "idRule", "idRec", "idDel", "QVSys..idRec", "syslog", "RptDirectory", "AclRule", "QVTmpSafe", "repTmps"})
       result.push_back(session.text(String("select * from ") + table));
     return result;
   }

@@ -1,40 +1,14 @@
 #include "tests/faults/Operations.h"
 
-#include <stdexcept>
-
 #include "QVSa/QVSa.h"
-#include "QVSa/resources/Messages.h"
 #include "platform/SecretMessage.h"
+#include "tests/faults/LogAndClassOperations.h"
+#include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
 
 namespace QVSa::test {
 
 namespace {
-
-void require(Boolean done) {
-  if (!done) throw std::logic_error("the ground of the test could not be made");
-}
-
-template <class Class>
-Operation operation(const char* name, std::function<void(Class&)> load,
-                    std::function<bool(Class&, const String& server)> run, std::vector<Report> reports = {},
-                    bool atomic = false) {
-  const auto prepare = [load, run](const String& server) -> std::function<Outcome()> {
-    auto object = std::make_shared<Class>();
-    object->connect(server, "QVApp");
-    load(*object);
-    return [object, run, server] {
-      const bool positive = run(*object, server);
-      return Outcome{positive, object->errNumber(), object->errDescription()};
-    };
-  };
-  return {name, prepare, std::move(reports), atomic};
-}
-
-template <class Class>
-void nothing(Class&) {}
-
-std::vector<Report> told(Long messageId, const String& blank = "") { return {{"", LoadResString(messageId) + blank}}; }
 
 void loadAnn(User& user) { require(user.GetOne(3, "ann")); }
 
@@ -233,12 +207,14 @@ void fillGround(const String& server) {
   inv.connect(server, "QVApp");
   for (const char* record : {"r1", "r2"}) require(!inv.newId("inv", "", -1, record, "s1").empty());
   tables.run("update idDel set rcId=null where theId='I001'");
+  fillLogAndClasses(server);
 }
 
 const std::vector<Operation>& operations() {
   static const std::vector<Operation> all = [] {
     std::vector<Operation> result;
-    for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations()})
+    for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations(),
+                      logAndClassOperations()})
       result.insert(result.end(), part.begin(), part.end());
     return result;
   }();

@@ -46,6 +46,18 @@ TEST_F(RecordsetTest, StreamsRowByRow) {
   EXPECT_EQ(join(names, " "), "first second third");
 }
 
+TEST_F(RecordsetTest, ADynamicCursorStreamsAtTheClientToo) {
+  Connection atClient;
+  atClient.CursorLocation(3);
+  atClient.Open("data source=db1");
+  Recordset rows;
+  rows.Open("jobs", atClient, 2, 3);
+  rows.MoveNext();
+  EXPECT_EQ(rows.RecordCount(), -1);
+  EXPECT_EQ(server.fetchedRows, 2);
+  EXPECT_EQ(failureOf([&] { rows.MoveFirst(); }), number::context);
+}
+
 TEST_F(RecordsetTest, FieldsAreFoundByNameOrPosition) {
   Recordset rows = connection.Execute("jobs");
   EXPECT_EQ(rows.fieldCount(), 4U);

@@ -1,0 +1,126 @@
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+
+#include "tests/syslog/LogInstallation.h"
+
+namespace QVSa {
+namespace {
+
+class LogExport : public test::LogInstallation {
+ protected:
+  String path(const String& name) const { return (folder_.path() / name).string(); }
+
+  String content(const String& name) const {
+    std::stringstream text;
+    text << std::ifstream(path(name), std::ios::binary).rdbuf();
+    return text.str();
+  }
+
+  void writeThree() const {
+    const String columns = ",UserName,UserLogin,computer,FuncName,OpDesc";
+    write("a", "20240305 10:20:45", columns, ",N'Zoë','zoe','pc','f',N'5 € – 中'", 1);
+    write("b", "20240306", columns, ",'Bob','bob',null,'g','a' ", 2);
+    write("c", "20240307", "", "", 5);
+  }
+
+  String left() const { return db_.text("select logId from syslog order by logId"); }
+
+  test::TestFolder folder_;
+};
+
+TEST_F(LogExport, IsALineAnEntryInTheSystemsCodePage) {
+  writeThree();
+  EXPECT_TRUE(log_.saveLog(path("log.txt"))) << log_.errDescription();
+  EXPECT_EQ(content("log.txt"),
+            "\r\n2024-03-05 10:20:45\tZo\xEB\tzoe\t1\tpc\tf\t5 \x80 \x96 ?"
+            "\r\n2024-03-06 00:00:00\tBob\tbob\t2\t\tg\ta"
+            "\r\n2024-03-07 00:00:00\t\t\t5\t\t\t");
+}
+
+TEST_F(LogExport, TakesOneTypeOrAll) {
+  writeThree();
+  const auto lines = [&](Long type) {
+    EXPECT_TRUE(log_.saveLog(path("log.txt"), &type));
+    const String text = content("log.txt");
+    return std::count(text.begin(), text.end(), '\n');
+  };
+  EXPECT_EQ(lines(1), 1);
+  EXPECT_EQ(lines(3), 0);
+  EXPECT_EQ(content("log.txt"), "");
+  EXPECT_EQ(lines(4), 3);
+  EXPECT_EQ(lines(0), 3);
+}
+
+TEST_F(LogExport, LeavesTheOldFileWhereItCannotBeDone) {
+  writeThree();
+  std::ofstream(path("log.txt")) << "old";
+  db_.run("update syslog set OpDesc=replicate('x',3000)");
+  std::filesystem::create_directory(path("taken"));
+  EXPECT_FALSE(log_.saveLog(path("taken")));
+  EXPECT_EQ(log_.errNumber(), number::pathAccess);
+  EXPECT_EQ(log_.errDescription(), "Error in saving system log." + runtimeFailure(number::pathAccess).description());
+  EXPECT_FALSE(log_.saveLog(path("missing/log.txt")));
+  EXPECT_EQ(log_.errNumber(), number::noPath);
+  db_.run("drop table syslog");
+  EXPECT_FALSE(log_.saveLog(path("log.txt")));
+  EXPECT_EQ(log_.errNumber(), number::noTable);
+  EXPECT_EQ(content("log.txt"), "old");
+}
+
+TEST_F(LogExport, HoldsEveryRowOfManyInOrder) {
+  write("a", "20240305", ",OpDesc", ",'0'");
+  for (int doubling = 0; doubling < 13; ++doubling)
+    db_.run(
+        "insert into syslog(logId,logtype,LogTime,OpDesc) select logId,0,LogTime,(select count(*) from syslog)+OpDesc"
+        " from syslog");
+  ASSERT_TRUE(log_.saveLog(path("log.txt")));
+  const String text = content("log.txt");
+  std::size_t at = 0;
+  int row = 0;
+  for (; at < text.size(); ++row) {
+    const String line = "\r\n2024-03-05 00:00:00\t\t\t0\t\t\t" + std::to_string(row);
+    ASSERT_EQ(text.compare(at, line.size(), line), 0) << row;
+    at += line.size();
+  }
+  EXPECT_EQ(row, 8192);
+}
+
+TEST_F(LogExport, ClearingDeletesOneTypeOrAll) {
+  writeThree();
+  ASSERT_TRUE(log_.GetAll(1, Date::empty(), Date::empty(), 0, "", "", "", 0, 2));
+  Long type = 2;
+  EXPECT_TRUE(log_.clearLog(&type));
+  EXPECT_EQ(left(), "a\nc");
+  EXPECT_EQ(log_.begin(), log_.end());
+  type = 4;
+  EXPECT_TRUE(log_.clearLog(&type));
+  EXPECT_EQ(left(), "");
+}
+
+TEST_F(LogExport, ClearingExportsFirstWhereToldToAndDeletesWhateverComesOfIt) {
+  writeThree();
+  const Boolean yes = true;
+  const Boolean no = false;
+  const String file = path("log.txt");
+  const String unwritable = path("missing/log.txt");
+  Long type = 1;
+  EXPECT_TRUE(log_.clearLog(&type, &no, &file));
+  EXPECT_FALSE(std::filesystem::exists(file));
+  EXPECT_EQ(log_.errNumber(), 0);
+  type = 2;
+  EXPECT_TRUE(log_.clearLog(&type, &yes, &file));
+  EXPECT_EQ(content("log.txt"), "\r\n2024-03-06 00:00:00\tBob\tbob\t2\t\tg\ta");
+  EXPECT_TRUE(log_.clearLog(nullptr, &yes, &unwritable));
+  EXPECT_EQ(left(), "");
+  EXPECT_EQ(log_.errNumber(), number::noPath);
+  EXPECT_EQ(log_.errDescription().find("Error in saving system log."), 0U);
+
+  db_.run("drop table syslog");
+  EXPECT_FALSE(log_.clearLog());
+  EXPECT_EQ(log_.errNumber(), number::noTable);
+  EXPECT_EQ(log_.errDescription().find("Error in deleting system log."), 0U);
+}
+
+}  // namespace
+}  // namespace QVSa
