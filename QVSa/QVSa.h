@@ -8,3 +8,4 @@
 #include "QVSa/numbering/IdMgr.h"
 #include "QVSa/numbering/IdMgrs.h"
 #include "QVSa/organisation/Department.h"
+#include "QVSa/settings/Home.h"

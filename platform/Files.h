@@ -1,7 +1,9 @@
 #pragma once
 
 #include <filesystem>
+#include <optional>
 
+#include "QVSa/frame/Date.h"
 #include "QVSa/frame/Values.h"
 
 namespace QVSa::platform {
@@ -14,5 +16,9 @@ std::filesystem::path localPath(const String& path);
 Bytes readFile(const String& path);
 // Writes beside the target, then renames: the file is complete or not there.
 void writeFile(const String& path, const Bytes& content);
+// When the file was last modified, in the machine's local time; nothing where there is none.
+std::optional<Date> lastModified(const String& path);
+// Deletes the file; one that is not there is no failure. Throws as readFile does.
+void deleteFile(const String& path);
 
 }  // namespace QVSa::platform
