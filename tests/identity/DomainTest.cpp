@@ -27,7 +27,7 @@ class DomainTest : public test::Scene {
     Home home = connected<Home>();
     home.ldHost("127.0.0.1");
     home.ldBindDN("cn=service,dc=example,dc=org");
-    home.ldPasswd("Service-1");
+    home.ldPasswd("Reader-7");
     home.ldBaseDN("ou=people,dc=example,dc=org");
     ASSERT_TRUE(home.Save()) << home.errDescription();
   }

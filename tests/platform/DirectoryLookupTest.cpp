@@ -26,7 +26,7 @@ class DirectoryLookupTest : public ::testing::Test {
   }
   static void TearDownTestSuite() { slapd_.reset(); }
 
-  String find(const String& searchText, const String& password = "Service-1") {
+  String find(const String& searchText, const String& password = "Reader-7") {
     query_.searchText = searchText;
     return getUsersFromLD(query_, password, status_);
   }

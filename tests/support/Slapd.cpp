@@ -41,7 +41,7 @@ dn: cn=service,dc=example,dc=org
 objectClass: organizationalRole
 objectClass: simpleSecurityObject
 cn: service
-userPassword: Service-1
+userPassword: Reader-7
 
 dn: ou=people,dc=example,dc=org
 objectClass: organizationalUnit

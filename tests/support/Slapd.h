@@ -10,7 +10,7 @@ namespace QVSa::test {
 // A directory server on the loopback device, an ordinary process with its configuration and data in a folder of its
 // own:
 //   dc=example,dc=org
-//     cn=service                      password Service-1; may read everything
+//     cn=service                      password Reader-7
 //     ou=people   uid=ann             password Secret-1; "Ann Example", ann@example.org
 //                 uid=bob             "Bob (Sales) *\" of cn, no mail
 //     ou=empty
