@@ -19,5 +19,6 @@
 #include "QVSa/organisation/Users.h"
 #include "QVSa/organisation/userGroup.h"
 #include "QVSa/organisation/userGroups.h"
+#include "QVSa/settings/Home.h"
 #include "QVSa/syslog/LogRecord.h"
 #include "QVSa/syslog/LogRecords.h"

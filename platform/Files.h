@@ -1,8 +1,10 @@
 #pragma once
 
 #include <filesystem>
+#include <optional>
 #include <string_view>
 
+#include "QVSa/frame/Date.h"
 #include "QVSa/frame/Values.h"
 
 namespace QVSa::platform {
@@ -17,6 +19,10 @@ std::filesystem::path localPath(const String& path);
 Bytes readFile(const String& path);
 // The file is complete or not there, as NewFile has it.
 void writeFile(const String& path, const Bytes& content);
+// When the file was last modified, in the machine's local time; nothing where there is none.
+std::optional<Date> lastModified(const String& path);
+// Deletes the file; one that is not there is no failure. Throws as readFile does.
+void deleteFile(const String& path);
 
 // A file that is written piece by piece beside its target and takes its place at the end: nobody ever sees a part of
 // it. A target that is there and can't be written, or is no plain file, is refused at once.

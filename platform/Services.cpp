@@ -2,9 +2,12 @@
 
 #include <algorithm>
 #include <ctime>
+#include <filesystem>
 #include <syslog.h>
 #include <unistd.h>
 #include <utility>
+
+#include "platform/Ntlm.h"
 
 namespace QVSa::platform {
 
@@ -39,8 +42,14 @@ void writeEventLog(const String& text) {
   syslog(LOG_USER | LOG_ERR, "QVSa: %s", line.c_str());
 }
 
+String systemProgramFolder() {
+  std::error_code ignored;
+  return std::filesystem::read_symlink("/proc/self/exe", ignored).parent_path().string();
+}
+
 Services& current() {
-  static Services services{systemLocalTime, systemComputerName, writeEventLog};
+  static Services services{systemLocalTime,        systemComputerName,  writeEventLog,           systemProgramFolder,
+                           platform::openSettings, platform::ntlmLogon, platform::getUsersFromLD};
   return services;
 }
 

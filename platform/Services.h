@@ -4,6 +4,8 @@
 
 #include "QVSa/frame/Date.h"
 #include "QVSa/frame/Values.h"
+#include "platform/DirectoryLookup.h"
+#include "platform/SettingsStore.h"
 
 namespace QVSa::platform {
 
@@ -12,6 +14,13 @@ struct Services {
   std::function<Date()> localTime;              // the machine's local date and time
   std::function<String()> computerName;         // at most 128 characters, trimmed
   std::function<void(const String&)> eventLog;  // one line for the system's event log
+  std::function<String()> programFolder;        // of the running program, without a separator at its end
+  std::function<std::unique_ptr<SettingsKey>(const String& path)> openSettings;  // nothing where it can't be opened
+
+  // The packages that check the accounts whose password the library does not keep. One left empty is a package that
+  // this process does not have: every account that needs it is refused, as for a wrong password.
+  std::function<Boolean(const String& user, const String& domain, const String& password)> ntlmLogon;
+  std::function<String(const DirectoryQuery& query, const String& password, Integer& status)> getUsersFromLD;
 };
 
 const Services& services();

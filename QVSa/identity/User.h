@@ -10,7 +10,8 @@ class Department;
 class Users;
 class safeRule;
 
-// One user with his department, organisation, built-in roles and groups; sign-on and the change of passwords.
+// One user with his department, organisation, built-in roles and groups; sign-on, the change of passwords, and the
+// application for an account.
 //   User user;  user.connect(server, "QVApp");
 //   String session;  if (user.loginAuth("ann", password, &session)) ...
 // A plain save removes the user's jobs and re-writes his password: give the jobs back by setJobs, and load him first.
@@ -144,6 +145,15 @@ class User : private Frame {
   // Who is supervised by this user or by a job that he holds: ids, names and logins, not connected. No object on
   // failure, two of one name among them.
   std::shared_ptr<Users> getSubUsers();
+  // Applies for an account with the values of this object: stored as a user in state 2, who can't sign on before the
+  // audit, with the rest in a row for the auditor; a mail to the administrator is queued. An outside user goes to
+  // "_out", any other to "_root"; `deptName`, the unit that he names, then becomes his `company`. 0x80040BB8 against
+  // the policy, 0x8004044E name or login empty, 0x8004046A the row was not stored. The user stays stored where a later
+  // step fails.
+  Boolean Reg(const String& deptName = "", const String& desc = "");
+  // Accepts or refuses the application of `userId` (0: this user), in whatever state it is, and queues a mail to the
+  // address that this object holds: load the user first. `desc` goes to him.
+  Boolean regAudit(Boolean pass, const String& desc = "", Long userId = 0);
   // True for every text.
   Boolean chkRegPwd(const String& Pwd);
   // Records nothing and gives False.
@@ -175,11 +185,19 @@ class User : private Frame {
 
   Boolean testPassword(Connection& connection, const String& Pwd, Boolean* wrongPwd, Boolean authLd);
   void countFailure(Connection& connection);
+  Boolean isWindowsUser(const String& Pwd) const;
+  Boolean isInDirectory(Connection& connection, const String& Pwd, Boolean authLd);
+  void ldapBind(const String& host, Long port, const Variant& bindDn, const String& password, String& dn, Boolean& ok);
   Boolean fromPermittedAddress(const String& ipAddr) const;
   Boolean isLockedOut(const safeRule& rule);
   Boolean isExpired(Integer maxDay);
   void writePwd(const String& newPwd);
   Boolean digestMatches(const String& digest) const;
+
+  void insertRegInfo(Connection& connection, const String& deptName, const String& desc);
+  Boolean hasRegInfo(Connection& connection);
+  String administratorEmail(Connection& connection);
+  void queueMail(Connection& connection, const String& to, const String& subject, const String& body);
 
   Long Id_ = 0;
   Boolean idGiven_ = false;

@@ -1,7 +1,6 @@
 #include <algorithm>
 #include <limits>
 
-#include "QVSa/identity/DomainAuthentication.h"
 #include "QVSa/identity/IpRules.h"
 #include "QVSa/identity/Sessions.h"
 #include "QVSa/identity/User.h"
@@ -14,13 +13,11 @@ namespace QVSa {
 // The password stage of the load; False ends the load. A wrong password does not: it is counted here, so that the
 // counter moves in one place, and loginAuth decides later what to say.
 Boolean User::testPassword(Connection& connection, const String& Pwd, Boolean* wrongPwd, Boolean authLd) {
-  const DomainAuthentication& domain = domainAuthentication();
   if (uType_ == ldapUser) {
-    if (!domain.ldapBind || !domain.ldapBind(dn_, Pwd, authLd)) return refuse(1131);
+    if (!isInDirectory(connection, Pwd, authLd)) return refuse(1131);
     return true;
   }
-  const Boolean right =
-      uType_ == adUser ? domain.ntlmLogon && domain.ntlmLogon(Login_, Domain_, Pwd) : Pwd == Pwd_.text();
+  const Boolean right = uType_ == adUser ? isWindowsUser(Pwd) : Pwd == Pwd_.text();
   if (right) {
     lgts_ = 0;
     connection.Execute("update users set lgts=0 where userId=" + text(Id_));

@@ -2,7 +2,7 @@
 #include <gtest/gtest.h>
 #include <map>
 
-#include "QVSa/identity/DomainAuthentication.h"
+#include "QVSa/frame/ConnectionString.h"
 #include "QVSa/identity/User.h"
 #include "QVSa/resources/Messages.h"
 #include "platform/SecretMessage.h"
@@ -33,7 +33,7 @@ const char* const lock =
 // 2024.
 class UserTest : public ::testing::Test {
  protected:
-  UserTest() : services_(platform::services()), packages_(domainAuthentication()) {
+  UserTest() : services_(platform::services()) {
     platform::Services services = services_;
     services.localTime = [] { return Date(2024, 3, 7, 23, 0, 0); };
     platform::replaceServices(services);
@@ -52,10 +52,7 @@ class UserTest : public ::testing::Test {
     answer("select * from sesLog", "sesId", {});
     user_.connect("host", "QVApp");
   }
-  ~UserTest() override {
-    replaceDomainAuthentication(packages_);
-    platform::replaceServices(services_);
-  }
+  ~UserTest() override { platform::replaceServices(services_); }
 
   void answer(const String& statement, const char* column, const std::vector<Variant>& values) {
     FakeTable table{{{column}}, {}};
@@ -91,8 +88,14 @@ class UserTest : public ::testing::Test {
   }
   bool sent(const String& statement) const { return std::count(server_.log.begin(), server_.log.end(), statement) > 0; }
 
+  template <class Package>
+  static void replace(Package platform::Services::*member, Package package) {
+    platform::Services services = platform::services();
+    services.*member = std::move(package);
+    platform::replaceServices(services);
+  }
+
   platform::Services services_;
-  DomainAuthentication packages_;
   FakeServer server_;
   std::map<String, Variant> ann_;
   User user_;
@@ -119,7 +122,7 @@ TEST_F(UserTest, ALoadFillsRolesGroupsAndTheOrganisation) {
 
 TEST_F(UserTest, ADomainAccountIsCountedAsAWrongPasswordWhereNoPackageAnswers) {
   ann_["uType"] = Integer{adUser};
-  replaceDomainAuthentication({});
+  replace(&platform::Services::ntlmLogon, {});
   EXPECT_FALSE(signOn("right"));
   EXPECT_EQ(user_.errNumber(), messageNumber(1123));
   EXPECT_TRUE(sent(countFailure));
@@ -131,10 +134,9 @@ TEST_F(UserTest, ADomainAccountIsAskedOfItsPackageAndNeverExpires) {
   ann_["uType"] = Integer{adUser};
   ann_["domain"] = "CORP";
   answerPolicy(1, false);
-  replaceDomainAuthentication({[](const String& user, const String& domain, const String& password) {
-                                 return user == "ann" && domain == "CORP" && password == "theirs";
-                               },
-                               {}});
+  replace(&platform::Services::ntlmLogon, {[](const String& user, const String& domain, const String& password) {
+    return user == "ann" && domain == "CORP" && password == "theirs";
+  }});
   answer("select preFix,ymdStyle,noStyle,reuseStyle,ymd=getdate() from idRule where idName=N'_ses'", "preFix", {});
   EXPECT_FALSE(signOn("theirs")) << "nothing but the number of the session is missing";
   EXPECT_EQ(user_.errNumber(), messageNumber(1502));
@@ -142,20 +144,43 @@ TEST_F(UserTest, ADomainAccountIsAskedOfItsPackageAndNeverExpires) {
   EXPECT_FALSE(sent(countFailure));
 }
 
-TEST_F(UserTest, ADirectoryAccountMovesNoCounter) {
+TEST_F(UserTest, ADirectoryAccountIsBoundAndMovesNoCounter) {
   ann_["uType"] = Integer{ldapUser};
   ann_["ldDn"] = "cn=ann";
-  replaceDomainAuthentication({});
-  EXPECT_FALSE(signOn("right"));
-  EXPECT_EQ(user_.errNumber(), messageNumber(1131));
-  EXPECT_EQ(server_.log, (Log{"open", "set nocount on", readAnn, "close"}));
+  const String readDirectory =
+      "select ldHost=isnull(ldHost,''),ldPort=isnull(ldPort,389),ldBaseDN=isnull(ldBaseDN,''),"
+      "ldBindDN=isnull(ldBindDN,''),ldPasswd=isnull(ldPasswd,'') from homeInfo where id=1 and ldEnable=1";
+  std::vector<String> asked;
+  String users;
+  replace(&platform::Services::getUsersFromLD, {[&](const platform::DirectoryQuery& query, const String& password,
+                                                    Integer&) {
+    asked.push_back(query.host + ":" + text(query.port) + " " + query.bindDn + " " + password + " " + query.searchText);
+    return users;
+  }});
 
-  answerPolicy(1, false);
-  replaceDomainAuthentication({{}, [](const String& dn, const String& password, Boolean authLd) {
-                                 return dn == "cn=ann" && password == "theirs" && !authLd;
-                               }});
-  EXPECT_TRUE(signOn("theirs"));
+  answer(readDirectory, "ldHost", {});
+  EXPECT_FALSE(signOn("theirs")) << "no directory is enabled";
+  EXPECT_EQ(user_.errNumber(), messageNumber(1131));
+  EXPECT_EQ(server_.log, (Log{"open", "set nocount on", readAnn, readDirectory, "close"}));
+
+  server_.answer(readDirectory, {{{"ldHost"}, {"ldPort"}, {"ldBaseDN"}, {"ldBindDN"}, {"ldPasswd"}},
+                                 {{"box", Long{636}, "dc=x", "cn=service", scrambleText("abc")}}});
+  EXPECT_FALSE(signOn("theirs")) << "nobody is found";
+  EXPECT_FALSE(signOn("")) << "a bind without a password proves nothing";
+  users = "somebody";
+  EXPECT_FALSE(signOn(""));
+  EXPECT_TRUE(signOn("theirs") || user_.errNumber() != messageNumber(1131));
   EXPECT_FALSE(sent("update users set lgts=0 where userId=5"));
+  EXPECT_TRUE(user_.GetOne(3, "ann", true, "theirs", nullptr, true)) << "the service account asks";
+  EXPECT_EQ(asked, (std::vector<String>{":0 cn=ann theirs cn=ann", "box:636 cn=ann theirs cn=ann",
+                                        "box:636 cn=ann theirs cn=ann", "box:636 cn=service abc cn=ann"}));
+
+  ann_["ldDn"] = Variant::null();
+  EXPECT_FALSE(signOn("theirs")) << "nor does one without a name";
+  EXPECT_TRUE(user_.GetOne(3, "ann", true, "", nullptr, true));
+  EXPECT_EQ(asked.back(), "box:636 cn=service abc cn=service");
+  replace(&platform::Services::getUsersFromLD, {});
+  EXPECT_FALSE(signOn("theirs")) << "no package";
 }
 
 TEST_F(UserTest, TheWrongPasswordThatReachesTheLimitIsReportedAsALock) {

@@ -1,0 +1,259 @@
+#include "QVSa/frame/ConnectionString.h"
+#include "QVSa/frame/Text.h"
+#include "QVSa/identity/User.h"
+#include "QVSa/settings/Home.h"
+#include "platform/SecretMessage.h"
+#include "tests/support/SettingsScene.h"
+
+namespace QVSa {
+namespace {
+
+struct TextSetting {
+  const char* column;
+  String (Home::*get)() const;
+  void (Home::*set)(String);
+};
+const TextSetting texts[] = {{"companyName", &Home::homeName, &Home::homeName},
+                             {"companyEnName", &Home::enName, &Home::enName},
+                             {"address", &Home::Address, &Home::Address},
+                             {"zip", &Home::zipcode, &Home::zipcode},
+                             {"tel", &Home::Tel, &Home::Tel},
+                             {"fax", &Home::Fax, &Home::Fax},
+                             {"email", &Home::Email, &Home::Email},
+                             {"webUrl", &Home::website, &Home::website},
+                             {"bankName", &Home::bankName, &Home::bankName},
+                             {"BankAccount", &Home::bankAccount, &Home::bankAccount},
+                             {"TaxNo", &Home::taxNo, &Home::taxNo},
+                             {"JPerson", &Home::jPerson, &Home::jPerson},
+                             {"attLimit", &Home::attLimit, &Home::attLimit},
+                             {"regPrompt", &Home::regPrompt, &Home::regPrompt},
+                             {"smtpServer", &Home::smtpServer, &Home::smtpServer},
+                             {"emailSender", &Home::emailSender, &Home::emailSender},
+                             {"emailAddress", &Home::emailAddress, &Home::emailAddress},
+                             {"emailSubject", &Home::emailSubject, &Home::emailSubject},
+                             {"emailContent", &Home::emailContent, &Home::emailContent},
+                             {"emailPContent", &Home::emailPContent, &Home::emailPContent},
+                             {"emailRContent", &Home::emailRContent, &Home::emailRContent},
+                             {"LDSName", &Home::ldServerName, &Home::ldServerName},
+                             {"LDHost", &Home::ldHost, &Home::ldHost},
+                             {"LDBaseDN", &Home::ldBaseDN, &Home::ldBaseDN},
+                             {"LDBindDN", &Home::ldBindDN, &Home::ldBindDN}};
+
+struct Flag {
+  const char* column;
+  Boolean (Home::*get)() const;
+  void (Home::*set)(Boolean);
+  Boolean onNull;
+};
+const Flag flags[] = {{"smState", &Home::SMIsOpen, &Home::SMIsOpen, false},
+                      {"savePwd", &Home::SavePwd, &Home::SavePwd, false},
+                      {"useOTPAuth", &Home::useOTPAuth, &Home::useOTPAuth, false},
+                      {"allowOuter", &Home::allowOuter, &Home::allowOuter, false},
+                      {"roleGrp", &Home::allowRoleGrp, &Home::allowRoleGrp, false},
+                      {"domainUser", &Home::allowDomainUser, &Home::allowDomainUser, false},
+                      {"autoRegUser", &Home::allowRegUser, &Home::allowRegUser, false},
+                      {"allowSendEmail", &Home::allowSendEmail, &Home::allowSendEmail, true},
+                      {"smtpState", &Home::allowSMTP, &Home::allowSMTP, false},
+                      {"smtpUseSSL", &Home::smtpUseSSL, &Home::smtpUseSSL, false},
+                      {"ldEnable", &Home::ldEnabled, &Home::ldEnabled, false}};
+
+class HomeTest : public test::SettingsScene {};
+
+TEST_F(HomeTest, EverySettingGoesRoundThroughItsOwnColumn) {
+  Home home = connected<Home>();
+  for (const TextSetting& setting : texts) (home.*setting.set)(String(setting.column) + " d'\xC3\x84");
+  for (const Flag& flag : flags) (home.*flag.set)(true);
+  home.AcctDay(25);
+  home.acctTime(-3);
+  home.timeOut(90000);
+  home.smtpPort(2525);
+  home.smtpAuth(2);
+  home.emailPassword("Mail-Secret");
+  home.ldPasswd("abc");
+  home.LoginNewsUrl("http://news");
+  home.loginTitle("Welcome");
+  ASSERT_TRUE(home.Save()) << home.errDescription();
+
+  const Home again = connected<Home>();
+  for (const TextSetting& setting : texts) {
+    EXPECT_EQ(stored(setting.column), String(setting.column) + " d'\xC3\x84");
+    EXPECT_EQ((again.*setting.get)(), String(setting.column) + " d'\xC3\x84") << setting.column;
+  }
+  EXPECT_EQ(again.AcctDay(), 25);
+  EXPECT_EQ(again.acctTime(), -3);
+  EXPECT_EQ(again.timeOut(), 90000);
+  EXPECT_EQ(again.smtpPort(), 2525);
+  EXPECT_EQ(again.smtpAuth(), 2);
+  EXPECT_EQ(again.emailPassword(), "Mail-Secret");
+  EXPECT_EQ(platform::decryptText(stored("emailPassword"), "smtpServer d'\xC3\x84"), "Mail-Secret");
+  EXPECT_EQ(stored("LDPasswd"), scrambleText("abc"));
+  EXPECT_EQ(stored("LoginNewsUrl+'|'+loginTitle"), "http://news|Welcome");
+  EXPECT_EQ(again.loginTitle(), "") << "getImage alone reads it";
+  EXPECT_EQ(plain_.text("select deptName,fullName from departments where deptNo='_root'"),
+            "companyName d'\xC3\x84|companyName d'\xC3\x84");
+}
+
+TEST_F(HomeTest, OnlyOneIsTrueAndEachFlagKnowsItsNull) {
+  for (const Flag& flag : flags) {
+    const String column = flag.column;
+    store(column + "=1");
+    EXPECT_TRUE((connected<Home>().*flag.get)()) << column;
+    for (const char* other : {"0", "-1", "2"}) {
+      store(column + "=" + other);
+      EXPECT_FALSE((connected<Home>().*flag.get)()) << column << " " << other;
+    }
+    store(column + "=null");
+    EXPECT_EQ((connected<Home>().*flag.get)(), flag.onNull) << column;
+  }
+}
+
+TEST_F(HomeTest, ANullReadsAsItsOwnDefaultAndFailsTheDaysOfAccount) {
+  store(
+      "ldEnable=1,companyName=null,timeOut=null,smtpPort=null,smtpAuth=null,emailPassword=null,LDHost=null,"
+      "LDport=null,LDPasswd=null");
+  const Home home = connected<Home>();
+  EXPECT_EQ(home.homeName() + home.ldHost() + home.emailPassword(), "");
+  EXPECT_EQ(home.timeOut(), 0);
+  EXPECT_EQ(home.smtpPort(), 25);
+  EXPECT_EQ(home.smtpAuth(), 0);
+  EXPECT_EQ(home.LDPort(), 389);
+
+  for (const char* column : {"AcctDay", "AcctTime"}) {
+    store(String(column) + "=null,companyName='Read before'");
+    Home failed;
+    EXPECT_FALSE(failed.connect(installation_.server()));
+    EXPECT_EQ(failed.errNumber(), number::type) << column;
+    EXPECT_EQ(failed.homeName(), "Read before");
+    store(String(column) + "=1");
+  }
+}
+
+TEST_F(HomeTest, ASaveKeepsANumberThatReadsFalse) {
+  store("savePwd=-1,smtpState=3");
+  Home home = connected<Home>();
+  ASSERT_TRUE(home.Save()) << home.errDescription();
+  EXPECT_EQ(stored("savePwd"), "-1");
+  EXPECT_EQ(stored("smtpState"), "3");
+  home.SavePwd(false);
+  ASSERT_TRUE(home.Save());
+  EXPECT_EQ(stored("savePwd"), "0");
+}
+
+TEST_F(HomeTest, ThePortOfTheDirectoryComesFromTheRowAlone) {
+  store("ldEnable=1,LDport=636,LDHost='box'");
+  Home home = connected<Home>();
+  home.LDPort(3269);
+  EXPECT_EQ(home.LDPort(), 636);
+  ASSERT_TRUE(home.Save());
+  EXPECT_EQ(stored("LDport"), "636");
+
+  store("ldEnable=0");
+  home = connected<Home>();
+  EXPECT_EQ(home.LDPort(), 389);
+  EXPECT_EQ(home.ldHost(), "") << "a directory that is not enabled is not loaded";
+  ASSERT_TRUE(home.Save());
+  EXPECT_EQ(stored("LDHost"), "") << "and the save writes that";
+  EXPECT_EQ(stored("LDport"), "389");
+}
+
+TEST_F(HomeTest, AnotherMailServerReadsThePasswordOnlyAfterASave) {
+  Home home = connected<Home>();
+  home.smtpServer("first");
+  home.emailPassword("Mail-Secret");
+  ASSERT_TRUE(home.Save());
+  store("smtpServer='second'");
+  EXPECT_NE(connected<Home>().emailPassword(), "Mail-Secret");
+  home.smtpServer("second");
+  ASSERT_TRUE(home.Save());
+  EXPECT_EQ(connected<Home>().emailPassword(), "Mail-Secret");
+}
+
+TEST_F(HomeTest, AMissingRowGivesDefaultsAndIsNotMadeByASave) {
+  plain_.run("delete from homeinfo");
+  Home home;
+  home.homeName("left over");
+  home.SMIsOpen(true);
+  EXPECT_TRUE(home.connect(installation_.server(), "QVApp"));
+  EXPECT_EQ(home.homeName(), "");
+  EXPECT_EQ(home.AcctDay(), 1);
+  EXPECT_EQ(home.acctTime(), 1);
+  EXPECT_FALSE(home.SMIsOpen());
+  EXPECT_TRUE(home.allowSendEmail());
+  EXPECT_EQ(home.LDPort(), 389);
+
+  const String root = plain_.text("select deptName from departments where deptNo='_root'");
+  home.homeName("New name");
+  EXPECT_FALSE(home.Save());
+  EXPECT_EQ(home.errNumber(), number::statement);
+  EXPECT_EQ(plain_.text("select count(*) from homeinfo"), "0");
+  EXPECT_EQ(plain_.text("select deptName from departments where deptNo='_root'"), root);
+}
+
+TEST_F(HomeTest, AFailedSaveLeavesNothingAndTellsNoPassword) {
+  Home home = connected<Home>();
+  home.emailPassword("Mail-Secret");
+  home.ldPasswd("abc");
+  home.Fax("not stored");
+  test::PlainSession(installation_.server(), "QVSys").run("drop table departments");
+  EXPECT_FALSE(home.Save()) << "the root department can't be named";
+  EXPECT_EQ(home.errNumber(), number::noTable);
+  EXPECT_NE(stored("fax"), "not stored");
+
+  home = connected<Home>();
+  home.ldPasswd("abc");
+  // A value that holds a later token's text gets that value, quotes and all.
+  home.homeName("<ldPasswd>");
+  EXPECT_FALSE(home.Save());
+  EXPECT_EQ(home.errDescription().find(scrambleText("abc")), String::npos) << home.errDescription();
+  EXPECT_EQ(home.errDescription().find("abc"), String::npos);
+
+  home.homeName("Company");
+  home.ldPasswd("z;");
+  EXPECT_FALSE(home.Save()) << "what can't be scrambled is not stored";
+  EXPECT_EQ(home.errNumber(), number::argument);
+  EXPECT_FALSE(Home().Save()) << "not connected";
+}
+
+TEST_F(HomeTest, TheCountsOfTheSettingsScreenAreReadAtTheCall) {
+  Home home = connected<Home>();
+  EXPECT_FALSE(home.hasWorkFlow());
+  EXPECT_EQ(home.outerUserNum(), 0);
+  plain_.run("insert into ItemGroups (gName) values ('a') insert into ItemGroups (gName) values ('b')");
+  plain_.run("update users set isOuter=1 where userId=1");
+  plain_.run("insert into cfprocesses (pId,rtUid) values (1,'t1')");
+  EXPECT_EQ(home.roleGrpNum(), 2);
+  EXPECT_EQ(home.outerUserNum(), 1);
+  EXPECT_FALSE(connected<Home>().hasWorkFlow()) << "no template has the process";
+  plain_.run("insert into reptmps (rtUid) values ('t1')");
+  EXPECT_TRUE(connected<Home>().hasWorkFlow());
+
+  Home nowhere;
+  EXPECT_EQ(nowhere.roleGrpNum(), 0);
+  EXPECT_NE(nowhere.errNumber(), 0);
+}
+
+TEST_F(HomeTest, TheDirectoryIsAskedOnlyWhereItIsEnabled) {
+  String asked;
+  replace(&platform::Services::getUsersFromLD,
+          {[&](const platform::DirectoryQuery& query, const String& password, Integer& status) {
+            asked = query.host + " " + text(query.port) + " " + query.bindDn + " " + password + " " + query.searchText;
+            status = platform::directoryDone;
+            return String("a list");
+          }});
+  Home home = connected<Home>();
+  home.ldHost("box");
+  home.ldBindDN("cn=service");
+  home.ldPasswd("abc");
+  home.ldBaseDN("dc=example");
+  String items = "left over";
+  EXPECT_EQ(home.getUsersFromLDS(items), 3);
+  EXPECT_EQ(items, "");
+  EXPECT_EQ(asked, "");
+  home.ldEnabled(true);
+  EXPECT_EQ(home.getUsersFromLDS(items), 0);
+  EXPECT_EQ(items, "a list");
+  EXPECT_EQ(asked, "box 389 cn=service abc dc=example");
+}
+
+}  // namespace
+}  // namespace QVSa

@@ -1,0 +1,154 @@
+#include "tests/support/Slapd.h"
+
+#include <arpa/inet.h>
+#include <fstream>
+#include <signal.h>
+#include <spawn.h>
+#include <stdexcept>
+#include <sys/socket.h>
+#include <sys/wait.h>
+#include <unistd.h>
+#include <utility>
+#include <vector>
+
+namespace QVSa::test {
+
+namespace {
+
+constexpr const char* program = "/usr/sbin/slapd";
+
+constexpr const char* configuration = R"(
+include /etc/ldap/schema/core.schema
+include /etc/ldap/schema/cosine.schema
+include /etc/ldap/schema/inetorgperson.schema
+modulepath /usr/lib/ldap
+moduleload back_mdb
+pidfile FOLDER/slapd.pid
+database mdb
+maxsize 10485760
+suffix "dc=example,dc=org"
+directory FOLDER/data
+sizelimit size.soft=500 size.hard=500 size.prtotal=unlimited
+access to attrs=userPassword by anonymous auth by * none
+access to * by users read by * none
+)";
+
+constexpr const char* content = R"(dn: dc=example,dc=org
+objectClass: domain
+dc: example
+
+dn: cn=service,dc=example,dc=org
+objectClass: organizationalRole
+objectClass: simpleSecurityObject
+cn: service
+userPassword: Reader-7
+
+dn: ou=people,dc=example,dc=org
+objectClass: organizationalUnit
+ou: people
+
+dn: ou=empty,dc=example,dc=org
+objectClass: organizationalUnit
+ou: empty
+
+dn: uid=ann,ou=people,dc=example,dc=org
+objectClass: inetOrgPerson
+uid: ann
+cn: Ann
+sn: Example
+displayName: Ann Example
+mail: ann@example.org
+userPassword: Secret-1
+
+dn: uid=bob,ou=people,dc=example,dc=org
+objectClass: inetOrgPerson
+uid: bob
+cn: Bob (Sales) *\
+sn: Sales
+
+)";
+
+String manyEntries() {
+  String entries = "dn: ou=many,dc=example,dc=org\nobjectClass: organizationalUnit\nou: many\n\n";
+  for (int i = 0; i < Slapd::many; ++i) {
+    const String login = "user" + std::to_string(i);
+    entries += "dn: uid=" + login + ",ou=many,dc=example,dc=org\nobjectClass: inetOrgPerson\nuid: " + login +
+               "\ncn: " + login + "\nsn: " + login + "\n\n";
+  }
+  return entries;
+}
+
+sockaddr_in loopback(int port) {
+  sockaddr_in address{};
+  address.sin_family = AF_INET;
+  address.sin_port = htons(static_cast<std::uint16_t>(port));
+  address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+  return address;
+}
+
+Long freePort() {
+  const int socketHandle = ::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+  sockaddr_in address = loopback(0);
+  socklen_t size = sizeof address;
+  ::bind(socketHandle, reinterpret_cast<sockaddr*>(&address), size);
+  ::getsockname(socketHandle, reinterpret_cast<sockaddr*>(&address), &size);
+  ::close(socketHandle);
+  return ntohs(address.sin_port);
+}
+
+bool answers(Long port) {
+  const int socketHandle = ::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+  const sockaddr_in address = loopback(port);
+  const bool connected = ::connect(socketHandle, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0;
+  ::close(socketHandle);
+  return connected;
+}
+
+pid_t spawn(std::vector<String> words) {
+  std::vector<char*> arguments;
+  for (String& word : words) arguments.push_back(word.data());
+  arguments.push_back(nullptr);
+  pid_t process = 0;
+  if (posix_spawn(&process, arguments[0], nullptr, nullptr, arguments.data(), environ) != 0)
+    throw std::runtime_error("cannot start " + words[0]);
+  return process;
+}
+
+void write(const std::filesystem::path& path, String text, const String& folder) {
+  for (auto at = text.find("FOLDER"); at != String::npos; at = text.find("FOLDER")) text.replace(at, 6, folder);
+  std::ofstream(path) << text;
+}
+
+}  // namespace
+
+bool Slapd::isInstalled() { return ::access(program, X_OK) == 0; }
+
+Slapd::Slapd() : port_(freePort()) {
+  const std::filesystem::path& folder = folder_.path();
+  const String settings = folder / "slapd.conf";
+  const String entries = folder / "entries.ldif";
+  std::filesystem::create_directory(folder / "data");
+  write(settings, configuration, folder);
+  write(entries, content + manyEntries(), folder);
+  int status = 0;
+  waitpid(spawn({program, "-Tadd", "-f", settings, "-l", entries}), &status, 0);
+  if (status != 0) throw std::runtime_error("slapd takes its entries not");
+  process_ = spawn({program, "-f", settings, "-h", "ldap://127.0.0.1:" + std::to_string(port_) + "/", "-d", "0"});
+  for (int i = 0; i < 500 && !answers(port_); ++i) usleep(20'000);
+}
+
+Slapd::~Slapd() { stop(); }
+
+void Slapd::hang() const { ::kill(process_, SIGSTOP); }
+
+void Slapd::goOn() const { ::kill(process_, SIGCONT); }
+
+void Slapd::stop() {
+  const pid_t process = std::exchange(process_, 0);
+  if (process == 0) return;
+  ::kill(process, SIGCONT);
+  ::kill(process, SIGTERM);
+  waitpid(process, nullptr, 0);
+}
+
+}  // namespace QVSa::test

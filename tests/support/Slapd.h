@@ -1,0 +1,45 @@
+#pragma once
+
+#include <sys/types.h>
+
+#include "QVSa/frame/Values.h"
+#include "tests/support/TestInstallation.h"
+
+namespace QVSa::test {
+
+// A directory server on the loopback device, an ordinary process with its configuration and data in a folder of its
+// own:
+//   dc=example,dc=org
+//     cn=service                      password Reader-7
+//     ou=people   uid=ann             password Secret-1; "Ann Example", ann@example.org
+//                 uid=bob             "Bob (Sales) *\" of cn, no mail
+//     ou=empty
+//     ou=many     `many` users, more than one answer may hold
+// Only those who are bound may read.
+class Slapd {
+ public:
+  static constexpr int many = 600;
+  static bool isInstalled();
+
+  Slapd();
+  ~Slapd();
+  Slapd(const Slapd&) = delete;
+  Slapd& operator=(const Slapd&) = delete;
+
+  Long port() const { return port_; }
+  // It keeps its connections open, takes new ones, and answers nothing.
+  void hang() const;
+  void goOn() const;
+  void stop();
+
+ private:
+  TestFolder folder_;
+  Long port_;
+  pid_t process_ = 0;
+};
+
+}  // namespace QVSa::test
+
+// Ends a test where the directory server is not installed.
+#define QVSA_NEEDS_SLAPD() \
+  if (!QVSa::test::Slapd::isInstalled()) GTEST_SKIP() << "slapd is not installed (tools/install-packages.sh does it)"
