@@ -65,6 +65,8 @@ void EmbeddedRows::update(const std::vector<std::pair<std::size_t, Variant>>& ch
     throw Failure(number::readOnly, "QVSa",
                   "Current Recordset does not support updating. This may be a limitation of the provider, or of the "
                   "selected locktype.");
+  // The session would do so before it writes, and the row's key has to be at hand.
+  buffer();
   std::vector<std::pair<std::size_t, Value>> values;
   for (const auto& [ordinal, variant] : changes) {
     const auto column = step_.results.at(ordinal).tableColumn;
