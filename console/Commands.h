@@ -13,6 +13,9 @@ void addUsers(Console& console);
 void addNumbers(Console& console);
 void addPolicy(Console& console);
 void addImport(Console& console);
+void addLog(Console& console);
+void addClasses(Console& console);
+void addProtection(Console& console);
 void addDoctor(Console& console);
 
 }  // namespace QVSa::console

@@ -10,6 +10,9 @@ int main(int argc, char** argv) {
   QVSa::console::addUsers(console);
   QVSa::console::addNumbers(console);
   QVSa::console::addPolicy(console);
+  QVSa::console::addLog(console);
+  QVSa::console::addClasses(console);
+  QVSa::console::addProtection(console);
   QVSa::console::addDoctor(console);
   return console.main(argc, argv);
 }

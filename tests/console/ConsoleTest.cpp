@@ -1,61 +1,12 @@
-#include <cstdio>
-#include <fstream>
-#include <gtest/gtest.h>
-#include <sstream>
-#include <sys/wait.h>
-
-#include "QVSa/frame/Connection.h"
-#include "QVSa/frame/ConnectionString.h"
-#include "console/Answer.h"
-#include "tests/support/TestInstallation.h"
+#include "tests/console/Program.h"
 
 namespace QVSa::console {
 namespace {
 
-struct Outcome {
-  int exitCode = -1;
-  Json document;
-  String said;  // on the standard error
-  String error() const { return document["error"]["number"].get<String>(); }
-};
+using test::Outcome;
 
-// The program itself, run on an installation of its own that `qvsa init` made: Admin's password is Adm1n-first.
-class Program : public testing::Test {
+class Program : public test::Program {
  protected:
-  void SetUp() override { ASSERT_EQ(run("init", "Adm1n-first\nSa-first\n").exitCode, 0); }
-
-  String server() const { return "file:" + (folder_.path() / name_).string(); }
-
-  // Runs the program with --json and `input` on its standard input.
-  Outcome run(const String& arguments, const String& input = "") {
-    const auto inputFile = folder_.path() / "input";
-    const auto errorFile = folder_.path() / "error";
-    std::ofstream(inputFile) << input;
-    const String command = String(QVSA_CONSOLE) + " --json --server '" + server() + "' " + arguments + " <'" +
-                           inputFile.string() + "' 2>'" + errorFile.string() + "'";
-    FILE* pipe = popen(command.c_str(), "r");
-    String output;
-    char buffer[4096];
-    for (std::size_t count; (count = fread(buffer, 1, sizeof buffer, pipe)) > 0;) output.append(buffer, count);
-    const int status = pclose(pipe);
-    std::stringstream said;
-    said << std::ifstream(errorFile).rdbuf();
-    return {WEXITSTATUS(status), Json::parse(output, nullptr, false), said.str()};
-  }
-
-  void execute(const String& statement, const String& database = "QVSys") {
-    Connection connection;
-    connection.Open(buildConnString(server(), database, false));
-    connection.Execute(statement);
-  }
-
-  String value(const String& query, const String& database = "QVSys") {
-    Connection connection;
-    connection.Open(buildConnString(server(), database, false));
-    Recordset row = connection.Execute(query);
-    return row[0].asText();
-  }
-
   void addAnn() { ASSERT_EQ(run("user add ann 'Ann A'", "Ann-pass-1\n").exitCode, 0); }
   String signOn(const String& login, const String& password) {
     return run("sign-on " + login, password + "\n").document["session"].get<String>();
@@ -74,9 +25,6 @@ class Program : public testing::Test {
                 counts["unchanged"].dump() + counts["left"].dump() + " ";
     return result;
   }
-
-  test::TestFolder folder_;
-  String name_ = "installation";
 };
 
 TEST_F(Program, InitMakesAnInstallationWhoseAdministratorCanSignOn) {
