@@ -8,6 +8,11 @@ namespace QVSa::bench {
 void addUserPairs();
 void addNumberPairs();
 void addDepartmentPairs();
+void addLogPairs();
+void addClassPairs();
+
+// Prints how a day of the log is found, and the memory that an export of it takes.
+void tellLogFacts();
 
 // Throws what an object says about its last failure, unless `good`.
 template <class Object>

@@ -12,7 +12,10 @@ int main(int argc, char** argv) {
     QVSa::bench::addUserPairs();
     QVSa::bench::addNumberPairs();
     QVSa::bench::addDepartmentPairs();
+    QVSa::bench::addLogPairs();
+    QVSa::bench::addClassPairs();
     QVSa::bench::runPairs();
+    QVSa::bench::tellLogFacts();
     return 0;
   } catch (const std::exception& failure) {
     std::fprintf(stderr, "%s\n", failure.what());
