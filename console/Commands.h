@@ -16,6 +16,9 @@ void addImport(Console& console);
 void addLog(Console& console);
 void addClasses(Console& console);
 void addProtection(Console& console);
+void addSettings(Console& console);
+void addRegistration(Console& console);
+void addDirectory(Console& console);
 void addDoctor(Console& console);
 
 }  // namespace QVSa::console

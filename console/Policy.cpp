@@ -3,6 +3,7 @@
 
 #include "QVSa/identity/safeRule.h"
 #include "console/Commands.h"
+#include "console/Switch.h"
 #include "console/Table.h"
 
 namespace QVSa::console {
@@ -88,9 +89,9 @@ void addPolicy(Console& console) {
   number("--max-days", options->maxDay, "Days that a password is valid; 0: for ever");
   number("--history", options->cycle, "How many earlier passwords may not come again");
   number("--lock-after", options->errTimes, "Failed sign-ons in a row that lock an account; 0: never");
-  setCommand->add_flag("--mixed-case,!--no-mixed-case", options->caseMixed, "Capital and small letters");
-  setCommand->add_flag("--letters-and-digits,!--no-letters-and-digits", options->numCharMixed, "Letters and digits");
-  setCommand->add_flag("--other-characters,!--no-other-characters", options->hasSpecialChar, "Other characters");
+  addSwitch(setCommand, "mixed-case", options->caseMixed, "Capital and small letters");
+  addSwitch(setCommand, "letters-and-digits", options->numCharMixed, "Letters and digits");
+  addSwitch(setCommand, "other-characters", options->hasSpecialChar, "Other characters");
   console.command(setCommand, [&console, options] { return set(console, *options); });
 }
 

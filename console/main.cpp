@@ -13,6 +13,9 @@ int main(int argc, char** argv) {
   QVSa::console::addLog(console);
   QVSa::console::addClasses(console);
   QVSa::console::addProtection(console);
+  QVSa::console::addSettings(console);
+  QVSa::console::addRegistration(console);
+  QVSa::console::addDirectory(console);
   QVSa::console::addDoctor(console);
   return console.main(argc, argv);
 }

@@ -46,6 +46,14 @@ TEST_F(Program, InitShowsThePasswordsThatItMadeUp) {
   EXPECT_NE(made.document["saPassword"], made.document["adminPassword"]);
 }
 
+TEST_F(Program, APolicyKeepsWhatIsNotNamed) {
+  ASSERT_EQ(run("policy set --mixed-case --other-characters").exitCode, 0);
+  ASSERT_EQ(run("policy set --no-other-characters --min-length 3").exitCode, 0);
+  const Json policy = run("policy show").document;
+  EXPECT_EQ(policy["mixedCase"], true);
+  EXPECT_EQ(policy["otherCharacters"], false);
+}
+
 TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   const Outcome wrong = run("sign-on Admin", "wrong\n");
   EXPECT_EQ(wrong.exitCode, 1);

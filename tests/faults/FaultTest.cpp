@@ -28,8 +28,9 @@ class Ground {
     const PlainSession session(server());
     Lines result;
     for (const char* table :
-         {"users", "userPwdHis", "userJob", "GrpUser", "agentuser", "saferule", "seslog", "departments", "jobs",
-          "idRule", "idRec", "idDel", "QVSys..idRec", "syslog", "RptDirectory", "AclRule", "QVTmpSafe", "repTmps"})
+         {"users",        "userPwdHis", "userJob",   "GrpUser", "agentuser", "saferule",      "seslog",
+          "departments",  "jobs",       "idRule",    "idRec",   "idDel",     "QVSys..idRec",  "syslog",
+          "RptDirectory", "AclRule",    "QVTmpSafe", "repTmps", "homeinfo",  "QVUserRegInfo", "QVMailQ"})
       result.push_back(session.text(String("select * from ") + table));
     return result;
   }

@@ -3,6 +3,7 @@
 #include "QVSa/QVSa.h"
 #include "platform/SecretMessage.h"
 #include "tests/faults/LogAndClassOperations.h"
+#include "tests/faults/SettingsOperations.h"
 #include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
 
@@ -208,6 +209,7 @@ void fillGround(const String& server) {
   for (const char* record : {"r1", "r2"}) require(!inv.newId("inv", "", -1, record, "s1").empty());
   tables.run("update idDel set rcId=null where theId='I001'");
   fillLogAndClasses(server);
+  fillSettings(server);
 }
 
 const std::vector<Operation>& operations() {
@@ -215,6 +217,7 @@ const std::vector<Operation>& operations() {
     std::vector<Operation> result;
     for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations(),
                       logAndClassOperations()})
+                      settingsOperations()})
       result.insert(result.end(), part.begin(), part.end());
     return result;
   }();
