@@ -216,8 +216,7 @@ const std::vector<Operation>& operations() {
   static const std::vector<Operation> all = [] {
     std::vector<Operation> result;
     for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations(),
-                      logAndClassOperations()})
-                      settingsOperations()})
+                      logAndClassOperations(), settingsOperations()})
       result.insert(result.end(), part.begin(), part.end());
     return result;
   }();
