@@ -145,7 +145,7 @@ std::optional<Date> lastModified(const String& path) {
 
 void deleteFile(const String& path) {
   const std::filesystem::path target = localPath(path);
-  if (::unlink(target.c_str()) != 0 && errno != ENOENT) fail(target);
+  if (::unlink(target.c_str()) != 0 && errno != ENOENT && errno != ENOTDIR) fail(target);
 }
 
 }  // namespace QVSa::platform
