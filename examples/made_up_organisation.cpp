@@ -1,11 +1,13 @@
-// Writes departments.csv and users.csv of a made-up organisation, for the demonstration where no real one is at hand:
-// always the same, and of a real one's size: 839 departments up to 5 levels deep, 1,509 users.
+// Writes departments.csv, users.csv and holdings.csv of a made-up organisation, for the demonstration and the tests
+// where no real one is at hand: always the same, and of a real one's size: 839 departments up to 5 levels deep, 1,509
+// users, 6,281 holdings of 3 roles.
 //   made_up_organisation FOLDER
 
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <random>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -18,6 +20,7 @@ struct Department {
 
 constexpr std::size_t departmentCount = 839;
 constexpr int userCount = 1509;
+constexpr std::size_t holdingCount = 6281;
 constexpr int deepest = 5;
 constexpr std::size_t organisationCount = 9;
 
@@ -41,6 +44,21 @@ class Generator {
       char name[16];
       std::snprintf(name, sizeof name, "%04d", i);
       file << "user" << name << ",User " << name << "," << home(i).number << "\n";
+    }
+  }
+
+  // Nearly all are members; one in 40 maintains, one in 70 administers.
+  void holdings() {
+    std::ofstream file(folder_ / "holdings.csv");
+    file << "login,role,department\n";
+    std::set<std::string> written;
+    while (written.size() < holdingCount) {
+      char login[16];
+      std::snprintf(login, sizeof login, "user%04d", static_cast<int>(below(userCount)) + 1);
+      const std::size_t draw = below(280);
+      const char* const role = draw < 7 ? "Maintainer" : draw < 11 ? "Admin" : "Member";
+      const std::string line = std::string(login) + "," + role + "," + departments_[below(departments_.size())].number;
+      if (written.insert(line).second) file << line << "\n";
     }
   }
 
@@ -91,6 +109,7 @@ int main(int argc, char** argv) {
     Generator generator(argv[1]);
     generator.departments();
     generator.users();
+    generator.holdings();
     return 0;
   } catch (const std::exception& error) {
     std::fprintf(stderr, "made_up_organisation: %s\n", error.what());
