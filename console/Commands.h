@@ -10,6 +10,12 @@ void addSignOn(Console& console);
 void addSessions(Console& console);
 void addDepartments(Console& console);
 void addUsers(Console& console);
+void addRoles(Console& console);
+void addJobs(Console& console);
+void addGroups(Console& console);
+// These two add to the groups of addDepartments and addUsers.
+void addDepartmentLists(Console& console);
+void addUserLists(Console& console);
 void addNumbers(Console& console);
 void addPolicy(Console& console);
 void addImport(Console& console);

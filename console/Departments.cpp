@@ -1,7 +1,7 @@
 #include <memory>
 
-#include "QVSa/organisation/Department.h"
 #include "console/Commands.h"
+#include "console/Lookup.h"
 #include "console/Table.h"
 
 namespace QVSa::console {
@@ -16,18 +16,8 @@ struct Options {
   bool outer = false;
 };
 
-constexpr Integer byNumber = 1;
-
-Department load(const Console& console, const String& number) {
-  Department department;
-  console.connect(department);
-  if (!department.GetOne(byNumber, number))
-    throw Refusal(department.errDescription() + " (" + number + ")", department.errNumber());
-  return department;
-}
-
 Answer show(const Console& console, const String& number) {
-  const Department department = load(console, number);
+  const Department department = departmentOf(console, number);
   Sheet sheet;
   sheet.line("Number", "number", department.Id()).line("Name", "name", department.Name());
   sheet.line("Full name", "fullName", department.fullName()).line("Superior", "superior", department.Super());
@@ -48,7 +38,7 @@ Answer saved(const Console& console, const String& number, const String& sentenc
 Answer add(const Console& console, const Options& options) {
   Department department;
   console.connect(department);
-  if (department.GetOne(byNumber, options.number)) throw Refusal("Department " + options.number + " exists already.");
+  if (department.GetOne(1, options.number)) throw Refusal("Department " + options.number + " exists already.");
   department.Id(options.number);
   department.Name(options.name);
   department.Super(options.superior);
@@ -59,7 +49,7 @@ Answer add(const Console& console, const Options& options) {
 }
 
 Answer rename(const Console& console, const Options& options) {
-  Department department = load(console, options.number);
+  Department department = departmentOf(console, options.number);
   department.Name(options.name);
   require(department.Save(), department);
   return saved(console, options.number, "The department is renamed, with the full names of all below it.");
@@ -72,8 +62,8 @@ void refuseRing(const Department& department, const Department& superior) {
 }
 
 Answer move(const Console& console, const Options& options) {
-  Department department = load(console, options.number);
-  refuseRing(department, load(console, options.superior));
+  Department department = departmentOf(console, options.number);
+  refuseRing(department, departmentOf(console, options.superior));
   department.Super(options.superior);
   require(department.Save(), department);
   return saved(console, options.number, "The department is moved, with all below it.");
@@ -81,7 +71,7 @@ Answer move(const Console& console, const Options& options) {
 
 Answer remove(const Console& console, const String& number) {
   if (number == "_root" || number == "_out") throw Refusal("The department " + number + " belongs to the system.");
-  Department department = load(console, number);
+  Department department = departmentOf(console, number);
   require(department.Delete(), department);
   return {"Department " + number + " is removed, with its jobs.\n", {{"removed", number}}};
 }

@@ -1,10 +1,12 @@
+#include <map>
 #include <memory>
+#include <optional>
 
 #include "QVSa/identity/User.h"
 #include "QVSa/identity/safeRule.h"
 #include "QVSa/organisation/Department.h"
 #include "console/Commands.h"
-#include "console/OrganisationFiles.h"
+#include "console/HoldingsImport.h"
 #include "console/Passwords.h"
 #include "console/Progress.h"
 #include "console/Table.h"
@@ -17,13 +19,6 @@ namespace {
 struct Options {
   String folder;
   bool dryRun = false;
-};
-
-struct Tally {
-  int added = 0;
-  int changed = 0;
-  int unchanged = 0;
-  int left = 0;
 };
 
 // One run of the import. Each row is saved by itself: after a refusal the rows before it stay, and the import can be
@@ -53,6 +48,8 @@ class Import {
   bool treeIsEmpty_ = true;
   Tally departments_;
   Tally users_;
+  std::map<String, Long> userIds_;  // by login; 0 where the user is not stored
+  std::optional<HoldingsImport> holdings_;
   std::vector<String> left_;  // sentences about rows that differ and were not written
   String password_;           // of the new users
   bool passwordMadeUp_ = false;
@@ -71,6 +68,10 @@ Answer Import::run() {
       importUser(row);
       progress.step();
     }
+  }
+  if (!organisation_.holdings.empty()) {
+    holdings_.emplace(console_, organisation_.holdings, userIds_, dryRun_);
+    holdings_->run();
   }
   return answer();
 }
@@ -129,6 +130,7 @@ void Import::importUser(const UserRow& row) {
   } else {
     changeUser(row, user);
   }
+  userIds_[row.login] = user.Id();
 }
 
 void Import::addUser(const UserRow& row, User& user) {
@@ -156,8 +158,7 @@ void Import::changeUser(const UserRow& row, User& user) {
   require(department.GetOne(1, row.department), department);
   user.Name(row.name);
   user.setDept(department);
-  constexpr Boolean passwordIsNotNew = true;
-  save(row.login, user.Save(passwordIsNotNew), user);
+  saveKept(console_, user);
 }
 
 void Import::choosePassword() {
@@ -177,6 +178,11 @@ Answer Import::answer() const {
   };
   row("departments", departments_);
   row("users", users_);
+  if (holdings_) {
+    row("roles", holdings_->roles());
+    row("jobs", holdings_->jobs());
+    row("holdings", holdings_->holders());
+  }
   Answer result{table.text(), {{"dryRun", dryRun_}, {"counts", table.document()}, {"left", left_}}};
   for (const String& sentence : left_) result.text += sentence + "\n";
   if (dryRun_) result.text += "\nNothing was written.\n";
@@ -192,7 +198,8 @@ Answer Import::answer() const {
 void addImport(Console& console) {
   const auto options = std::make_shared<Options>();
   CLI::App* group = console.app().add_subcommand("import", "Bring in data")->require_subcommand(1);
-  CLI::App* command = group->add_subcommand("organisation", "Departments and users from departments.csv and users.csv");
+  CLI::App* command = group->add_subcommand(
+      "organisation", "Departments, users, roles and their holders from departments.csv, users.csv and holdings.csv");
   command->add_option("folder", options->folder, "The folder of the files")->required()->check(CLI::ExistingDirectory);
   command->add_flag("--dry-run", options->dryRun, "Tell what would be done, and write nothing");
   console.command(command, [&console, options] {

@@ -1,18 +1,52 @@
 #include "console/UserKeeping.h"
 
-#include "QVSa/frame/Connection.h"
-#include "QVSa/frame/ConnectionString.h"
+#include <algorithm>
+
+#include "QVSa/organisation/Jobs.h"
+#include "QVSa/organisation/userGroups.h"
 
 namespace QVSa::console {
 
 namespace {
 
-// No public class lists the jobs of a user yet, and guessing would cost him his jobs: hence the one statement here.
-bool holdsJobs(const Console& console, Long userId) {
-  Connection connection;
-  connection.Open(buildConnString(console.place().server, console.place().database, false));
-  Recordset row = connection.Execute("select count(*) from userJob where userId=" + std::to_string(userId));
-  return row[0].asLong() > 0;
+struct Membership {
+  std::shared_ptr<userGroup> group;
+  std::vector<String> members;
+};
+
+String jobsOf(const Console& console, Long userId) {
+  Jobs jobs;
+  console.connect(jobs);
+  require(jobs.GetAll("", "", userId), jobs);
+  std::vector<String> ids;
+  for (const auto& job : jobs) ids.push_back(text(job->Id()));
+  return join(ids, ",");
+}
+
+// The ids of <users><user id="12" .../>...</users>. No value holds a "<", so that the beginning of an element is plain.
+std::vector<String> idsIn(const String& xml) {
+  const String mark = "<user id=\"";
+  std::vector<String> ids;
+  for (std::size_t place = xml.find(mark); place != String::npos; place = xml.find(mark, place + 1)) {
+    const std::size_t start = place + mark.size();
+    ids.push_back(xml.substr(start, xml.find('"', start) - start));
+  }
+  return ids;
+}
+
+std::vector<Membership> membershipsOf(const Console& console, const User& user) {
+  if (user.grpName().empty()) return {};
+  userGroups groups;
+  console.connect(groups);
+  require(groups.GetAll(), groups);
+  std::vector<Membership> result;
+  for (const auto& group : groups) {
+    std::vector<String> members = idsIn(group->GetUsers());
+    require(group->errNumber() == 0, *group);
+    if (std::find(members.begin(), members.end(), text(user.Id())) != members.end())
+      result.push_back({group, std::move(members)});
+  }
+  return result;
 }
 
 // A stored password that can't be decrypted here reads as an empty one.
@@ -26,10 +60,24 @@ bool hasReadablePassword(const Console& console, const String& login) {
 }  // namespace
 
 String lossOfSave(const Console& console, const User& user) {
-  if (!user.builtIn() && holdsJobs(console, user.Id())) return "holds jobs, which would be lost";
-  if (user.grpName().find(',') != String::npos) return "is in several groups, of which all would be lost";
   if (!hasReadablePassword(console, user.Login())) return "has no password that can be read here; it would be lost";
   return "";
+}
+
+void saveKept(const Console& console, User& user) {
+  user.setJobs(jobsOf(console, user.Id()));
+  const std::vector<Membership> memberships = membershipsOf(console, user);
+  const String groupNames = user.grpName();
+  if (memberships.size() > 1) user.grpName("");
+  constexpr Boolean passwordIsNotNew = true;
+  require(user.Save(passwordIsNotNew), user);
+  if (memberships.size() < 2) return;
+  for (const auto& [group, members] : memberships) {
+    if (group->SetUsers(join(members, ","))) continue;
+    throw Refusal(
+        user.Login() + " is saved, but no longer in all of the groups " + groupNames + ": " + group->errDescription(),
+        group->errNumber());
+  }
 }
 
 }  // namespace QVSa::console

@@ -1,8 +1,7 @@
 #include <memory>
 
-#include "QVSa/identity/User.h"
-#include "QVSa/organisation/Department.h"
 #include "console/Commands.h"
+#include "console/Lookup.h"
 #include "console/Passwords.h"
 #include "console/Table.h"
 #include "console/UserKeeping.h"
@@ -18,15 +17,6 @@ struct Options {
   String email;
   String mobile;
 };
-
-constexpr Integer byLogin = 3;
-
-User load(const Console& console, const String& login) {
-  User user;
-  console.connect(user);
-  require(user.GetOne(byLogin, login), user);
-  return user;
-}
 
 String stateOf(const User& user) {
   switch (user.regState()) {
@@ -74,7 +64,7 @@ String joined(const Json& texts) {
 }
 
 Answer show(const Console& console, const String& login) {
-  const User user = load(console, login);
+  const User user = userOf(console, login);
   const Json roles = rolesOf(user);
   Sheet sheet;
   sheet.line("Login", "login", user.Login()).line("Name", "name", user.Name()).line("Id", "id", user.Id());
@@ -87,14 +77,6 @@ Answer show(const Console& console, const String& login) {
   Answer answer{sheet.text(), sheet.document()};
   answer.document["builtInRoles"] = roles;
   return answer;
-}
-
-Department departmentOf(const Console& console, const String& number) {
-  Department department;
-  console.connect(department);
-  if (!department.GetOne(1, number))
-    throw Refusal(department.errDescription() + " (" + number + ")", department.errNumber());
-  return department;
 }
 
 Answer add(const Console& console, const Options& options) {
@@ -113,13 +95,12 @@ Answer add(const Console& console, const Options& options) {
 }
 
 Answer unlock(const Console& console, const String& login) {
-  User user = load(console, login);
+  User user = userOf(console, login);
   if (!user.locked()) throw Refusal(login + " is not locked; the state of the account is: " + stateOf(user) + ".");
   const String loss = lossOfSave(console, user);
   if (!loss.empty()) throw Refusal(login + " can't be unlocked here: the user " + loss + ".");
   user.regState(0);
-  constexpr Boolean passwordIsNotNew = true;
-  require(user.Save(passwordIsNotNew), user);
+  saveKept(console, user);
   return {login + " is unlocked; the validity of the password begins anew.\n", {{"login", login}, {"unlocked", true}}};
 }
 
@@ -127,7 +108,9 @@ Answer unlock(const Console& console, const String& login) {
 
 void addUsers(Console& console) {
   const auto options = std::make_shared<Options>();
-  CLI::App* group = console.app().add_subcommand("user", "Show, add and unlock users")->require_subcommand(1);
+  CLI::App* group = console.app()
+                        .add_subcommand("user", "Show, list, add and unlock users, set their supervisors")
+                        ->require_subcommand(1);
 
   CLI::App* addCommand = group->add_subcommand("add", "Add a user; the password is asked for");
   addCommand->add_option("login", options->login)->required();
@@ -141,7 +124,7 @@ void addUsers(Console& console) {
   showCommand->add_option("login", options->login)->required();
   console.command(showCommand, [&console, options] { return show(console, options->login); });
 
-  CLI::App* unlockCommand = group->add_subcommand("unlock", "Open a locked account; password, group and jobs stay");
+  CLI::App* unlockCommand = group->add_subcommand("unlock", "Open a locked account; password, groups and jobs stay");
   unlockCommand->add_option("login", options->login)->required();
   console.command(unlockCommand, [&console, options] { return unlock(console, options->login); });
 }

@@ -7,7 +7,12 @@ int main(int argc, char** argv) {
   QVSa::console::addSignOn(console);
   QVSa::console::addSessions(console);
   QVSa::console::addDepartments(console);
+  QVSa::console::addDepartmentLists(console);
   QVSa::console::addUsers(console);
+  QVSa::console::addUserLists(console);
+  QVSa::console::addRoles(console);
+  QVSa::console::addJobs(console);
+  QVSa::console::addGroups(console);
   QVSa::console::addNumbers(console);
   QVSa::console::addPolicy(console);
   QVSa::console::addLog(console);

@@ -1,0 +1,66 @@
+#include "QVSa/organisation/Jobs.h"
+
+#include <memory>
+
+#include "QVSa/organisation/Departments.h"
+#include "console/Commands.h"
+#include "console/Lookup.h"
+#include "console/Table.h"
+
+namespace QVSa::console {
+
+namespace {
+
+struct Options {
+  String department;
+  bool below = false;
+  String role;
+  String login;
+  std::vector<Long> jobs;
+};
+
+Answer list(const Console& console, const Options& options) {
+  const Long userId = options.login.empty() ? 0 : userOf(console, options.login).Id();
+  Jobs jobs;
+  console.connect(jobs);
+  if (options.below) {
+    require(jobs.GetAllOfDept(departmentOf(console, options.department).InnerId(), options.role, userId), jobs);
+  } else {
+    require(jobs.GetAll(options.department, options.role, userId), jobs);
+  }
+  Table table({{"Job", "job"}, {"Name", "name"}, {"Department", "department"}, {"Role", "role"}});
+  for (const auto& job : jobs) table.row({job->Id(), job->Name(), job->deptId(), job->roleName()});
+  return {table.text() + "\n" + counted(table.size(), "job") + ".\n", {{"jobs", table.document()}}};
+}
+
+// By level, since names repeat in different branches.
+Answer chain(const Console& console, const Options& options) {
+  std::vector<String> ids;
+  for (const Long id : options.jobs) ids.push_back(text(id));
+  Departments departments;
+  console.connect(departments);
+  require(departments.getAllSuperWithLevel(join(ids, ",")), departments);
+  Table table({{"Department", "department"}, {"Full name", "fullName"}});
+  for (const auto& department : departments) table.row({department->Id(), department->fullName()});
+  return {table.text(), {{"departments", table.document()}}};
+}
+
+}  // namespace
+
+void addJobs(Console& console) {
+  const auto options = std::make_shared<Options>();
+  CLI::App* group = console.app().add_subcommand("job", "Jobs: roles held in departments")->require_subcommand(1);
+
+  CLI::App* listCommand = group->add_subcommand("list", "Jobs by department, role and holder");
+  CLI::Option* dept = listCommand->add_option("--dept", options->department, "Number of the department");
+  listCommand->add_flag("--below", options->below, "And of all departments below it")->needs(dept);
+  listCommand->add_option("--role", options->role, "The role's name");
+  listCommand->add_option("--user", options->login, "The holder's login");
+  console.command(listCommand, [&console, options] { return list(console, *options); });
+
+  CLI::App* chainCommand = group->add_subcommand("chain", "The departments of jobs and all above them, the top first");
+  chainCommand->add_option("jobs", options->jobs, "Job ids")->required();
+  console.command(chainCommand, [&console, options] { return chain(console, *options); });
+}
+
+}  // namespace QVSa::console

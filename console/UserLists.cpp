@@ -1,0 +1,119 @@
+#include <memory>
+
+#include "QVSa/organisation/Jobs.h"
+#include "QVSa/organisation/Users.h"
+#include "console/Commands.h"
+#include "console/Lookup.h"
+#include "console/Table.h"
+
+namespace QVSa::console {
+
+namespace {
+
+struct Options {
+  String department;
+  bool below = false;
+  String role;
+  String group;
+  bool withoutBuiltIn = false;
+  String login;
+  Long job = 0;
+  String supervisor;
+  bool none = false;
+};
+
+constexpr Integer byNobody = 0;
+constexpr Integer byJob = 1;
+constexpr Integer byUser = 2;
+
+Answer listSubtree(const Console& console, const Options& options) {
+  Users users;
+  console.connect(users);
+  const Long top = departmentOf(console, options.department).InnerId();
+  require(options.role.empty() ? users.GetAllOfTheDept(top) : users.GetAllOfTheDeptAndRole(top, options.role), users);
+  Table table({{"Id", "id"}, {"Name", "name"}, {"Department", "department"}});
+  for (const auto& user : users) table.row({user->Id(), user->Name(), user->deptFullName()});
+  return {table.text() + "\n" + counted(table.size(), "user") + ".\n", {{"users", table.document()}}};
+}
+
+Answer list(const Console& console, const Options& options) {
+  if (options.below) return listSubtree(console, options);
+  Users users;
+  console.connect(users);
+  const Long roleId = options.role.empty() ? 0 : roleOf(console, options.role).Id();
+  const Long groupId = options.group.empty() ? -1 : groupOf(console, options.group).Id();
+  require(users.GetAll(options.department, roleId, options.withoutBuiltIn, groupId), users);
+  Table table(
+      {{"Login", "login"}, {"Name", "name"}, {"Department", "department"}, {"Groups", "groups"}, {"Locked", "locked"}});
+  for (const auto& user : users)
+    table.row({user->Login(), user->Name(), user->deptFullName(), user->grpName(), user->locked()});
+  return {table.text() + "\n" + counted(table.size(), "user") + ".\n", {{"users", table.document()}}};
+}
+
+String jobName(const Console& console, Long id) {
+  Jobs jobs;
+  console.connect(jobs);
+  require(jobs.GetAll(), jobs);
+  const auto job = jobs.Item(text(id));
+  return job ? job->Name() : "";
+}
+
+String userName(const Console& console, Long id) {
+  User user;
+  console.connect(user);
+  return user.GetOne(1, id) ? user.Name() : "";
+}
+
+Answer showManager(const Console& console, User& user) {
+  Integer flag = byNobody;
+  Long jobId = 0, userId = 0;
+  require(user.getManager(flag, jobId, userId), user);
+  const auto subordinates = user.getSubUsers();
+  require(subordinates != nullptr, user);
+  Sheet sheet;
+  sheet.line("User", "user", user.Name());
+  sheet.line("Supervising job", "job", flag == byJob ? Json(jobName(console, jobId)) : Json());
+  sheet.line("Supervisor", "supervisor", flag == byUser ? Json(userName(console, userId)) : Json());
+  Table table({{"Subordinates", "login"}, {"", "name"}});
+  for (const auto& subordinate : *subordinates) table.row({subordinate->Login(), subordinate->Name()});
+  Answer answer{sheet.text() + (table.size() == 0 ? "" : "\n" + table.text()), sheet.document()};
+  answer.document["subordinates"] = table.document();
+  return answer;
+}
+
+Answer manager(const Console& console, const Options& options) {
+  User user = userOf(console, options.login);
+  if (options.job != 0) {
+    if (jobName(console, options.job).empty()) throw Refusal("There is no job " + text(options.job) + ".");
+    require(user.setManager(byJob, options.job), user);
+  } else if (!options.supervisor.empty()) {
+    require(user.setManager(byUser, 0, userOf(console, options.supervisor).Id()), user);
+  } else if (options.none) {
+    require(user.setManager(byNobody), user);
+  }
+  return showManager(console, user);
+}
+
+}  // namespace
+
+void addUserLists(Console& console) {
+  const auto options = std::make_shared<Options>();
+  CLI::App* group = console.app().get_subcommand("user");
+
+  CLI::App* listCommand = group->add_subcommand("list", "Users by department, role and group");
+  CLI::Option* dept = listCommand->add_option("--dept", options->department, "Number of the department");
+  CLI::Option* below = listCommand->add_flag("--below", options->below, "And of all departments below it")->needs(dept);
+  listCommand->add_option("--role", options->role, "Only holders of the role");
+  listCommand->add_option("--group", options->group, "Only members of the group")->excludes(below);
+  listCommand->add_flag("--no-built-in", options->withoutBuiltIn, "Without built-in users")->excludes(below);
+  console.command(listCommand, [&console, options] { return list(console, *options); });
+
+  CLI::App* managerCommand = group->add_subcommand("manager", "Show or set a user's supervisor");
+  managerCommand->add_option("login", options->login)->required();
+  CLI::Option* job = managerCommand->add_option("--job", options->job, "Whoever holds this job");
+  CLI::Option* who = managerCommand->add_option("--user", options->supervisor, "This user")->excludes(job);
+  managerCommand->add_flag("--none", options->none, "Nobody")->excludes(job)->excludes(who);
+  console.command(managerCommand, [&console, options] { return manager(console, *options); });
+}
+
+}  // namespace QVSa::console
