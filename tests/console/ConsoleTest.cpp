@@ -86,31 +86,28 @@ TEST_F(Program, AChangeOfPasswordLeavesNoSessionAndHeedsTheFlagAgainstIt) {
   EXPECT_NE(signOn("ann", "Ann-pass-2"), "");
 }
 
-TEST_F(Program, UnlockKeepsPasswordAndGroupAndRefusesWhereJobsWouldGo) {
+TEST_F(Program, UnlockKeepsPasswordGroupsAndJobs) {
   addAnn();
-  execute("insert into ItemGroups(gName) values('Friends')");
-  execute("insert into GrpUser(gId,userId) select 1,userId from users where userLogin='ann'");
+  run("group add 'Friends, old' ");
+  run("group set 'Friends, old' --members Admin,ann");
+  run("role give 'Report Designers' ann _root");
   run("policy set --lock-after 1");
-  EXPECT_EQ(run("sign-on ann", "wrong\n").error(), "0x8004045E");
-  execute("insert into userJob(userId,jobId) select userId,2 from users where userLogin='ann'");
-  EXPECT_EQ(run("user unlock ann").exitCode, 1);
-  EXPECT_EQ(value("select count(*) from userJob where jobId=2"), "1");
-  execute("delete from userJob where jobId=2");
-
-  EXPECT_EQ(run("user unlock ann").exitCode, 0);
-  EXPECT_EQ(run("user show ann").document["groups"], "Friends");
-  EXPECT_NE(signOn("ann", "Ann-pass-1"), "");
+  for (const char* groups : {"Friends, old", "Friends, old,Others"}) {
+    EXPECT_EQ(run("sign-on ann", "wrong\n").error(), "0x8004045E");
+    EXPECT_EQ(run("user unlock ann").exitCode, 0);
+    EXPECT_EQ(run("user show ann").document["groups"], groups);
+    EXPECT_EQ(run("user show ann").document["builtInRoles"], Json::array({"Report Designers"}));
+    EXPECT_EQ(run("group show 'Friends, old'").document["members"].size(), 2U);
+    EXPECT_NE(signOn("ann", "Ann-pass-1"), "");
+    run("group add Others");
+    run("group set Others --members ann");
+  }
   EXPECT_EQ(run("user unlock ann").exitCode, 1);
 }
 
 TEST_F(Program, UnlockRefusesWhatASaveCouldNotKeep) {
   addAnn();
-  execute("insert into ItemGroups(gName) values('Friends') insert into ItemGroups(gName) values('Others')");
-  execute("insert into GrpUser(gId,userId) select g.gId,u.userId from users u,ItemGroups g where userLogin='ann'");
-  execute("update users set accstate=1 where userLogin='ann'");
-  EXPECT_EQ(run("user unlock ann").exitCode, 1);
-  EXPECT_EQ(value("select count(*) from GrpUser"), "2");
-  execute("delete from GrpUser where gId=2 update users set userPwd='of another key' where userLogin='ann'");
+  execute("update users set accstate=1,userPwd='of another key' where userLogin='ann'");
   EXPECT_EQ(run("user unlock ann").exitCode, 1);
   EXPECT_EQ(value("select userPwd from users where userLogin='ann'"), "of another key");
 }
@@ -179,12 +176,82 @@ TEST_F(Program, AnImportCanBeRunAgainAndChangesWhatDiffers) {
 
   writeOrganisation("_root,Another,,1\nd1,Uno,_root,1\nd2,Two,d1,0\n", "ann,Ann,d1\nbob,Bob B,d1\n");
   execute("insert into userJob(userId,jobId) select userId,2 from users where userLogin='bob'");
-  EXPECT_EQ(import(), "d0111 u0101 ");
+  EXPECT_EQ(import(), "d0111 u0200 ");
   EXPECT_EQ(run("dept show d2").document["fullName"], "Uno-Two");
   EXPECT_EQ(run("dept show _root").document["name"], "Top");
   EXPECT_EQ(run("user show ann").document["departmentNumber"], "d1");
   EXPECT_EQ(value("select count(*) from userJob where jobId=2"), "1");
   EXPECT_NE(signOn("ann", "First-pass-1"), "");
+}
+
+TEST_F(Program, AnImportOfHoldingsAddsWhatIsMissing) {
+  writeOrganisation("_root,Top,,1\nd1,One,_root,1\nd2,Two,d1,0\n", "ann,Ann,d2\nbob,Bob,d1\n");
+  const auto write = [&](const String& rows) {
+    std::ofstream(folder_.path() / "holdings.csv") << "login,role,department\n" << rows;
+  };
+  write("ann,Clerk,d2\nann,Clerk,d1\nbob,Clerk,d1\nbob,Administrators,_root\n");
+  EXPECT_EQ(import("--dry-run"), "d2100 u2000 r1010 j2010 h4000 ");
+  EXPECT_EQ(value("select count(*) from roles where builtIn=0"), "0");
+  EXPECT_EQ(import(), "d2100 u2000 r1010 j2010 h4000 ");
+  EXPECT_EQ(import(), "d0030 u0020 r0020 j0030 h0040 ");
+  write("bob,Clerk,d1\nbob,Clerk,d2\n");
+  EXPECT_EQ(import(), "d0030 u0020 r0010 j0020 h1010 ");
+  EXPECT_EQ(run("role holders Clerk").document["holders"].size(), 2U);
+  EXPECT_EQ(run("job list --user ann").document["jobs"].size(), 2U) << "nothing is taken away";
+}
+
+TEST_F(Program, RolesAreSetInDepartmentsAndHeldThere) {
+  addAnn();
+  run("dept add a A");
+  run("dept add b B --under a");
+  EXPECT_EQ(run("role add Clerk --description 'Does it'").exitCode, 0);
+  EXPECT_EQ(run("role add clerk").error(), "0x800404B9");
+  EXPECT_EQ(run("role give Clerk ann b").error(), "0x800404BA");
+  EXPECT_EQ(run("role set Clerk --in a,b").document["jobs"].size(), 2U);
+  EXPECT_EQ(run("role give Clerk ann b").exitCode, 0);
+  EXPECT_EQ(run("role holders Clerk").document["holders"][0]["login"], "ann");
+  const Json jobs = run("job list --dept a --below").document["jobs"];
+  ASSERT_EQ(jobs.size(), 2U);
+  EXPECT_EQ(jobs[1]["name"], "A-B--Clerk");
+  const Json chain = run("job chain " + jobs[1]["job"].dump()).document["departments"];
+  ASSERT_EQ(chain.size(), 3U);
+  EXPECT_EQ(chain[2]["department"], "b");
+  EXPECT_EQ(run("role reach Clerk").document["acl"], "");
+  EXPECT_EQ(run("role set Clerk --out-of b").document["jobs"].size(), 1U);
+  EXPECT_EQ(run("role holders Clerk").document["holders"].size(), 0U);
+  EXPECT_EQ(run("role remove Administrators").exitCode, 1);
+  EXPECT_EQ(run("role remove Clerk").exitCode, 0);
+  EXPECT_EQ(run("role list").document["roles"].size(), 6U);
+}
+
+TEST_F(Program, SupervisorsAreSetByJobOrByUser) {
+  addAnn();
+  run("user add bob Bob", "Bob-pass-1\n");
+  EXPECT_EQ(run("user manager bob --job 1").document["job"], "Company--Administrators");
+  EXPECT_EQ(run("user manager Admin").document["subordinates"][0]["login"], "bob");
+  EXPECT_EQ(run("user manager bob --user ann").document["supervisor"], "Ann A");
+  EXPECT_EQ(run("user manager Admin").document["subordinates"].size(), 0U);
+  EXPECT_TRUE(run("user manager bob --none").document["supervisor"].is_null());
+  EXPECT_EQ(run("user manager bob --job 99").exitCode, 1);
+  EXPECT_EQ(run("user list --role Administrators").document["users"][0]["login"], "Admin");
+}
+
+TEST_F(Program, TheTreeIsDrawnWithEachBranchUnderItsSuperior) {
+  run("dept add b B --organisation");
+  run("dept add c C --under b");
+  run("dept add a A");
+  const Json tree = run("dept tree --under _root").document["tree"];
+  ASSERT_EQ(tree.size(), 1U);
+  EXPECT_EQ(tree[0]["below"][0]["number"], "a");
+  EXPECT_EQ(tree[0]["below"][1]["below"][0]["name"], "C");
+  FILE* pipe = popen((String(QVSA_CONSOLE) + " --server '" + server() + "' dept tree --under _root").c_str(), "r");
+  char buffer[512] = {};
+  const std::size_t read = fread(buffer, 1, sizeof buffer - 1, pipe);
+  pclose(pipe);
+  EXPECT_EQ(
+      String(buffer, read),
+      "Company *  (_root)\n├── A  (a)\n└── B *  (b)\n    └── C  (c)\n\n4 departments; * marks an organisation.\n");
+  EXPECT_EQ(run("dept list --by-level").document["departments"][3]["number"], "c");
 }
 
 TEST_F(Program, DoctorTellsWhatASignOnWouldPassOver) {

@@ -59,6 +59,10 @@ TEST_F(OrganisationFiles, WhatDoesNotFitIsToldWithItsLine) {
   EXPECT_EQ(refusalOf(root, "ann,Ann,_root\nann,Bob,_root\n"), "users.csv, line 3: the login ann stands there twice.");
   EXPECT_EQ(refusalOf(root, "ann,,_root\n"), "users.csv, line 2: the name is empty.");
   EXPECT_NE(refusalOf(root + "d1,A\n", ""), "");
+  write("holdings.csv", "login,role,department\nann,Clerk,_root\nbob,Clerk,_root\n");
+  EXPECT_EQ(refusalOf(root, "ann,Ann,_root\n"), "holdings.csv, line 3: there is no user bob.");
+  write("holdings.csv", "login,role,department\nann,Clerk,_root\nann,Clerk,_root\n");
+  EXPECT_EQ(refusalOf(root, "ann,Ann,_root\n"), "holdings.csv, line 3: the holding stands there twice.");
   EXPECT_NE(refusalOf(root + "d1,\"A,_root,0\n", ""), "");
 }
 
