@@ -3,6 +3,7 @@
 #include "QVSa/QVSa.h"
 #include "platform/SecretMessage.h"
 #include "tests/faults/LogAndClassOperations.h"
+#include "tests/faults/OrganisationOperations.h"
 #include "tests/faults/SettingsOperations.h"
 #include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
@@ -210,13 +211,14 @@ void fillGround(const String& server) {
   tables.run("update idDel set rcId=null where theId='I001'");
   fillLogAndClasses(server);
   fillSettings(server);
+  fillOrganisation(server);
 }
 
 const std::vector<Operation>& operations() {
   static const std::vector<Operation> all = [] {
     std::vector<Operation> result;
     for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations(),
-                      logAndClassOperations(), settingsOperations()})
+                      logAndClassOperations(), settingsOperations(), organisationOperations()})
       result.insert(result.end(), part.begin(), part.end());
     return result;
   }();
@@ -224,17 +226,22 @@ const std::vector<Operation>& operations() {
 }
 
 const std::vector<LetPass>& letPass() {
-  static const std::vector<LetPass> points{
-      {"User.loginAuth", "select * from saferule", false, "without the policy neither lock nor expiry is tested"},
-      {"User.loginAuth", "select * from sesLog", false, "without the list no session stands elsewhere"},
-      {"User.loginAuth with a wrong password", "select * from saferule", false, "the password is wrong all the same"},
-      {"safeRule.checkPwd", "select * from saferule", true, "without the policy every text passes"},
-      {"Sessions.connect", "select * from sesLog", true, "the names are kept, and the list can be read later"},
-      {"User.Reg", "select * from homeinfo", false, "without the settings no mail is queued"},
-      {"User.Reg", "select count(*) from reptmps", false, "the settings are loaded by then"},
-      {"User.regAudit", "select * from homeinfo", false, "without the settings no mail is queued"},
-      {"User.regAudit", "select count(*) from reptmps", false, "the settings are loaded by then"},
-  };
+  static const std::vector<LetPass> points = [] {
+    std::vector<LetPass> result{
+        {"User.loginAuth", "select * from saferule", false, "without the policy neither lock nor expiry is tested"},
+        {"User.loginAuth", "select * from sesLog", false, "without the list no session stands elsewhere"},
+        {"User.loginAuth with a wrong password", "select * from saferule", false, "the password is wrong all the same"},
+        {"safeRule.checkPwd", "select * from saferule", true, "without the policy every text passes"},
+        {"Sessions.connect", "select * from sesLog", true, "the names are kept, and the list can be read later"},
+        {"User.Reg", "select * from homeinfo", false, "without the settings no mail is queued"},
+        {"User.Reg", "select count(*) from reptmps", false, "the settings are loaded by then"},
+        {"User.regAudit", "select * from homeinfo", false, "without the settings no mail is queued"},
+        {"User.regAudit", "select count(*) from reptmps", false, "the settings are loaded by then"},
+    };
+    const std::vector<LetPass> more = organisationLetPass();
+    result.insert(result.end(), more.begin(), more.end());
+    return result;
+  }();
   return points;
 }
 

@@ -18,6 +18,7 @@ struct Report {
   String statement;
   String prefix;
   bool silent = false;
+  Long number = 0;  // in place of the failure's
 };
 
 struct Operation {
@@ -36,6 +37,7 @@ struct LetPass {
   const char* statement;
   bool reported;  // in errNumber, in spite of the positive result
   const char* reason;
+  bool alone = false;  // the statement, but not the opening and the beginning before it
 };
 
 // Makes what the operations work on, in an installation as it is shipped.
