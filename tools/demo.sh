@@ -37,7 +37,15 @@ login=$(sed -n 2p "$organisation/users.csv" | cut -d, -f1)
 "$programs/examples/sign_on_road" "$QVSA_SERVER" "$login"
 
 echo
+echo "== The system log and the report classes =="
+"$programs/examples/log_and_classes" "$QVSA_SERVER" "$PWD/$folder/log.txt"
+
+echo
 echo "== What the console sees now =="
+"$programs/console/qvsa" log list --type 2
+echo
+"$programs/console/qvsa" class tree
+echo
 "$programs/console/qvsa" sessions list
 echo
 "$programs/console/qvsa" doctor

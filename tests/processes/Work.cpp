@@ -76,6 +76,14 @@ void loadAsNobody(const Words& words) {
   writeLine(failureText(user.errNumber(), user.errDescription()));
 }
 
+void clearLog(const Words& words) {
+  LogRecords log;
+  log.connect(words.at(0), "QVSys");
+  const Long type = 1;
+  writeLine("clearing");
+  writeLine(log.clearLog(&type) ? "cleared" : failureText(log.errNumber(), log.errDescription()));
+}
+
 }  // namespace
 
 int doWork(const Words& words) {
@@ -85,6 +93,7 @@ int doWork(const Words& words) {
   if (words.at(0) == "wrong-passwords") wrongPasswords(arguments);
   if (words.at(0) == "issue") issue(arguments);
   if (words.at(0) == "hold") hold(arguments);
+  if (words.at(0) == "clear-log") clearLog(arguments);
   if (words.at(0) == "load-as-nobody") loadAsNobody(arguments);
   return 0;
 }
