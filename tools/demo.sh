@@ -37,6 +37,10 @@ login=$(sed -n 2p "$organisation/users.csv" | cut -d, -f1)
 "$programs/examples/sign_on_road" "$QVSA_SERVER" "$login"
 
 echo
+echo "== From the application to the account =="
+"$programs/examples/registration_road" "$QVSA_SERVER"
+
+echo
 echo "== The system log and the report classes =="
 "$programs/examples/log_and_classes" "$QVSA_SERVER" "$PWD/$folder/log.txt"
 

@@ -44,5 +44,22 @@ if [ "$(id -u)" -ne 0 ]; then
 fi
 export DEBIAN_FRONTEND=noninteractive
 $as_root apt-get update --quiet=2
+
+# The tests start a directory server of their own: the package must neither set one up nor start it, now or at boot.
+case " $missing " in
+  *" slapd "*)
+    echo "slapd slapd/no_configuration boolean true" | $as_root debconf-set-selections
+    if [ ! -e /usr/sbin/policy-rc.d ]; then
+      printf '#!/bin/sh\nexit 101\n' | $as_root tee /usr/sbin/policy-rc.d >/dev/null
+      $as_root chmod 755 /usr/sbin/policy-rc.d
+      trap '$as_root rm -f /usr/sbin/policy-rc.d' EXIT
+    fi
+    ;;
+esac
+
 # shellcheck disable=SC2086  # one word a package
 $as_root apt-get install --yes --quiet=2 --no-install-recommends $missing
+
+case " $missing " in
+  *" slapd "*) $as_root update-rc.d slapd disable >/dev/null 2>&1 || true ;;
+esac
