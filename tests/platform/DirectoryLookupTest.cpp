@@ -75,12 +75,19 @@ TEST_F(DirectoryLookupTest, ABindNeedsTheRightNameAndPassword) {
   EXPECT_EQ(status_, directoryFailed);
 }
 
-TEST_F(DirectoryLookupTest, AServerWithoutTlsIsNotAskedInPlainText) {
+TEST_F(DirectoryLookupTest, TlsIsSpokenAndTheCertificateIsChecked) {
   query_.security = DirectoryQuery::Security::startTls;
-  EXPECT_EQ(find(ann), "");
+  EXPECT_EQ(find(ann), annLine);
+  query_.host = "localhost";
+  EXPECT_EQ(find(ann), "") << "a certificate for another name";
   EXPECT_EQ(status_, directoryUnreachable);
+
+  query_.host = "127.0.0.1";
+  query_.port = slapd_->tlsPort();
   query_.security = DirectoryQuery::Security::tls;
-  EXPECT_EQ(find(ann), "");
+  EXPECT_EQ(find(ann), annLine);
+  query_.security = DirectoryQuery::Security::byPort;
+  EXPECT_EQ(find(ann), "") << "plain text to a port that speaks TLS";
   EXPECT_EQ(status_, directoryUnreachable);
 }
 

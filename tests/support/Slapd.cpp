@@ -11,6 +11,8 @@
 #include <utility>
 #include <vector>
 
+#include "tests/support/SelfSignedCertificate.h"
+
 namespace QVSa::test {
 
 namespace {
@@ -24,6 +26,8 @@ include /etc/ldap/schema/inetorgperson.schema
 modulepath /usr/lib/ldap
 moduleload back_mdb
 pidfile FOLDER/slapd.pid
+TLSCertificateFile TRUST/certificate.pem
+TLSCertificateKeyFile TRUST/key.pem
 database mdb
 maxsize 10485760
 suffix "dc=example,dc=org"
@@ -114,8 +118,20 @@ pid_t spawn(std::vector<String> words) {
   return process;
 }
 
+// The certificate of all servers of this process: the LDAP library reads once whom it trusts.
+const std::filesystem::path& trust() {
+  static const TestFolder folder;
+  static const bool made = [] {
+    writeSelfSignedCertificate(folder.path() / "certificate.pem", folder.path() / "key.pem");
+    return setenv("LDAPTLS_CACERT", (folder.path() / "certificate.pem").c_str(), 1) == 0;
+  }();
+  if (!made) throw std::runtime_error("no certificate for the directory server");
+  return folder.path();
+}
+
 void write(const std::filesystem::path& path, String text, const String& folder) {
-  for (auto at = text.find("FOLDER"); at != String::npos; at = text.find("FOLDER")) text.replace(at, 6, folder);
+  for (const auto& [mark, value] : {std::pair<String, String>{"FOLDER", folder}, {"TRUST", trust().string()}})
+    for (auto at = text.find(mark); at != String::npos; at = text.find(mark)) text.replace(at, mark.size(), value);
   std::ofstream(path) << text;
 }
 
@@ -123,7 +139,7 @@ void write(const std::filesystem::path& path, String text, const String& folder)
 
 bool Slapd::isInstalled() { return ::access(program, X_OK) == 0; }
 
-Slapd::Slapd() : port_(freePort()) {
+Slapd::Slapd() : port_(freePort()), tlsPort_(freePort()) {
   const std::filesystem::path& folder = folder_.path();
   const String settings = folder / "slapd.conf";
   const String entries = folder / "entries.ldif";
@@ -132,9 +148,11 @@ Slapd::Slapd() : port_(freePort()) {
   write(entries, content + manyEntries(), folder);
   int status = 0;
   waitpid(spawn({program, "-Tadd", "-f", settings, "-l", entries}), &status, 0);
-  if (status != 0) throw std::runtime_error("slapd takes its entries not");
-  process_ = spawn({program, "-f", settings, "-h", "ldap://127.0.0.1:" + std::to_string(port_) + "/", "-d", "0"});
-  for (int i = 0; i < 500 && !answers(port_); ++i) usleep(20'000);
+  if (status != 0) throw std::runtime_error("slapd does not take its entries");
+  const String addresses =
+      "ldap://127.0.0.1:" + std::to_string(port_) + "/ ldaps://127.0.0.1:" + std::to_string(tlsPort_) + "/";
+  process_ = spawn({program, "-f", settings, "-h", addresses, "-d", "0"});
+  for (int i = 0; i < 500 && !(answers(port_) && answers(tlsPort_)); ++i) usleep(20'000);
 }
 
 Slapd::~Slapd() { stop(); }

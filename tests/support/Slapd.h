@@ -15,7 +15,8 @@ namespace QVSa::test {
 //                 uid=bob             "Bob (Sales) *\" of cn, no mail
 //     ou=empty
 //     ou=many     `many` users, more than one answer may hold
-// Only those who are bound may read.
+// Only those who are bound may read. It takes StartTLS, and TLS from the first byte on a port of its own. Its
+// certificate, for 127.0.0.1, is what this process trusts if it asked no directory before the first server was made.
 class Slapd {
  public:
   static constexpr int many = 600;
@@ -27,6 +28,7 @@ class Slapd {
   Slapd& operator=(const Slapd&) = delete;
 
   Long port() const { return port_; }
+  Long tlsPort() const { return tlsPort_; }
   // It keeps its connections open, takes new ones, and answers nothing.
   void hang() const;
   void goOn() const;
@@ -35,6 +37,7 @@ class Slapd {
  private:
   TestFolder folder_;
   Long port_;
+  Long tlsPort_;
   pid_t process_ = 0;
 };
 
