@@ -14,6 +14,7 @@ int main(int argc, char** argv) {
     QVSa::bench::addDepartmentPairs();
     QVSa::bench::addLogPairs();
     QVSa::bench::addClassPairs();
+    QVSa::bench::addHomePairs();
     QVSa::bench::runPairs();
     QVSa::bench::tellLogFacts();
     return 0;
