@@ -10,10 +10,10 @@ void addNumberPairs();
 void addDepartmentPairs();
 void addLogPairs();
 void addClassPairs();
+void addHomePairs();
 
 // Prints how a day of the log is found, and the memory that an export of it takes.
 void tellLogFacts();
-void addHomePairs();
 
 // Throws what an object says about its last failure, unless `good`.
 template <class Object>

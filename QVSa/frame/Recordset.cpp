@@ -1,5 +1,7 @@
 #include "QVSa/frame/Recordset.h"
 
+#include <algorithm>
+
 #include "QVSa/frame/Connection.h"
 #include "QVSa/frame/Text.h"
 
@@ -41,11 +43,11 @@ void Recordset::Open(const String& Source, Connection& ActiveConnection, Long Cu
 void Recordset::start(AttachedRows source, bool keep) {
   source_ = std::move(source);
   columns_ = (*source_)->columns();
-  ordinals_.clear();
+  asked_.clear();
   kept_.clear();
   changes_.clear();
   chunks_.clear();
-  position_ = fetched_ = firstKept_ = 0;
+  position_ = fetched_ = firstKept_ = turn_ = 0;
   exhausted_ = updatable_ = false;
   keeps_ = keep;
   open_ = true;
@@ -176,16 +178,19 @@ void Recordset::requireUpdatable() const {
                 "selected locktype.");
 }
 
+// Row by row the same names are asked for, mostly in the same order: the search begins behind the last one found.
 std::size_t Recordset::ordinalOf(const String& name) {
-  if (ordinals_.empty()) {
-    for (std::size_t i = 0; i < columns_.size(); ++i) ordinals_.emplace(lowerCase(columns_[i].name), i);
+  for (std::size_t tried = 0; tried < asked_.size(); ++tried) {
+    if (turn_ == asked_.size()) turn_ = 0;
+    const auto& [known, ordinal] = asked_[turn_++];
+    if (known == name) return ordinal;
   }
-  auto entry = ordinals_.find(name);
-  if (entry != ordinals_.end()) return entry->second;
-  entry = ordinals_.find(lowerCase(name));
-  if (entry == ordinals_.end()) throw noSuchField();
-  // Row by row the same names are asked for.
-  return ordinals_.emplace(name, entry->second).first->second;
+  const auto column =
+      std::find_if(columns_.begin(), columns_.end(), [&](const Column& entry) { return sameText(entry.name, name); });
+  if (column == columns_.end()) throw noSuchField();
+  asked_.emplace_back(name, static_cast<std::size_t>(column - columns_.begin()));
+  turn_ = asked_.size();
+  return asked_.back().second;
 }
 
 Recordset::Row Recordset::sourceRow() const {

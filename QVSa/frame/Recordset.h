@@ -2,7 +2,7 @@
 
 #include <map>
 #include <memory>
-#include <unordered_map>
+#include <vector>
 
 #include "QVSa/frame/Provider.h"
 
@@ -130,9 +130,10 @@ class Recordset {
 
   AttachedRows source_;  // empty for a closed or detached row set
   std::vector<Column> columns_;
-  std::unordered_map<String, std::size_t> ordinals_;
-  std::size_t position_ = 0;  // of the current row, counted from the first
-  std::size_t fetched_ = 0;   // rows that the source gave; the current row is behind them at the end
+  std::vector<std::pair<String, std::size_t>> asked_;  // names of columns as they were asked for, and their ordinals
+  std::size_t turn_ = 0;                               // in asked_
+  std::size_t position_ = 0;                           // of the current row, counted from the first
+  std::size_t fetched_ = 0;  // rows that the source gave; the current row is behind them at the end
   bool exhausted_ = false;
   std::vector<Row> kept_;
   std::size_t firstKept_ = 0;

@@ -149,7 +149,11 @@ String upperCase(const String& text) { return mapped(text, towupper_l, 'a', 'z')
 
 String lowerCase(const String& text) { return mapped(text, towlower_l, 'A', 'Z'); }
 
-bool sameText(const String& a, const String& b) { return a == b || lowerCase(a) == lowerCase(b); }
+bool sameText(const String& a, const String& b) {
+  if (!isAscii(a) || !isAscii(b)) return lowerCase(a) == lowerCase(b);
+  const auto lower = [](char c) { return c >= 'A' && c <= 'Z' ? static_cast<char>(c | 0x20) : c; };
+  return std::equal(a.begin(), a.end(), b.begin(), b.end(), [&](char x, char y) { return lower(x) == lower(y); });
+}
 
 String leftText(const String& text, Long units) {
   requireLength(units);
