@@ -48,7 +48,7 @@ std::vector<Operation> homeOperations() {
       operation<Home>(
           "Home.Save without pictures", nothing<Home>, [](Home& home, const String&) { return home.Save(); }, {}, true),
       operation<Home>("Home.roleGrpNum", nothing<Home>,
-                      [](Home& home, const String&) { return home.roleGrpNum() == 2; }),
+                      [](Home& home, const String&) { return home.roleGrpNum() > 0; }),
       operation<Home>("Home.outerUserNum", nothing<Home>,
                       [](Home& home, const String&) { return home.outerUserNum() == 1; }),
   };
