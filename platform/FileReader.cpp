@@ -1,0 +1,51 @@
+#include "platform/FileReader.h"
+
+#include <cerrno>
+#include <fcntl.h>
+#include <unistd.h>
+
+#include "QVSa/frame/Failure.h"
+#include "platform/Files.h"
+#include "platform/Folders.h"
+
+namespace QVSa::platform {
+
+namespace {
+
+[[noreturn]] void fail(const String& path) {
+  switch (errno) {
+    case ENOENT: {
+      const auto folder = localPath(path).parent_path();
+      throw runtimeFailure(folder.empty() || folderExists(folder.string()) ? number::noFile : number::noPath);
+    }
+    case ENOTDIR:
+      throw runtimeFailure(number::noPath);
+    case EACCES:
+    case EPERM:
+      throw runtimeFailure(number::accessDenied);
+    default:
+      throw runtimeFailure(number::pathAccess);
+  }
+}
+
+}  // namespace
+
+FileReader::FileReader(const String& path) : handle_(::open(localPath(path).c_str(), O_RDONLY | O_CLOEXEC)) {
+  if (handle_ < 0) fail(path);
+}
+
+FileReader::~FileReader() { ::close(handle_); }
+
+std::size_t FileReader::read(std::span<std::uint8_t> block) {
+  std::size_t filled = 0;
+  while (filled < block.size()) {
+    const ssize_t count = ::read(handle_, block.data() + filled, block.size() - filled);
+    if (count < 0 && errno == EINTR) continue;
+    if (count < 0) throw runtimeFailure(number::pathAccess);
+    if (count == 0) break;
+    filled += static_cast<std::size_t>(count);
+  }
+  return filled;
+}
+
+}  // namespace QVSa::platform
