@@ -28,6 +28,19 @@ TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition) {
   return table;
 }
 
+std::string quoted(const std::string& text) {
+  std::string result = "N'";
+  for (const char c : text) result.append(c == '\'' ? 2 : 1, c);
+  return result + "'";
+}
+
+// Not kept in the file: an installation may have been moved since.
+std::string filesView(const std::filesystem::path& folder, const std::string& database) {
+  const auto [data, log] = filesOf(folder, database);
+  return "create view sysfiles(fileid, groupid, name, filename) as select 1, 1, " + quoted(data.name) + ", " +
+         quoted(data.path) + " union all select 2, 0, " + quoted(log.name) + ", " + quoted(log.path);
+}
+
 }  // namespace
 
 std::optional<std::size_t> TableInfo::find(const std::string& column) const {
@@ -42,18 +55,21 @@ Catalogue::Catalogue(Handle& handle) : version_(handle.catalogueVersion()) {
 
 void Catalogue::load(Handle& handle, std::size_t database) {
   Prepared query(handle.get(), std::string("select text from ") + databaseNames[database] + ".definitions");
-  while (query.step()) {
-    auto statements = tsql::parse(tsql::tokenize(std::get<std::string>(query.column(0))));
-    for (auto& statement : statements) {
-      if (auto* table = std::get_if<tsql::CreateTable>(&statement)) {
-        entries_.emplace(std::pair(database, foldName(table->table.name)), tableInfo(database, *table));
-      } else if (auto* view = std::get_if<tsql::CreateView>(&statement)) {
-        const std::string name = view->view.name;
-        entries_.emplace(std::pair(database, foldName(name)), ViewInfo{database, name, std::move(*view)});
-      } else if (auto* synonym = std::get_if<tsql::CreateSynonym>(&statement)) {
-        entries_.emplace(std::pair(database, foldName(synonym->synonym.name)),
-                         SynonymInfo{database, synonym->synonym.name, synonym->target});
-      }
+  while (query.step()) loadText(database, std::get<std::string>(query.column(0)));
+  loadText(database, filesView(handle.folder(), databaseNames[database]));
+}
+
+void Catalogue::loadText(std::size_t database, const std::string& definition) {
+  auto statements = tsql::parse(tsql::tokenize(definition));
+  for (auto& statement : statements) {
+    if (auto* table = std::get_if<tsql::CreateTable>(&statement)) {
+      entries_.emplace(std::pair(database, foldName(table->table.name)), tableInfo(database, *table));
+    } else if (auto* view = std::get_if<tsql::CreateView>(&statement)) {
+      const std::string name = view->view.name;
+      entries_.emplace(std::pair(database, foldName(name)), ViewInfo{database, name, std::move(*view)});
+    } else if (auto* synonym = std::get_if<tsql::CreateSynonym>(&statement)) {
+      entries_.emplace(std::pair(database, foldName(synonym->synonym.name)),
+                       SynonymInfo{database, synonym->synonym.name, synonym->target});
     }
   }
 }

@@ -61,6 +61,7 @@ class Catalogue {
   using Entry = std::variant<TableInfo, ViewInfo, SynonymInfo>;
   const Entry* lookUp(std::size_t database, const std::string& name) const;
   void load(Handle& handle, std::size_t database);
+  void loadText(std::size_t database, const std::string& definition);
 
   std::int64_t version_ = 0;
   std::map<std::pair<std::size_t, std::string>, Entry> entries_;

@@ -84,6 +84,7 @@ Handle::Handle(const std::filesystem::path& folder)
     deadline_.reset();
   } catch (...) {
     gates_.clear();
+    schemas_.clear();
     sqlite3_close_v2(handle_);
     throw;
   }
@@ -95,6 +96,7 @@ Handle::~Handle() {
   if (::getpid() != process_) return;
   for (auto* const statement : {&begin_, &commit_, &login_, &version_}) statement->reset();
   gates_.clear();
+  schemas_.clear();
   sqlite3_close_v2(handle_);
 }
 
@@ -199,14 +201,19 @@ void Handle::commit() {
   statement.reset();
 }
 
+// The number of definitions alone would not do: a restored copy brings its own, which may be one that was seen before.
+// The library's count of a file's schemas only grows, over a restore too. It is read first: what is loaded after it can
+// be newer than the version says, never older.
 std::int64_t Handle::catalogueVersion() {
+  constexpr int definitionBits = 32;
+  const std::int64_t schemas = schemaVersion();
   Prepared& statement = kept(version_,
                              "select m.catalogue+s.catalogue+a.catalogue+u.catalogue "
                              "from master.engine m, QVSys.engine s, QVApp.engine a, QVUpdate.engine u");
   statement.step();
   const Value version = statement.column(0);
   statement.reset();
-  return std::get<std::int64_t>(version);
+  return (schemas << definitionBits) + std::get<std::int64_t>(version);
 }
 
 std::string Handle::loginDigest(const std::string& user) {
@@ -216,6 +223,19 @@ std::string Handle::loginDigest(const std::string& user) {
   statement.reset();
   const auto* const text = std::get_if<std::string>(&digest);
   return text == nullptr ? std::string() : *text;
+}
+
+std::int64_t Handle::schemaVersion() {
+  std::int64_t version = 0;
+  if (schemas_.empty())
+    for (const char* database : databaseNames)
+      schemas_.emplace_back(handle_, std::string("pragma ") + database + ".schema_version");
+  for (Prepared& schema : schemas_) {
+    schema.step();
+    version += std::get<std::int64_t>(schema.column(0));
+    schema.reset();
+  }
+  return version;
 }
 
 void Handle::resetStatements() {
@@ -228,6 +248,11 @@ void Handle::clear() {
   if (sqlite3_txn_state(handle_, nullptr) != SQLITE_TXN_NONE) resetStatements();
   if (inTransaction()) execute("rollback");
   releaseLocks();
+  for (auto& locks : locks_) {
+    if (!locks) continue;
+    locks->endAlone();
+    locks->leave();
+  }
   context_ = {};
 }
 

@@ -68,10 +68,12 @@ class Handle {
   // The stored digest of a log-in's password; empty for a log-in that does not exist.
   std::string loginDigest(const std::string& user);
 
-  // Changes with every definition in any database, by whichever session.
+  // Changes with every definition in any database, by whichever session, and with every restore. What was read under
+  // one value is never the truth under it again.
   std::int64_t catalogueVersion();
 
-  // Ends what a session may have left: running statements, a transaction, row locks, the deadline, the last identity.
+  // Ends what a session may have left: running statements, a transaction, row locks, its place in the databases, the
+  // deadline, the last identity.
   void clear();
 
  private:
@@ -81,6 +83,7 @@ class Handle {
   void open();
   void attach(std::size_t database);
   void check(const std::string& database);
+  std::int64_t schemaVersion();
   Prepared& kept(std::optional<Prepared>& statement, const char* text);
   void resetStatements();
   bool isLate() const;
@@ -100,6 +103,7 @@ class Handle {
   std::optional<Prepared> commit_;
   std::optional<Prepared> login_;
   std::optional<Prepared> version_;
+  std::vector<Prepared> schemas_;
   std::shared_ptr<void> attachment_;
   std::optional<std::chrono::steady_clock::time_point> deadline_;
   std::minstd_rand random_;

@@ -6,6 +6,11 @@ std::filesystem::path databaseFile(const std::filesystem::path& folder, const st
   return folder / (database + ".db");
 }
 
+std::array<NamedFile, 2> filesOf(const std::filesystem::path& folder, const std::string& database) {
+  const std::string data = databaseFile(folder, database).string();
+  return {{{database, data}, {database + "_log", data + "-wal"}}};
+}
+
 std::filesystem::path lockFile(const std::filesystem::path& folder, const std::string& database) {
   return folder / (database + ".lock");
 }

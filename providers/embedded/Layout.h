@@ -17,6 +17,13 @@ inline constexpr int layoutVersion = 1;
 inline constexpr int applicationId = 0x51565361;
 
 std::filesystem::path databaseFile(const std::filesystem::path& folder, const std::string& database);
+// The database's two files by their names in T-SQL: its data and its log.
+struct NamedFile {
+  std::string name;
+  std::string path;
+};
+std::array<NamedFile, 2> filesOf(const std::filesystem::path& folder, const std::string& database);
+
 std::filesystem::path lockFile(const std::filesystem::path& folder, const std::string& database);
 
 }  // namespace QVSa::embedded

@@ -97,6 +97,13 @@ Prepared Compiled::take(Handle& handle) {
   return statement;
 }
 
+std::vector<std::size_t> Compiled::databases() const {
+  std::vector<std::size_t> named;
+  for (std::size_t i = 0; i < databaseNames.size(); ++i)
+    if (text_.find(std::string(databaseNames[i]) + ".\"") != std::string::npos) named.push_back(i);
+  return named;
+}
+
 void Compiled::giveBack(Prepared statement) {
   statement.reset();
   idle_.push_back(std::move(statement));
@@ -107,6 +114,7 @@ Step compile(tsql::Statement statement, const Catalogue& catalogue, std::size_t 
   tsql::rewriteOuterJoins(statement);
   Binder binder(catalogue, database);
   Step step = compileStatement(statement, binder, updatable);
+  if (step.main) step.databases = step.main->databases();
   step.parameters = binder.takeParameters();
   for (const auto& pattern : binder.takePatterns()) facts.patterns.push_back(pattern);
   std::set<std::size_t> structural;

@@ -21,6 +21,8 @@ class Compiled {
   void giveBack(Prepared statement);
   // The parameters that the text takes, by their place in the step's list.
   const std::vector<std::size_t>& parameters() const { return parameters_; }
+  // The databases that the text names.
+  std::vector<std::size_t> databases() const;
 
  private:
   std::string text_;
@@ -40,6 +42,7 @@ struct Step {
   Kind kind = Kind::control;
   std::unique_ptr<Compiled> main;
   std::unique_ptr<Compiled> candidates;  // keys of the rows that the statement is about
+  std::vector<std::size_t> databases;    // that `main` reads and writes
   std::vector<Parameter> parameters;
   std::vector<Column> columns;
   std::vector<ResultColumn> results;

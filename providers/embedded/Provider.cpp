@@ -11,6 +11,7 @@ namespace QVSa::embedded {
 namespace {
 
 constexpr const char* administrator = "sa";
+constexpr Long inSingleUserMode = 924;
 
 class EmbeddedProvider : public QVSa::Provider {
  public:
@@ -24,8 +25,14 @@ class EmbeddedProvider : public QVSa::Provider {
       throw tsql::sqlFailure(4060, "Cannot open database \"" + options.database +
                                        "\" requested by the login. The login "
                                        "failed.");
-    const bool mayDefineLogins = options.integrated || sameName(options.user, administrator);
-    return std::make_unique<EmbeddedSession>(std::move(handle), *database, mayDefineLogins);
+    const bool isAdministrator = options.integrated || sameName(options.user, administrator);
+    try {
+      return std::make_unique<EmbeddedSession>(std::move(handle), *database, isAdministrator);
+    } catch (const Failure& failure) {
+      if (failure.native() != inSingleUserMode) throw;
+      throw tsql::sqlFailure(
+          4060, "Cannot open database \"" + options.database + "\" requested by the login. " + failure.description());
+    }
   }
 };
 

@@ -16,6 +16,8 @@ namespace {
 constexpr int keyBits = 40;
 constexpr int hashBits = 23;
 constexpr std::int64_t rangeLength = std::int64_t{1} << keyBits;
+constexpr std::int64_t usersByte = 0;
+constexpr std::int64_t toTheEnd = 0;
 
 // FNV-1a. Every program that opens the installation has to come to the same number.
 std::int64_t rangeOf(const std::string& table) {
@@ -73,17 +75,38 @@ bool RowLocks::othersHold(const std::string& table, std::int64_t row) const {
 
 void RowLocks::release() {
   if (held_.empty()) return;
-  struct flock lock = rangeLock(F_UNLCK, 0, 0);
-  if (::fcntl(file_, F_OFD_SETLK, &lock) != 0) throwLockFailure();
+  setLock(F_UNLCK, rangeLength, toTheEnd);
   held_.clear();
 }
 
-bool RowLocks::take(std::int64_t start, std::int64_t length) {
-  struct flock lock = rangeLock(F_WRLCK, start, length);
+bool RowLocks::tryEnter() {
+  entered_ = entered_ || alone_ || setLock(F_RDLCK, usersByte, 1);
+  return entered_;
+}
+
+void RowLocks::leave() {
+  if (entered_ && !alone_) setLock(F_UNLCK, usersByte, 1);
+  entered_ = false;
+}
+
+bool RowLocks::tryTakeAlone() {
+  alone_ = alone_ || setLock(F_WRLCK, usersByte, 1);
+  return alone_;
+}
+
+void RowLocks::endAlone() {
+  if (alone_) setLock(entered_ ? F_RDLCK : F_UNLCK, usersByte, 1);
+  alone_ = false;
+}
+
+bool RowLocks::setLock(short type, std::int64_t start, std::int64_t length) {
+  struct flock lock = rangeLock(type, start, length);
   if (::fcntl(file_, F_OFD_SETLK, &lock) == 0) return true;
   if (errno == EAGAIN || errno == EACCES) return false;
   throwLockFailure();
 }
+
+bool RowLocks::take(std::int64_t start, std::int64_t length) { return setLock(F_WRLCK, start, length); }
 
 bool RowLocks::isTaken(std::int64_t start, std::int64_t length) const {
   struct flock lock = rangeLock(F_WRLCK, start, length);

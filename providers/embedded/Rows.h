@@ -27,6 +27,7 @@ class EmbeddedRows : public Rows {
 
   // Reads what is left into memory and lets the statement go.
   void buffer();
+  bool isStreaming() const { return statement_.has_value(); }
   // The session ends: what is left is gone.
   void close();
 

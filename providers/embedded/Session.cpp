@@ -81,6 +81,7 @@ EmbeddedSession::EmbeddedSession(PooledHandle handle, std::size_t database, bool
     : handle_(std::move(handle)), database_(database), administrator_(administrator) {
   if (!handle_->attachment()) handle_->attachment() = std::make_shared<Cache>();
   cache_ = std::static_pointer_cast<Cache>(handle_->attachment());
+  enter(database_);
   refreshCatalogue();
 }
 
@@ -103,6 +104,17 @@ void EmbeddedSession::refreshCatalogue() {
 BatchResult EmbeddedSession::run(const Batch& batch) {
   handle_->requireOwnProcess();
   const TimeLimit limit(*handle_, batch.timeout);
+  try {
+    BatchResult result = runStatements(batch);
+    leaveOthers();
+    return result;
+  } catch (...) {
+    leaveOthers();
+    throw;
+  }
+}
+
+BatchResult EmbeddedSession::runStatements(const Batch& batch) {
   auto tokens = tsql::tokenize(batch.text);
   BatchResult result;
   if (const auto plan = planFor(batch, tokens)) {
@@ -150,6 +162,7 @@ BatchResult EmbeddedSession::runUncached(std::vector<tsql::Statement> statements
 void EmbeddedSession::runStep(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens,
                               BatchResult& result) {
   handle_->context().statementTicks = ticksOf(platform::services().localTime());
+  for (const std::size_t database : step.databases) enter(database);
   if (step.kind == Step::Kind::control) return control(step.control);
   if (step.kind != Step::Kind::query) {
     result.affected = write(step, tokens);
@@ -270,6 +283,7 @@ Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) 
 void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
                                const std::vector<std::pair<std::size_t, Value>>& values) {
   const TimeLimit limit(*handle_, rowWriteLimit);
+  enter(table.database);
   prepareWrite(table.database);
   std::string text;
   for (const auto& [column, value] : values)
@@ -289,18 +303,20 @@ void EmbeddedSession::control(const tsql::Statement& statement) {
     if (transaction->kind == Kind::begin) return begin();
     return transaction->kind == Kind::commit ? commit() : rollback();
   }
-  if (const auto* use = std::get_if<tsql::Use>(&statement)) {
-    const auto database = databaseByName(use->database);
-    if (!database)
-      throw tsql::sqlFailure(911, "Database '" + use->database +
-                                      "' does not exist. Make sure that the name is entered "
-                                      "correctly.");
-    database_ = *database;
-    return;
-  }
+  if (const auto* named = std::get_if<tsql::Use>(&statement)) return use(named->database);
+  if (administer(statement)) return;
   if (const auto* call = std::get_if<tsql::Call>(&statement))
     throw tsql::sqlFailure(2812, "Could not find stored procedure '" + call->procedure.name + "'.");
   defineObject(statement);
+}
+
+void EmbeddedSession::use(const std::string& database) {
+  const auto found = databaseByName(database);
+  if (!found)
+    throw tsql::sqlFailure(911,
+                           "Database '" + database + "' does not exist. Make sure that the name is entered correctly.");
+  enter(*found);
+  database_ = *found;
 }
 
 void EmbeddedSession::setOption(const tsql::SetOption& option) {
@@ -323,7 +339,9 @@ void EmbeddedSession::defineObject(const tsql::Statement& statement) {
   const bool own = !marked_;
   if (own) begin();
   try {
-    prepareWrite(definedDatabase(statement, database_));
+    const std::size_t database = definedDatabase(statement, database_);
+    enter(database);
+    prepareWrite(database);
     define(*handle_, *cache_->catalogue, database_, statement);
     refreshCatalogue();
     if (own) commit();
@@ -334,7 +352,31 @@ void EmbeddedSession::defineObject(const tsql::Statement& statement) {
   }
 }
 
-void EmbeddedSession::detach(EmbeddedRows& rows) { std::erase(rows_, &rows); }
+void EmbeddedSession::detach(EmbeddedRows& rows) {
+  std::erase(rows_, &rows);
+  leaveOthers();
+}
+
+void EmbeddedSession::enter(std::size_t database) {
+  if (entered_.contains(database)) return;
+  if (!handle_->locks(database).tryEnter())
+    throw tsql::sqlFailure(924, std::string("Database '") + databaseNames[database] +
+                                    "' is already open and can only "
+                                    "have one user at a time.");
+  entered_.insert(database);
+}
+
+// A database that is not the current one is in use while a statement runs there: up to the end of its row set, or of
+// the transaction.
+void EmbeddedSession::leaveOthers() {
+  if (entered_.size() == 1 || marked_) return;
+  if (std::ranges::any_of(rows_, [](const EmbeddedRows* rows) { return rows->isStreaming(); })) return;
+  std::erase_if(entered_, [this](std::size_t database) {
+    if (database == database_) return false;
+    handle_->locks(database).leave();
+    return true;
+  });
+}
 
 void EmbeddedSession::begin() {
   if (marked_) throw tsql::sqlFailure(3988, "New transaction is not allowed because another one is open.");
@@ -368,6 +410,7 @@ void EmbeddedSession::endTransaction() {
   marked_ = started_ = false;
   writing_.clear();
   handle_->releaseLocks();
+  leaveOthers();
 }
 
 }  // namespace QVSa::embedded

@@ -36,6 +36,7 @@ class EmbeddedSession : public ProviderSession {
  private:
   struct Cache;
 
+  BatchResult runStatements(const Batch& batch);
   std::shared_ptr<Plan> planFor(const Batch& batch, std::vector<tsql::Token>& tokens);
   // A batch that changes names on its way is bound statement by statement, as it runs.
   BatchResult runUncached(std::vector<tsql::Statement> statements, const Batch& batch,
@@ -46,6 +47,7 @@ class EmbeddedSession : public ProviderSession {
   Long write(Step& step, const std::vector<tsql::Token>& tokens);
   void control(const tsql::Statement& statement);
   void setOption(const tsql::SetOption& option);
+  void use(const std::string& database);
   void defineObject(const tsql::Statement& statement);
 
   void bind(Prepared& statement, const Compiled& compiled, const std::vector<Parameter>& parameters,
@@ -57,6 +59,17 @@ class EmbeddedSession : public ProviderSession {
   void prepareWrite(std::size_t database);
   void endTransaction();
   void refreshCatalogue();
+  void enter(std::size_t database);
+  void leaveOthers();
+
+  // SessionAdministration.cpp
+  bool administer(const tsql::Statement& statement);
+  void alterDatabase(const tsql::AlterDatabase& alter);
+  void backUpDatabase(const tsql::BackupDatabase& backup);
+  void restoreDatabase(const tsql::RestoreDatabase& restore);
+  void verifyBackup(const tsql::VerifyBackup& verify);
+  void changeOwner(const tsql::Call& call);
+  void requireNoTransaction() const;
 
   PooledHandle handle_;
   std::shared_ptr<Cache> cache_;
@@ -66,6 +79,7 @@ class EmbeddedSession : public ProviderSession {
   bool started_ = false;           // the storage library's transaction is open
   std::set<std::size_t> writing_;  // databases whose writer's place is taken
   std::vector<EmbeddedRows*> rows_;
+  std::set<std::size_t> entered_;                       // databases that this session uses now, its current one always
   std::pair<std::size_t, std::string> identityInsert_;  // the table that takes identity values as they are given
 };
 

@@ -59,6 +59,14 @@ class Parser {
   Statement call();
   ExpressionPtr callArgument();
 
+  // ParseAdministration.cpp
+  Statement alter();
+  Statement backup();
+  Statement restore();
+  Statement verify();
+  Token text();
+  Token disk();
+
   // ParseWrite.cpp
   Statement insert();
   Statement update();

@@ -37,6 +37,10 @@ class Writer {
   void write(const SetOption& set);
   void write(const Transaction& transaction);
   void write(const Call& call);
+  void write(const AlterDatabase& alter);
+  void write(const BackupDatabase& backup);
+  void write(const RestoreDatabase& restore);
+  void write(const VerifyBackup& verify);
 
   void write(const Select& select);
   void write(const Expression& expression, int least = strength::any);

@@ -245,7 +245,37 @@ struct Call {
   std::vector<ExpressionPtr> arguments;
 };
 
-using Statement = std::variant<SelectPtr, Insert, Update, Delete, CreateTable, CreateView, CreateIndex, CreateSynonym,
-                               CreateLogin, Drop, Use, SetOption, Transaction, Call>;
+// alter database name set single_user | multi_user [with no_wait]
+struct AlterDatabase {
+  String database;
+  bool singleUser = false;
+  bool noWait = false;
+};
+
+// backup database name to disk = 'file' with init
+struct BackupDatabase {
+  String database;
+  Token file;
+};
+
+// restore database name from disk = 'file' with [move 'name' to 'file', ...] replace
+struct RestoreDatabase {
+  struct Move {
+    Token name;
+    Token file;
+  };
+  String database;
+  Token file;
+  std::vector<Move> moves;
+};
+
+// restore verifyonly from disk = 'file'
+struct VerifyBackup {
+  Token file;
+};
+
+using Statement =
+    std::variant<SelectPtr, Insert, Update, Delete, CreateTable, CreateView, CreateIndex, CreateSynonym, CreateLogin,
+                 Drop, Use, SetOption, Transaction, Call, AlterDatabase, BackupDatabase, RestoreDatabase, VerifyBackup>;
 
 }  // namespace QVSa::tsql

@@ -137,5 +137,16 @@ TEST(Script, is_cut_at_lines_that_hold_go_alone) {
   EXPECT_TRUE(splitScript("\n go\n").empty());
 }
 
+TEST(Statement, administration_is_read_with_its_files) {
+  EXPECT_TRUE(only<AlterDatabase>("alter database a set single_user with no_wait").noWait);
+  EXPECT_FALSE(only<AlterDatabase>("alter database a set multi_user").singleUser);
+  EXPECT_EQ(only<BackupDatabase>("backup database [a b] to disk='c' with init").file.text, "c");
+  EXPECT_EQ(only<VerifyBackup>("restore verifyonly from disk=N'd''e'").file.text, "d'e");
+  const auto restore =
+      only<RestoreDatabase>("restore database a from disk='c' with move 'x' to 'y', move 'z' to 'w', replace");
+  ASSERT_EQ(restore.moves.size(), 2U);
+  EXPECT_EQ(restore.moves[1].name.text + restore.moves[1].file.text, "zw");
+}
+
 }  // namespace
 }  // namespace QVSa::tsql

@@ -1,0 +1,46 @@
+#pragma once
+
+#include <chrono>
+#include <optional>
+#include <sqlite3.h>
+#include <string>
+
+#include "QVSa/frame/Failure.h"
+#include "QVSa/frame/Values.h"
+#include "providers/embedded/Functions.h"
+
+namespace QVSa::embedded {
+
+using Deadline = std::optional<std::chrono::steady_clock::time_point>;
+
+// 3201 for a file that cannot be opened or made, by the system's error number.
+Failure cannotOpenDevice(const String& path, int systemError);
+
+// The file of a backup, opened for reading, its form checked: throws 3201 where it cannot be opened, 3241 where it is
+// no backup of this engine, 3169 for one of a newer layout.
+class BackupFile {
+ public:
+  BackupFile(const String& path, Deadline deadline);
+  ~BackupFile();
+  BackupFile(const BackupFile&) = delete;
+  BackupFile& operator=(const BackupFile&) = delete;
+
+  sqlite3* get() const { return handle_; }
+  // Reads all of it. Throws 3241 for a damaged one, the time-out behind the deadline.
+  void check();
+
+ private:
+  static int onProgress(void* self);
+
+  void open();
+  void checkForm();
+  std::string read(const std::string& query);
+  [[noreturn]] void refuse() const;
+
+  String path_;
+  Deadline deadline_;
+  sqlite3* handle_ = nullptr;
+  FunctionContext context_;
+};
+
+}  // namespace QVSa::embedded

@@ -1,0 +1,169 @@
+#include <filesystem>
+#include <gtest/gtest.h>
+#include <thread>
+
+#include "QVSa/frame/ConnectionString.h"
+#include "providers/embedded/Pool.h"
+#include "providers/embedded/Provider.h"
+#include "tests/support/Failures.h"
+#include "tests/support/TestInstallation.h"
+
+namespace QVSa::test {
+
+namespace {
+
+class Administration : public testing::Test {
+ protected:
+  std::unique_ptr<ProviderSession> open(const std::string& database) {
+    return embedded::provider().open(parseConnectionString(buildConnString(installation_.server(), database, false)));
+  }
+  std::unique_ptr<ProviderSession> administrator() {
+    return embedded::provider().open(parseConnectionString(installation_.administratorString("master")));
+  }
+  static Long native(ProviderSession& session, const std::string& text, int seconds = 1) {
+    return thrownBy([&] { session.run({text, false, std::chrono::seconds(seconds)}); }).native();
+  }
+  static Variant value(ProviderSession& session, const std::string& text) {
+    const auto result = session.run({text});
+    return result.rows->next() ? result.rows->value(0) : Variant();
+  }
+  std::string file(const std::string& name) const { return (folder_.path() / name).string(); }
+  std::string restoring(const std::string& database, const std::string& name) const {
+    return "restore database " + database + " from disk=N'" + file(name) + "' with replace";
+  }
+
+  TestInstallation installation_{TestInstallation::Content::empty};
+  TestFolder folder_;
+};
+
+const std::string alone = "alter database QVSys set single_user";
+const std::string shared = "alter database QVSys set multi_user";
+
+}  // namespace
+
+TEST_F(Administration, SingleUserModeWaitsForTheSessionsOfTheDatabase) {
+  auto session = administrator();
+  auto user = open("QVSys");
+  EXPECT_EQ(native(*session, alone + " with no_wait"), 5061);
+  EXPECT_EQ(failureOf([&] { session->run({alone, false, std::chrono::seconds(1)}); }), number::timeout);
+  std::thread leaving([&] {
+    std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    user.reset();
+  });
+  EXPECT_EQ(native(*session, alone, 0), 0) << "one kept warm in the pool holds nothing";
+  leaving.join();
+}
+
+TEST_F(Administration, SingleUserModeKeepsAllOthersOut) {
+  auto session = administrator();
+  auto elsewhere = open("QVApp");
+  session->run({"create table QVSys..t (n int null)"});
+  session->run({alone});
+  EXPECT_EQ(failureOf([&] { open("QVSys"); }), number::login);
+  EXPECT_EQ(native(*elsewhere, "use QVSys"), 924);
+  EXPECT_EQ(native(*elsewhere, "select * from QVSys..t"), 924);
+  EXPECT_EQ(native(*elsewhere, "insert into QVSys..t(n) values(1)"), 924);
+  EXPECT_EQ(native(*elsewhere, shared), 924);
+  EXPECT_EQ(native(*session, "use QVSys"), 0);
+  EXPECT_EQ(native(*session, "select * from t"), 0);
+  session->run({shared});
+  EXPECT_EQ(native(*elsewhere, "select * from QVSys..t"), 0);
+  session->run({"use master"});
+  session->run({alone});
+  session.reset();
+  EXPECT_EQ(native(*elsewhere, "use QVSys"), 0) << "the mode ends with its session";
+}
+
+TEST_F(Administration, AStatementElsewhereStandsAgainstItUntilItIsDone) {
+  auto session = administrator();
+  auto elsewhere = open("QVApp");
+  session->run({"create table QVSys..t (n int null)"});
+  session->run({"insert into QVSys..t(n) values(1)"});
+  session->run({"insert into QVSys..t(n) values(2)"});
+  {
+    const auto rows = elsewhere->run({"select n from QVSys..t"});
+    ASSERT_TRUE(rows.rows->next());
+    EXPECT_EQ(native(*session, alone + " with no_wait"), 5061) << "the row set is still open";
+  }
+  EXPECT_EQ(native(*session, alone + " with no_wait"), 0);
+  session->run({shared});
+  elsewhere->begin();
+  elsewhere->run({"update QVSys..t set n=3"});
+  EXPECT_EQ(native(*session, alone + " with no_wait"), 5061) << "so is the transaction";
+  elsewhere->rollback();
+  EXPECT_EQ(native(*session, alone + " with no_wait"), 0);
+}
+
+TEST_F(Administration, ARestoreBringsTheCopyBackAndEverySessionSeesIt) {
+  auto session = administrator();
+  session->run({"create table QVSys..t (n int not null primary key)"});
+  session->run({"insert into QVSys..t(n) values(1)"});
+  session->run({"backup database QVSys to disk='" + file("a") + "' with init"});
+  auto warm = open("QVApp");
+  EXPECT_EQ(value(*warm, "select count(*) from QVSys..t").toLong(), 1);
+  // As many definitions as the copy has, and other ones: the count alone does not tell them apart.
+  session->run({"drop table QVSys..t"});
+  session->run({"create table QVSys..t (name nvarchar(9) null)"});
+  EXPECT_TRUE(value(*warm, "select max(name) from QVSys..t").isNull());
+  warm.reset();
+  session->run({restoring("QVSys", "a")});
+  warm = open("QVApp");
+  EXPECT_EQ(value(*warm, "select max(n) from QVSys..t").toLong(), 1);
+  EXPECT_EQ(native(*warm, "select name from QVSys..t"), 207);
+  EXPECT_EQ(native(*warm, "insert into QVSys..t(n) values(1)"), 2627);
+}
+
+TEST_F(Administration, ARestoreNeedsTheDatabaseForItself) {
+  auto session = administrator();
+  session->run({"backup database QVSys to disk='" + file("a") + "' with init"});
+  auto user = open("QVSys");
+  EXPECT_EQ(native(*session, restoring("QVSys", "a")), 3101);
+  EXPECT_EQ(native(*user, restoring("QVApp", "a")), 3110);
+  user.reset();
+  session->run({"use QVSys"});
+  EXPECT_EQ(native(*session, restoring("QVSys", "a")), 3102);
+  session->run({"use master"});
+  EXPECT_EQ(native(*session, restoring("QVSys", "a")), 0);
+  const std::string data = (installation_.folder() / "QVSys.db").string();
+  const auto moving = [&](const std::string& name, const std::string& target) {
+    return "restore database QVSys from disk='" + file("a") + "' with move '" + name + "' to '" + target + "', replace";
+  };
+  EXPECT_EQ(native(*session, moving("QVSys", data)), 0);
+  EXPECT_EQ(native(*session, moving("QVSys", data + "x")), 3156);
+  EXPECT_EQ(native(*session, moving("QVApp", data)), 3234);
+}
+
+TEST_F(Administration, WhatIsNoBackupIsRefused) {
+  auto session = administrator();
+  EXPECT_EQ(native(*session, restoring("QVSys", "none")), 3201);
+  std::filesystem::create_directory(file("folder"));
+  EXPECT_EQ(native(*session, restoring("QVSys", "folder")), 3241);
+  sqlite3* foreign = nullptr;
+  ASSERT_EQ(sqlite3_open(file("foreign").c_str(), &foreign), SQLITE_OK);
+  EXPECT_EQ(
+      sqlite3_exec(foreign, "create table engine(layout); insert into engine values(1)", nullptr, nullptr, nullptr),
+      SQLITE_OK);
+  sqlite3_close(foreign);
+  EXPECT_EQ(native(*session, restoring("QVSys", "foreign")), 3241);
+
+  session->run({"backup database QVSys to disk='" + file("newer") + "' with init"});
+  ASSERT_EQ(sqlite3_open(file("newer").c_str(), &foreign), SQLITE_OK);
+  EXPECT_EQ(sqlite3_exec(foreign, "update engine set layout=layout+1", nullptr, nullptr, nullptr), SQLITE_OK);
+  sqlite3_close(foreign);
+  EXPECT_EQ(native(*session, restoring("QVSys", "newer")), 3169);
+}
+
+TEST_F(Administration, ABackupTakesTheOldFilesPlaceOnlyWhenItIsWhole) {
+  auto session = open("master");
+  const std::string backup = "backup database QVSys to disk='" + file("a") + "' with init";
+  session->run({backup});
+  session->run({"restore verifyonly from disk='" + file("a") + "'"});
+  session->run({"create table QVSys..t (n int null)"});
+  session->run({backup});
+  EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder_.path()), {}), 1) << "nothing is left beside it";
+  std::filesystem::create_directories(file("taken") + "/inside");
+  EXPECT_EQ(native(*session, "backup database QVSys to disk='" + file("taken") + "' with init"), 3201);
+  EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder_.path()), {}), 2) << "a failed one is gone";
+}
+
+}  // namespace QVSa::test
