@@ -23,6 +23,8 @@ inline constexpr const char* connPwdTail = "_k3Zt";
 // The ten characters of the rotated key, as codes, so that the key stands nowhere as one text.
 inline constexpr std::array<unsigned char, 10> rotatedKeyCharacters{0x4B, 0x39, 0x74, 0x5F, 0x52,
                                                                     0x32, 0x78, 0x2D, 0x4D, 0x6A};
+// Where in them the key of the backup lock begins, 0 to 9.
+inline constexpr int backupLockKeyStart = 6;
 
 // The key of the passwords that protect report templates, and the password of a template that nobody gave one.
 inline constexpr const char* templatePwdKey = "+2741Wq$53";

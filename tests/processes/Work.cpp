@@ -84,6 +84,40 @@ void clearLog(const Words& words) {
   writeLine(log.clearLog(&type) ? "cleared" : failureText(log.errNumber(), log.errDescription()));
 }
 
+void stay(const Words& words) {
+  Connection connection;
+  connection.Open(buildConnString(words.at(0), words.at(1), false));
+  writeLine("staying");
+  ::pause();
+}
+
+void restore(const Words& words) {
+  DBMgr manager;
+  const bool done = manager.RestoreDB(words.at(0), words.at(1), words.at(2), words.at(3));
+  writeLine(done ? "done" : failureText(manager.errNumber(), manager.errDescription()));
+}
+
+void write(const Words& words) {
+  for (int times = 1;; ++times) {
+    try {
+      Connection connection;
+      connection.Open(buildConnString(words.at(0), "QVSys", false));
+      connection.BeginTrans();
+      connection.Execute("update pair set n=n+1 where id=1");
+      connection.Execute("update pair set n=n+1 where id=2");
+      connection.CommitTrans();
+    } catch (const Failure& failure) {
+      writeLine(failureText(failure.number(), failure.description()));
+    }
+    User ann;
+    ann.connect(words.at(0), "QVApp");
+    // Two who take a number at one moment collide, backup or not.
+    if (!ann.loginAuth("ann", "right") && ann.errNumber() != number::integrity)
+      writeLine(failureText(ann.errNumber(), ann.errDescription()));
+    if (times == 1) writeLine("writing");
+  }
+}
+
 }  // namespace
 
 int doWork(const Words& words) {
@@ -95,6 +129,9 @@ int doWork(const Words& words) {
   if (words.at(0) == "hold") hold(arguments);
   if (words.at(0) == "clear-log") clearLog(arguments);
   if (words.at(0) == "load-as-nobody") loadAsNobody(arguments);
+  if (words.at(0) == "stay") stay(arguments);
+  if (words.at(0) == "restore") restore(arguments);
+  if (words.at(0) == "write") write(arguments);
   return 0;
 }
 

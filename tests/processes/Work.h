@@ -15,6 +15,10 @@ namespace QVSa::test {
 //   clear-log SERVER                clears type 1 of the log of QVSys: "clearing", then "cleared" or the failure
 //   load-as-nobody SERVER           gives up the rights of root and loads the administrator; the failure's number in
 //                                   hexadecimal and its text
+//   stay SERVER DATABASE            opens a connection to the database; "staying", and stays
+//   restore SERVER SYS APP PASSWORD restores the two files; "done", or the failure's number and text
+//   write SERVER                    adds 1 to both rows of the table pair in one transaction, signs Ann on, and so on
+//                                   without end; "writing" after the first time, and a line for each failure
 // Gives the exit code.
 int doWork(const std::vector<std::string>& words);
 

@@ -1,0 +1,224 @@
+#include <filesystem>
+
+#include "QVSa/frame/Providers.h"
+#include "QVSa/frame/Text.h"
+#include "QVSa/maintenance/BackupLock.h"
+#include "platform/Files.h"
+#include "providers/embedded/Provider.h"
+#include "tests/support/RecordingProvider.h"
+#include "tests/support/Scene.h"
+
+namespace QVSa::test {
+namespace {
+
+class Backups : public Scene {
+ protected:
+  static constexpr const char* password = "test-admin";
+
+  String file(const String& name) const { return folder_.path().string() + "\\" + name; }
+  void backUp(const String& lock = "") {
+    ASSERT_TRUE(manager_.BackUpDB(server(), file("sys.bak"), file("app.bak"), "", lock)) << manager_.errDescription();
+  }
+  Boolean restore() { return restore(server()); }
+  Boolean restore(const String& where) { return manager_.RestoreDB(where, file("sys.bak"), file("app.bak"), password); }
+  void addReports() { tables_.run("insert into reports(repId,repName) select 3,'a' union all select 5,'b'"); }
+  String spec() const { return tables_.text("select roleSpec from roles where roleId=4"); }
+
+  TestFolder folder_;
+  DBMgr manager_;
+};
+
+TEST_F(Backups, BringBackWhatWasThereAndClearWhatWasTransient) {
+  addUser("ann");
+  tables_.run("insert into idRule(idName,ymdStyle,noStyle) values('inv',0,4)");
+  tables_.run("insert into seslog(sesId,userLogin) values('1','ann')");
+  tables_.run("insert into repTmps(rtUid,ifCheckOut,checkOutBy) values('t',1,7)");
+  tables_.run(
+      "insert into CFWorkItems(wiId,state,checkOutBy,checkOutByName) select 'w',1,7,'ann' union all "
+      "select 'v',2,8,'bob'");
+  backUp();
+  addUser("bob");
+  tables_.run("delete from idRule where idName='inv'");
+  ASSERT_TRUE(restore()) << manager_.errDescription();
+
+  EXPECT_EQ(tables_.text("select userLogin from users where userId>1"), "ann");
+  EXPECT_EQ(tables_.text("select idName from idRule where predefined=0"), "inv");
+  EXPECT_EQ(tables_.text("select count(*) from seslog"), "0");
+  EXPECT_EQ(tables_.text("select ifCheckOut,checkOutBy from repTmps"), "0|-");
+  EXPECT_EQ(tables_.text("select wiId,state,checkOutBy,checkOutByName from CFWorkItems order by wiId"),
+            "v|2|8|bob\nw|0|0|");
+  auto ann = connected<User>();
+  EXPECT_TRUE(ann.loginAuth("ann", "right")) << ann.errDescription();
+}
+
+TEST_F(Backups, OfOneInstallationRestoreIntoAnother) {
+  addUser("ann");
+  backUp();
+  const TestInstallation other;
+  ASSERT_TRUE(restore(other.server())) << manager_.errDescription();
+  User ann;
+  ann.connect(other.server(), "QVApp");
+  String session;
+  EXPECT_TRUE(ann.loginAuth("ann", "right", &session)) << ann.errDescription();
+  EXPECT_EQ(PlainSession(other.server()).text("select userLogin from seslog"), "ann");
+}
+
+TEST_F(Backups, AreRefusedWhereAFileIsMissing) {
+  EXPECT_FALSE(restore());
+  EXPECT_EQ(manager_.errNumber(), messageNumber(2903));
+  EXPECT_EQ(manager_.errDescription(),
+            "Database restoring error.Application database backup file [" + file("app.bak") + "] does not exist.");
+  backUp();
+  std::filesystem::remove(folder_.path() / "sys.bak");
+  EXPECT_FALSE(restore());
+  EXPECT_EQ(manager_.errNumber(), messageNumber(2904));
+}
+
+TEST_F(Backups, NeedTheAdministratorToRestore) {
+  backUp();
+  EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), "wrong"));
+  EXPECT_EQ(manager_.errNumber(), number::login);
+  EXPECT_EQ(manager_.errDescription(), "Login failed for user 'sa'.:18456");
+  EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), defaultDbPwd(), false, "QVUser"));
+  EXPECT_EQ(manager_.errDescription(), "User does not have permission to RESTORE database 'QVSys'.:3110");
+  EXPECT_EQ(tables_.text("select count(*) from users"), "1") << "and the database is back for all";
+}
+
+TEST_F(Backups, SendTheirStatementsInOrder) {
+  std::vector<String> log;
+  {
+    RecordingProvider recorder;
+    backUp("lock");
+    log = recorder.log();
+  }
+  const String sys = file("sys.bak"), app = file("app.bak");
+  EXPECT_EQ(
+      log,
+      (Lines{"open master", "use QVSys", "select isnull(roleSpec) from roles where roleId=4",
+             "select repId from reports", "use master", " backup database QVApp to DISK = '" + app + "' with init",
+             " backup database QVSys to DISK = '" + sys + "' with init", "restore verifyonly from disk='" + sys + "'",
+             "restore verifyonly from disk='" + app + "'", "select repId from reports", "close"}));
+  {
+    RecordingProvider recorder;
+    ASSERT_TRUE(restore());
+    log = recorder.log();
+  }
+  const String data = (installation_.folder() / "QVSys.db").string();
+  const Lines first(log.begin(), log.begin() + 9);
+  EXPECT_EQ(first, (Lines{"open master", "alter database QVSys set SINGLE_USER", "use QVSys",
+                          "select name, fileName from sysfiles", "use master",
+                          "RESTORE DATABASE QVSys FROM DISK = N'" + sys + "' With  move N'QVSys' to N'" + data +
+                              "', move N'QVSys_log' to N'" + data + "-wal',replace",
+                          "alter database QVSys set MULTI_USER", "use QVSys", "sp_changedbowner N'QVUser'"}));
+}
+
+TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
+  backUp("lock");
+  EXPECT_EQ(spec(), "-") << "without reports there is nothing to lock";
+  addReports();
+  backUp("lock");
+  const auto lock = BackupLock::read(spec());
+  ASSERT_TRUE(lock) << "the lock stays on the running system";
+  EXPECT_EQ(lock->list + "|" + lock->pwd, "3.5|lock");
+  backUp();
+  EXPECT_NE(spec(), "-") << "without a password nobody touches it";
+
+  ASSERT_TRUE(restore());
+  QVAgent agent;
+  agent.connect(server());
+  EXPECT_EQ(agent.hiddenReps(), "3.5");
+  EXPECT_FALSE(manager_.decryptTmps(server(), "Lock"));
+  EXPECT_EQ(manager_.errNumber(), messageNumber(2909));
+  EXPECT_EQ(manager_.errDescription(), "Incorrect password.");
+  EXPECT_NE(spec(), "");
+  EXPECT_TRUE(manager_.decryptTmps(server(), "lock"));
+  EXPECT_EQ(spec(), "");
+  EXPECT_TRUE(manager_.decryptTmps(server(), "anything"));
+}
+
+TEST_F(Backups, OfAnOlderReleaseGetTheTableOfRoles) {
+  const auto makeOld = [&](const String& release) {
+    tables_.run("delete from QVSys..sysinfo");
+    if (!release.empty()) tables_.run("insert into QVSys..sysinfo(release) values('" + release + "')");
+  };
+  addUser("ann", [](User&) {});
+  tables_.run("update users set isRole=1,isAbstract=1,userDesc='a role',userPwd='spec' where userLogin='ann'");
+  PlainSession(server(), "QVSys").run("drop table roles");
+  makeOld("");
+  backUp();
+  ASSERT_TRUE(restore()) << manager_.errDescription();
+  EXPECT_EQ(tables_.text("select roleId,roleName,roleDesc,roleSpec,builtIn from roles"),
+            tables_.text("select userId from users where userLogin='ann'") + "|Ann|a role|spec|1");
+  for (const char* release : {"6.6.5", "7.0", "", "8"}) {
+    makeOld(release[0] == 0 ? " " : release);
+    backUp();
+    EXPECT_TRUE(restore()) << release << ": " << manager_.errDescription();
+  }
+  makeOld("6.6.4");
+  backUp();
+  EXPECT_FALSE(restore()) << "the table is there already";
+  EXPECT_EQ(manager_.errDescription().rfind("Database restoring error.There is already an object named", 0), 0U)
+      << manager_.errDescription();
+}
+
+// A database whose log is kept from the reader.
+class OneFileSession : public ProviderSession {
+ public:
+  explicit OneFileSession(const ConnectionOptions& options) : inner_(embedded::provider().open(options)) {}
+  BatchResult run(const Batch& batch) override {
+    return inner_->run({replaceAll(batch.text, "select name", "select top 1 name"), batch.updatable, batch.timeout});
+  }
+  void begin() override { inner_->begin(); }
+  void commit() override { inner_->commit(); }
+  void rollback() override { inner_->rollback(); }
+
+ private:
+  std::unique_ptr<ProviderSession> inner_;
+};
+
+TEST_F(Backups, OfADatabaseWithOneFileAreRefused) {
+  backUp();
+  SessionOpener before =
+      interposeOpener([](const ConnectionOptions& options) { return std::make_unique<OneFileSession>(options); });
+  EXPECT_FALSE(restore());
+  interposeOpener(std::move(before));
+  EXPECT_EQ(manager_.errNumber(), messageNumber(2907));
+  EXPECT_EQ(manager_.errDescription(), "The backup fies has error, can not be restored.");
+  EXPECT_TRUE(restore()) << "the database is in multi-user mode again: " << manager_.errDescription();
+}
+
+TEST_F(Backups, LeaveTheDatabaseToAllWhereARestoreFails) {
+  backUp();
+  for (const char* statement : {"use QVSys", "RESTORE DATABASE QVSys"}) {
+    RecordingProvider recorder;
+    recorder.beforeEach([&](const String& event) {
+      if (event.rfind(statement, 0) == 0) throw Failure(number::statement, "SQL Server", "Made up.", 911);
+    });
+    EXPECT_FALSE(restore());
+    EXPECT_EQ(manager_.errDescription(), "Made up.:911");
+    EXPECT_EQ(recorder.log().at(recorder.log().size() - 2), "alter database QVSys set MULTI_USER");
+  }
+}
+
+TEST_F(Backups, DamagedOrForeignAreRefused) {
+  backUp();
+  const auto damage = [&](std::size_t from) {
+    Bytes content = platform::readFile(file("sys.bak"));
+    for (std::size_t i = from; i < from + 4000 && i < content.size(); ++i) content[i] = 0x5A;
+    platform::writeFile(file("sys.bak"), content);
+  };
+  addUser("ann");
+  damage(5 * 4096);
+  EXPECT_FALSE(restore());
+  EXPECT_EQ(manager_.errDescription().substr(manager_.errDescription().size() - 5), ":3241");
+  platform::writeFile(file("sys.bak"), {});
+  EXPECT_FALSE(restore());
+  EXPECT_EQ(manager_.errNumber(), number::statement);
+  EXPECT_EQ(tables_.text("select userLogin from users where userId>1"), "ann") << "nothing was touched";
+  EXPECT_FALSE(manager_.BackUpDB(server(), file("no\\sys.bak"), file("app.bak")));
+  EXPECT_EQ(manager_.errNumber(), messageNumber(2906));
+  EXPECT_EQ(manager_.errDescription().rfind("Database backup error.Cannot open backup device", 0), 0U);
+}
+
+}  // namespace
+}  // namespace QVSa::test

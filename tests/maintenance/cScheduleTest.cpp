@@ -1,0 +1,170 @@
+#include "tests/support/EnvironmentLocale.h"
+#include "tests/support/Scene.h"
+
+namespace QVSa::test {
+namespace {
+
+Date at(const String& text) { return *Date::parse(text); }
+
+// Once a day at ten.
+cSchedule once(Integer cycle, Integer cycleNum = 1) {
+  cSchedule schedule;
+  schedule.cycle(cycle);
+  schedule.cycleNum(cycleNum);
+  schedule.timesOneDay(1);
+  schedule.StartTime(at("10:00:00"));
+  return schedule;
+}
+
+cSchedule repeating(Integer interval, Integer unit, Integer cycle = 0) {
+  cSchedule schedule;
+  schedule.cycle(cycle);
+  schedule.StartTime(at("08:00:00"));
+  schedule.interval(interval);
+  schedule.valUnit(unit);
+  return schedule;
+}
+
+String next(cSchedule& schedule, const String& now) { return schedule.GetNextTime(at(now)).text(); }
+
+}  // namespace
+
+TEST(ASchedule, CountsDaysFromNow) {
+  auto second = once(0, 2);
+  EXPECT_EQ(next(second, "2026-03-10 09:00"), "2026-03-10 10:00:00");
+  EXPECT_EQ(next(second, "2026-03-10 11:00"), "2026-03-12 10:00:00");
+  auto daily = once(0);
+  EXPECT_EQ(next(daily, "2026-03-10 10:00:00"), "2026-03-11 10:00:00") << "what is due just now is not due again";
+}
+
+TEST(ASchedule, SkipsWeeksBehindASunday) {
+  auto schedule = once(1, 2);
+  schedule.wks("1000100");
+  EXPECT_EQ(next(schedule, "2026-03-11 12:00"), "2026-03-13 10:00:00");
+  EXPECT_EQ(next(schedule, "2026-03-13 12:00"), "2026-03-23 10:00:00");
+  auto empty = once(1, 3);
+  EXPECT_EQ(next(empty, "2026-03-11 12:00"), "2026-04-01 10:00:00") << "no weekday: the same one again";
+  schedule.wks("10");
+  EXPECT_EQ(next(schedule, "2026-03-11 12:00"), "2026-03-23 10:00:00") << "missing weekdays are none";
+}
+
+TEST(ASchedule, CutsTheDayToTheMonth) {
+  auto schedule = once(2);
+  schedule.monthDay(31);
+  EXPECT_EQ(next(schedule, "2026-01-31 12:00"), "2026-02-28 10:00:00");
+  EXPECT_EQ(next(schedule, "2026-02-28 11:00"), "2026-03-31 10:00:00");
+  schedule.monthDay(30);
+  EXPECT_EQ(next(schedule, "2026-02-15 09:00"), "2026-02-28 10:00:00");
+  EXPECT_EQ(next(schedule, "2026-02-28 11:00"), "2026-03-30 10:00:00");
+  schedule.monthDay(0);
+  EXPECT_EQ(next(schedule, "2026-01-31 09:00"), "2026-01-31 10:00:00");
+  auto quarterly = once(2, 3);
+  quarterly.monthDay(15);
+  EXPECT_EQ(next(quarterly, "2026-01-15 11:00"), "2026-04-15 10:00:00");
+  EXPECT_EQ(next(quarterly, "2026-01-10 11:00"), "2026-01-15 10:00:00") << "a day still ahead in this month is taken";
+}
+
+TEST(ASchedule, RepeatsUntilMidnight) {
+  auto hours = repeating(2, 0);
+  EXPECT_EQ(next(hours, "2026-03-10 09:30"), "2026-03-10 10:00:00");
+  auto hourly = repeating(1, 0);
+  EXPECT_EQ(next(hourly, "2026-03-10 23:10"), "2026-03-11 08:00:00");
+  auto quarters = repeating(15, 1);
+  EXPECT_EQ(next(quarters, "2026-03-10 23:50"), "2026-03-11 08:00:00");
+}
+
+TEST(ASchedule, KeepsTodaysSlotOnTheNextRunDay) {
+  auto schedule = repeating(2, 0, 1);
+  schedule.wks("1000000");
+  EXPECT_EQ(next(schedule, "2026-03-15 13:00"), "2026-03-16 14:00:00");
+}
+
+TEST(ASchedule, IsASlotLateBeforeItsStart) {
+  auto hourly = repeating(1, 0);
+  EXPECT_EQ(next(hourly, "2026-03-10 07:30"), "2026-03-10 09:00:00");
+  EXPECT_EQ(next(hourly, "2026-03-10 06:30"), "2026-03-10 08:00:00");
+  EXPECT_EQ(next(hourly, "2026-03-10 05:30"), "2026-03-10 07:00:00");
+}
+
+TEST(ASchedule, WithoutACycleIsATimeAlone) {
+  auto schedule = once(3);
+  EXPECT_EQ(next(schedule, "2026-03-10 09:00"), "10:00:00");
+}
+
+TEST(ASchedule, GivesTheTimeThatItReachedWhereItFails) {
+  auto schedule = once(0);
+  schedule.wks("11111111");
+  EXPECT_EQ(schedule.GetNextTime(at("2026-03-10 09:00")), Date());
+  EXPECT_EQ(schedule.errNumber(), number::position);
+
+  auto wide = repeating(600, 0);
+  EXPECT_EQ(wide.GetNextTime(at("2026-03-10 09:00")), Date()) << "a step of 36,000 minutes has no 16 bits";
+  EXPECT_EQ(wide.errNumber(), number::overflow);
+
+  auto far = once(1, 20000);
+  EXPECT_EQ(next(far, "2026-03-15 11:00"), "10:00:00") << "the time of day was known before the day failed";
+  EXPECT_EQ(far.errNumber(), number::overflow);
+  auto odd = once(1);
+  odd.wks("0000x00");
+  EXPECT_EQ(next(odd, "2026-03-11 11:00"), "10:00:00");
+  EXPECT_EQ(odd.errNumber(), number::type);
+}
+
+TEST(ASchedule, DescribesItself) {
+  const EnvironmentLocale english("C");
+  auto schedule = once(0, 2);
+  EXPECT_EQ(schedule.description(), "Occurs every [2] day(s)\r\nat [10:00:00]");
+  schedule = repeating(15, 1, 1);
+  schedule.wks("1000100");
+  EXPECT_EQ(schedule.description(),
+            "Occurs every [1] week(s) on [Monday, Friday]\r\nfrom [08:00:00], every [15 Minute(s)] hour(s).");
+  schedule = once(2, 3);
+  schedule.monthDay(15);
+  EXPECT_EQ(schedule.description(), "Occurs every [3] month(s) on day [15] of that month\r\nat [10:00:00]");
+  schedule.monthDay(0);
+  schedule.timesOneDay(0);
+  EXPECT_EQ(schedule.description(),
+            "Occurs every [3] month(s) on the last day if that month\r\nfrom [10:00:00], every [0 Hour(s)] hour(s).");
+  schedule.cycle(7);
+  schedule.timesOneDay(1);
+  EXPECT_EQ(schedule.description(), "\r\nat [10:00:00]");
+  schedule.timesOneDay(0);
+  schedule.valUnit(9);
+  EXPECT_EQ(schedule.description(), "") << "there is no such unit to name";
+  EXPECT_EQ(schedule.errNumber(), number::argument);
+}
+
+class DueTasks : public Scene {
+ protected:
+  Long due(const String& base) { return schedule_.getNextSch(at(base), type_, task_, run_, moment_); }
+
+  cSchedule schedule_ = connected<cSchedule>();
+  Integer type_ = -7;
+  Long task_ = -7;
+  Long run_ = -7;
+  Date moment_;
+};
+
+TEST_F(DueTasks, AreTheFirstPendingOnesFromAMomentOn) {
+  EXPECT_EQ(due("2024-03-07"), 0);
+  EXPECT_EQ(task_, -7) << "untouched";
+  tables_.run("insert into tasks(taskName,taskType) values('one',2)");
+  tables_.run("insert into QVTaskSche(taskId,schNo,pTime,state) values(1,1,'20240306 10:00:00',1)");
+  tables_.run("insert into QVTaskSche(taskId,schNo,pTime) values(1,2,'20240308 10:00:00')");
+  tables_.run("insert into QVTaskSche(taskId,schNo,pTime) values(1,3,'20240307 11:00:00')");
+  EXPECT_EQ(due("2024-03-01"), 1) << schedule_.errDescription();
+  EXPECT_EQ(type_, 2);
+  EXPECT_EQ(task_, 1);
+  EXPECT_EQ(run_, 3);
+  EXPECT_EQ(moment_.text(), "2024-03-07 11:00:00");
+  EXPECT_EQ(due("2024-03-08 10:00:00"), 1);
+  EXPECT_EQ(run_, 2);
+  EXPECT_EQ(due("2024-03-08 10:00:01"), 0) << "what was missed is not offered again";
+
+  cSchedule nowhere;
+  nowhere.connect("file:" + installation_.folder().string() + "-gone");
+  EXPECT_EQ(nowhere.getNextSch(at("2024-03-01"), type_, task_, run_, moment_), -1);
+  EXPECT_EQ(nowhere.errNumber(), number::general);
+}
+
+}  // namespace QVSa::test
