@@ -148,20 +148,4 @@ void deleteFile(const String& path) {
   if (::unlink(target.c_str()) != 0 && errno != ENOENT && errno != ENOTDIR) fail(target);
 }
 
-std::optional<Date> lastModified(const String& path) {
-  struct stat state {};
-  if (::stat(localPath(path).c_str(), &state) != 0) return std::nullopt;
-  std::tm parts{};
-  localtime_r(&state.st_mtim.tv_sec, &parts);
-  const Date second(parts.tm_year + 1900, parts.tm_mon + 1, parts.tm_mday, parts.tm_hour, parts.tm_min,
-                    std::min(parts.tm_sec, 59));
-  constexpr double nanosecondsOfDay = 86400e9;
-  return second.addDays(static_cast<double>(state.st_mtim.tv_nsec) / nanosecondsOfDay);
-}
-
-void deleteFile(const String& path) {
-  const std::filesystem::path target = localPath(path);
-  if (::unlink(target.c_str()) != 0 && errno != ENOENT) fail(target);
-}
-
 }  // namespace QVSa::platform
