@@ -25,7 +25,7 @@ demo: packages  ## Make an installation, fill it with an organisation, walk the 
 	$(say) 'Building the demonstration (build/release)'
 	@cmake --preset release --log-level=NOTICE
 	@cmake --build --preset release -j $(JOBS) --target qvsa_console sign_on_road registration_road \
-	  log_and_classes made_up_organisation
+	  log_and_classes organisation_walk made_up_organisation
 	@tools/demo.sh
 
 test: build  ## Build and run all tests, then the quick ones once more under the sanitizers

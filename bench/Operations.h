@@ -8,6 +8,7 @@ namespace QVSa::bench {
 void addUserPairs();
 void addNumberPairs();
 void addDepartmentPairs();
+void addOrganisationPairs();
 void addLogPairs();
 void addClassPairs();
 void addHomePairs();

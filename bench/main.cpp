@@ -12,6 +12,7 @@ int main(int argc, char** argv) {
     QVSa::bench::addUserPairs();
     QVSa::bench::addNumberPairs();
     QVSa::bench::addDepartmentPairs();
+    QVSa::bench::addOrganisationPairs();
     QVSa::bench::addLogPairs();
     QVSa::bench::addClassPairs();
     QVSa::bench::addHomePairs();

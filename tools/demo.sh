@@ -37,6 +37,11 @@ login=$(sed -n 2p "$organisation/users.csv" | cut -d, -f1)
 "$programs/examples/sign_on_road" "$QVSA_SERVER" "$login"
 
 echo
+echo "== A walk through the organisation =="
+login=$(cut -d, -f1 "$organisation/holdings.csv" | sed 1d | sort | uniq -c | sort -rn | awk 'NR == 1 { print $2 }')
+"$programs/examples/organisation_walk" "$QVSA_SERVER" "$login"
+
+echo
 echo "== From the application to the account =="
 "$programs/examples/registration_road" "$QVSA_SERVER"
 
@@ -46,6 +51,11 @@ echo "== The system log and the report classes =="
 
 echo
 echo "== What the console sees now =="
+"$programs/console/qvsa" role list
+echo
+"$programs/console/qvsa" dept tree | head -30
+echo "..."
+echo
 "$programs/console/qvsa" log list --type 2
 echo
 "$programs/console/qvsa" class tree
