@@ -25,6 +25,9 @@ void addProtection(Console& console);
 void addSettings(Console& console);
 void addRegistration(Console& console);
 void addDirectory(Console& console);
+void addBackups(Console& console);
+void addPlans(Console& console);
+void addAgent(Console& console);
 void addDoctor(Console& console);
 
 }  // namespace QVSa::console

@@ -21,6 +21,9 @@ int main(int argc, char** argv) {
   QVSa::console::addSettings(console);
   QVSa::console::addRegistration(console);
   QVSa::console::addDirectory(console);
+  QVSa::console::addBackups(console);
+  QVSa::console::addPlans(console);
+  QVSa::console::addAgent(console);
   QVSa::console::addDoctor(console);
   return console.main(argc, argv);
 }

@@ -1,0 +1,203 @@
+#include <algorithm>
+#include <memory>
+
+#include "QVSa/frame/ConnectionString.h"
+#include "QVSa/frame/Text.h"
+#include "QVSa/maintenance/BKPlans.h"
+#include "console/Commands.h"
+#include "console/ServerPath.h"
+#include "console/Table.h"
+#include "console/Waiting.h"
+
+namespace QVSa::console {
+
+namespace {
+
+struct Options {
+  String plan;
+  String folder;
+  Integer cycle = 0;
+  Integer every = 1;
+  std::vector<String> weekdays;
+  Integer day = 0;
+  String at = "02:00";
+  Integer repeat = 0;
+  Integer unit = 0;
+  Integer keep = -1;
+  Integer keepUnit = 0;
+};
+
+const std::map<String, Integer> cycles{{"days", 0}, {"weeks", 1}, {"months", 2}};
+const std::map<String, Integer> units{{"hours", 0}, {"minutes", 1}};
+const std::vector<String> weekdayNames{"mon", "tue", "wed", "thu", "fri", "sat", "sun"};
+
+BKPlan load(const Console& console, const String& name) {
+  BKPlan plan;
+  console.connect(plan);
+  require(plan.GetOne(2, name), plan);
+  return plan;
+}
+
+// The rows of a plan have no operation of the library.
+std::vector<std::vector<Variant>> query(const Console& console, const String& text) {
+  Connection connection;
+  connection.Open(buildConnString(console.place().server, "", false));
+  return connection.Execute(text).GetRows();
+}
+
+String maskOf(const std::vector<String>& weekdays) {
+  String mask = "0000000";
+  for (const String& day : weekdays) {
+    const auto place = std::ranges::find(weekdayNames, lowerCase(day));
+    if (place == weekdayNames.end()) throw Misuse("There is no weekday " + day + ".");
+    mask[static_cast<std::size_t>(place - weekdayNames.begin())] = '1';
+  }
+  return mask;
+}
+
+Date timeOf(const String& text) {
+  const auto time = Date::parse(text);
+  if (!time || time->days() >= 1) throw Misuse(text + " is no time of day.");
+  return *time;
+}
+
+String keptFor(BKPlan& plan) {
+  if (!plan.delFiles()) return "for ever";
+  for (const auto& [name, unit] : cycles)
+    if (unit == plan.delUnit()) return std::to_string(plan.delNum()) + " " + name;
+  return "for ever";
+}
+
+// The next pending run, or nothing.
+Json nextOf(const Console& console, const BKPlan& plan) {
+  const auto rows = query(console, "select min(pTime) from QVTaskSche where state=0 and taskId=" + text(plan.Id()));
+  return rows[0][0].isNull() ? Json() : Json(rows[0][0].toText());
+}
+
+Answer show(const Console& console, const String& name) {
+  BKPlan plan = load(console, name);
+  Sheet sheet;
+  sheet.line("Plan", "plan", plan.Name()).line("Number", "id", plan.Id()).line("Folder", "folder", plan.bkPath());
+  sheet.line("When", "schedule", replaceAll(plan.schedule()->description(), "\r\n", ", "));
+  sheet.line("Backups kept", "kept", keptFor(plan)).line("Next run", "next", nextOf(console, plan));
+  return {sheet.text(), sheet.document()};
+}
+
+Answer add(const Console& console, const Options& options) {
+  BKPlan plan;
+  console.connect(plan);
+  plan.Name(options.plan);
+  plan.bkPath(serverPath(console, options.folder));
+  cSchedule& when = *plan.schedule();
+  when.cycle(options.cycle);
+  when.cycleNum(options.every);
+  when.wks(maskOf(options.weekdays));
+  when.monthDay(options.day);
+  when.timesOneDay(options.repeat == 0 ? 1 : 0);
+  when.StartTime(timeOf(options.at));
+  when.interval(options.repeat);
+  when.valUnit(options.unit);
+  plan.delFiles(options.keep >= 0);
+  plan.delNum(std::max<Integer>(options.keep, 0));
+  plan.delUnit(options.keepUnit);
+  require(plan.Save(), plan);
+  Answer answer = show(console, options.plan);
+  answer.text = "The plan is added. `qvsa agent run` runs it.\n\n" + answer.text;
+  return answer;
+}
+
+Answer list(const Console& console) {
+  BKPlans plans;
+  console.connect(plans);
+  require(plans.GetAll(), plans);
+  Table table({{"Plan", "plan"}, {"Folder", "folder"}, {"When", "schedule"}, {"Next run", "next"}});
+  for (const auto& plan : plans)
+    table.row({plan->Name(), plan->bkPath(), replaceAll(plan->schedule()->description(), "\r\n", ", "),
+               nextOf(console, *plan)});
+  return {table.size() == 0 ? "There are no backup plans.\n" : table.text(), {{"plans", table.document()}}};
+}
+
+Answer run(const Console& console, const String& name) {
+  BKPlan plan = load(console, name);
+  plan.newSche();
+  const auto rows = query(console, "select max(schNo) from QVTaskSche where state=0 and taskId=" + text(plan.Id()));
+  const Long number = rows[0][0].toLong();
+  {
+    const Waiting waiting("Backing up");
+    require(plan.exec(number), plan);
+  }
+  const auto folder =
+      query(console, "select msg from QVTaskSche where taskId=" + text(plan.Id()) + " and schNo=" + text(number))[0][0]
+          .toText();
+  return {"Run " + text(number) + " of " + plan.Name() + " is done: " + folder + "\n",
+          {{"plan", plan.Name()}, {"run", number}, {"folder", folder}}};
+}
+
+Answer remove(const Console& console, const String& name) {
+  BKPlan plan = load(console, name);
+  require(plan.Delete(), plan);
+  return {"The plan " + plan.Name() + " is removed; its folders stay.\n", {{"plan", plan.Name()}, {"removed", true}}};
+}
+
+Answer history(const Console& console, const String& name) {
+  const BKPlan plan = load(console, name);
+  static const std::map<Long, String> states{{0, "pending"}, {1, "done"}, {2, "failed"}};
+  Table table({{"Run", "run"}, {"Due", "due"}, {"State", "state"}, {"Folder", "folder"}});
+  for (const auto& row : query(console, "select schNo,pTime,state,msg from QVTaskSche where taskId=" + text(plan.Id()) +
+                                            " order by schNo")) {
+    const auto state = states.find(row[2].toLong());
+    table.row({row[0].toLong(), row[1].isNull() ? "" : row[1].toText(),
+               state == states.end() ? row[2].toText() : state->second, row[3].isNull() ? "" : row[3].toText()});
+  }
+  return {table.text(), {{"plan", plan.Name()}, {"runs", table.document()}}};
+}
+
+void addAdding(Console& console, CLI::App* group, const std::shared_ptr<Options>& options) {
+  CLI::App* command = group->add_subcommand("add", "Add a plan");
+  command->add_option("plan", options->plan)->required();
+  command->add_option("folder", options->folder, "The folder under which each run makes its own; it has to exist")
+      ->required();
+  command->add_option("--every", options->every, "Every so many days, weeks or months")
+      ->check(CLI::PositiveNumber)
+      ->capture_default_str();
+  command->add_option("--cycle", options->cycle, "days (the default), weeks or months")
+      ->transform(CLI::CheckedTransformer(cycles, CLI::ignore_case));
+  command->add_option("--weekdays", options->weekdays, "Of a weekly plan, as mon,thu")->delimiter(',');
+  command->add_option("--day", options->day, "Of a monthly plan; 0 is the month's last day")
+      ->check(CLI::Range(0, 31))
+      ->capture_default_str();
+  command->add_option("--at", options->at, "The time of day, or the first of a day")->capture_default_str();
+  command->add_option("--repeat", options->repeat, "Again after so many hours, until midnight");
+  command->add_option("--repeat-unit", options->unit, "hours (the default) or minutes")
+      ->transform(CLI::CheckedTransformer(units, CLI::ignore_case));
+  command->add_option("--keep", options->keep, "Remove this plan's backups that are older")
+      ->check(CLI::NonNegativeNumber);
+  command->add_option("--keep-unit", options->keepUnit, "days (the default), weeks or months")
+      ->transform(CLI::CheckedTransformer(cycles, CLI::ignore_case));
+  console.command(command, [&console, options] { return add(console, *options); });
+}
+
+using Operation = Answer (*)(const Console&, const String&);
+
+void addNamed(Console& console, CLI::App* group, const std::shared_ptr<Options>& options, const String& name,
+              const String& description, Operation operation) {
+  CLI::App* command = group->add_subcommand(name, description);
+  command->add_option("plan", options->plan)->required();
+  console.command(command, [&console, options, operation] { return operation(console, options->plan); });
+}
+
+}  // namespace
+
+void addPlans(Console& console) {
+  const auto options = std::make_shared<Options>();
+  CLI::App* group = console.app().add_subcommand("plan", "Backups on a schedule")->require_subcommand(1);
+  addAdding(console, group, options);
+  CLI::App* listCommand = group->add_subcommand("list", "All plans");
+  console.command(listCommand, [&console] { return list(console); });
+  addNamed(console, group, options, "show", "A plan", show);
+  addNamed(console, group, options, "run", "Run a plan now, in place of its next run", run);
+  addNamed(console, group, options, "remove", "Remove a plan", remove);
+  addNamed(console, group, options, "history", "The runs of a plan", history);
+}
+
+}  // namespace QVSa::console
