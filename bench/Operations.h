@@ -12,6 +12,7 @@ void addOrganisationPairs();
 void addLogPairs();
 void addClassPairs();
 void addHomePairs();
+void addMaintenancePairs();
 
 // Prints how a day of the log is found, and the memory that an export of it takes.
 void tellLogFacts();

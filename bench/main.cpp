@@ -16,6 +16,7 @@ int main(int argc, char** argv) {
     QVSa::bench::addLogPairs();
     QVSa::bench::addClassPairs();
     QVSa::bench::addHomePairs();
+    QVSa::bench::addMaintenancePairs();
     QVSa::bench::runPairs();
     QVSa::bench::tellLogFacts();
     return 0;

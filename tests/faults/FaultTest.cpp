@@ -31,7 +31,8 @@ class Ground {
          {"users",        "userPwdHis", "userJob",   "GrpUser", "agentuser", "saferule",      "seslog",
           "departments",  "jobs",       "idRule",    "idRec",   "idDel",     "QVSys..idRec",  "syslog",
           "RptDirectory", "AclRule",    "QVTmpSafe", "repTmps", "homeinfo",  "QVUserRegInfo", "QVMailQ",
-          "roles",        "ItemGroups", "grpRole",   "userMgr", "fldAcl",    "cftJob",        "repAcl"})
+          "roles",        "ItemGroups", "grpRole",   "userMgr", "fldAcl",    "cftJob",        "repAcl",
+          "tasks",        "QVBkPlan",   "QVTaskSche"})
       result.push_back(session.text(String("select * from ") + table));
     return result;
   }

@@ -3,6 +3,7 @@
 #include "QVSa/QVSa.h"
 #include "platform/SecretMessage.h"
 #include "tests/faults/LogAndClassOperations.h"
+#include "tests/faults/MaintenanceOperations.h"
 #include "tests/faults/OrganisationOperations.h"
 #include "tests/faults/SettingsOperations.h"
 #include "tests/faults/Shapes.h"
@@ -212,13 +213,14 @@ void fillGround(const String& server) {
   fillLogAndClasses(server);
   fillSettings(server);
   fillOrganisation(server);
+  fillMaintenance(server);
 }
 
 const std::vector<Operation>& operations() {
   static const std::vector<Operation> all = [] {
     std::vector<Operation> result;
     for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations(),
-                      logAndClassOperations(), settingsOperations(), organisationOperations()})
+                      logAndClassOperations(), settingsOperations(), organisationOperations(), maintenanceOperations()})
       result.insert(result.end(), part.begin(), part.end());
     return result;
   }();
@@ -238,8 +240,8 @@ const std::vector<LetPass>& letPass() {
         {"User.regAudit", "select * from homeinfo", false, "without the settings no mail is queued"},
         {"User.regAudit", "select count(*) from reptmps", false, "the settings are loaded by then"},
     };
-    const std::vector<LetPass> more = organisationLetPass();
-    result.insert(result.end(), more.begin(), more.end());
+    for (const std::vector<LetPass>& more : {organisationLetPass(), maintenanceLetPass()})
+      result.insert(result.end(), more.begin(), more.end());
     return result;
   }();
   return points;

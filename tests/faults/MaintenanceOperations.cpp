@@ -1,0 +1,110 @@
+#include "tests/faults/MaintenanceOperations.h"
+
+#include "QVSa/QVSa.h"
+#include "QVSa/maintenance/BackupLock.h"
+#include "tests/faults/Shapes.h"
+#include "tests/support/PlainSession.h"
+#include "tests/support/TestInstallation.h"
+
+namespace QVSa::test {
+
+namespace {
+
+// Where the plan's backups go; each run of a test writes the same folder.
+String backupPath() {
+  static const TestFolder folder;
+  return folder.path().string();
+}
+
+void loadPlan(BKPlan& plan) { require(plan.GetOne(2, "nightly")); }
+
+void fillPlan(BKPlan& plan) {
+  plan.Name("weekly");
+  plan.bkPath(backupPath());
+  plan.schedule()->timesOneDay(1);
+}
+
+std::vector<Operation> planOperations() {
+  const String failed = LoadResString(3103) + LoadResString(2906);
+  const Long number = messageNumber(2906);
+  return {
+      operation<BKPlan>("BKPlan.GetOne", nothing<BKPlan>,
+                        [](BKPlan& plan, const String&) { return plan.GetOne(2, "nightly"); }),
+      operation<BKPlan>(
+          "BKPlan.Save of a new plan", fillPlan, [](BKPlan& plan, const String&) { return plan.Save(); }, told(3115),
+          true),
+      operation<BKPlan>(
+          "BKPlan.Save", loadPlan, [](BKPlan& plan, const String&) { return plan.Save(); }, told(3115), true),
+      operation<BKPlan>(
+          "BKPlan.Delete", loadPlan, [](BKPlan& plan, const String&) { return plan.Delete(); }, told(3114), true),
+      operation<BKPlan>("BKPlan.exec", loadPlan, [](BKPlan& plan, const String&) { return plan.exec(1); },
+                        {{"use master", failed, false, number},
+                         {" backup database", failed, false, number},
+                         {"restore verifyonly", failed, false, number}}),
+      operation<BKPlans>(
+          "BKPlans.GetAll", nothing<BKPlans>, [](BKPlans& plans, const String&) { return plans.GetAll(); }, told(3104)),
+  };
+}
+
+// A class without a connect, whose operations name their server.
+Operation managerOperation(const char* name, std::function<bool(DBMgr&, const String& server)> run,
+                           std::vector<Report> reports) {
+  const auto prepare = [run](const String& server) -> std::function<Outcome()> {
+    return [run, server] {
+      DBMgr manager;
+      const bool positive = run(manager, server);
+      return Outcome{positive, manager.errNumber(), manager.errDescription()};
+    };
+  };
+  return {name, prepare, std::move(reports), false};
+}
+
+}  // namespace
+
+std::vector<Operation> maintenanceOperations() {
+  std::vector<Operation> result = planOperations();
+  result.push_back(
+      operation<cSchedule>("cSchedule.getNextSch", nothing<cSchedule>, [](cSchedule& schedule, const String&) {
+        Integer type = 0;
+        Long task = 0;
+        Long run = 0;
+        Date due;
+        return schedule.getNextSch(Date(2024, 3, 1), type, task, run, due) == 1;
+      }));
+  result.push_back(managerOperation("DBMgr.BackUpDB with a lock",
+                                    [](DBMgr& manager, const String& server) {
+                                      return manager.BackUpDB(server, backupPath() + "/sys", backupPath() + "/app", "",
+                                                              "lock");
+                                    },
+                                    {{"", LoadResString(2906), false, messageNumber(2906)}}));
+  result.push_back(
+      managerOperation("DBMgr.decryptTmps",
+                       [](DBMgr& manager, const String& server) { return manager.decryptTmps(server, "lock"); }, {}));
+  return result;
+}
+
+std::vector<LetPass> maintenanceLetPass() {
+  constexpr const char* noNumber = "the log row has no number then";
+  constexpr const char* noLock = "a lock that can't be read or set does not hold the backup up";
+  return {
+      {"BKPlan.exec", "select preFix", false, noNumber},
+      {"BKPlan.exec", "select maxId", false, noNumber},
+      {"BKPlan.exec", "insert into idRec", false, noNumber},
+      {"DBMgr.BackUpDB with a lock", "select isnull(roleSpec)", false, noLock},
+      {"DBMgr.BackUpDB with a lock", "select repId from reports", false, noLock},
+      {"DBMgr.BackUpDB with a lock", "update roles", false, noLock},
+  };
+}
+
+void fillMaintenance(const String& server) {
+  BKPlan plan;
+  plan.connect(server, "QVApp");
+  fillPlan(plan);
+  plan.Name("nightly");
+  require(plan.Save());
+  // Reports, so that there is something to lock, and a lock to lift.
+  PlainSession(server).run("insert into reports(repId,repName) values(3,'a') update roles set roleSpec=N'" +
+                           BackupLock{"3", "lock"}.cipher() + "' where roleId=4");
+}
+
+}  // namespace QVSa::test
