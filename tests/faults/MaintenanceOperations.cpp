@@ -38,9 +38,9 @@ std::vector<Operation> planOperations() {
       operation<BKPlan>(
           "BKPlan.Delete", loadPlan, [](BKPlan& plan, const String&) { return plan.Delete(); }, told(3114), true),
       operation<BKPlan>("BKPlan.exec", loadPlan, [](BKPlan& plan, const String&) { return plan.exec(1); },
-                        {{"use master", failed, false, number},
-                         {" backup database", failed, false, number},
-                         {"restore verifyonly", failed, false, number}}),
+                        {{"use master", failed, false, number, true},
+                         {" backup database", failed, false, number, true},
+                         {"restore verifyonly", failed, false, number, true}}),
       operation<BKPlans>(
           "BKPlans.GetAll", nothing<BKPlans>, [](BKPlans& plans, const String&) { return plans.GetAll(); }, told(3104)),
   };
@@ -89,7 +89,7 @@ std::vector<LetPass> maintenanceLetPass() {
   return {
       {"BKPlan.exec", "select preFix", false, noNumber},
       {"BKPlan.exec", "select maxId", false, noNumber},
-      {"BKPlan.exec", "insert into idRec", false, noNumber},
+      {"BKPlan.exec", "update idRec", false, noNumber},
       {"DBMgr.BackUpDB with a lock", "select isnull(roleSpec)", false, noLock},
       {"DBMgr.BackUpDB with a lock", "select repId from reports", false, noLock},
       {"DBMgr.BackUpDB with a lock", "update roles", false, noLock},

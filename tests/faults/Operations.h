@@ -18,7 +18,8 @@ struct Report {
   String statement;
   String prefix;
   bool silent = false;
-  Long number = 0;  // in place of the failure's
+  Long number = 0;      // in place of the failure's
+  bool goesOn = false;  // the operation does all the rest, and so writes
 };
 
 struct Operation {
