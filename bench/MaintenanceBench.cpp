@@ -24,17 +24,13 @@ std::size_t megabytes() {
   return wanted == nullptr ? 32 : std::stoul(wanted);
 }
 
-// Databases of a size, a file of the same size, and a plan's rows.
+// Databases of a size, and a file of the same size.
 struct Ground {
   Ground() {
     Storage storage(installation.folder());
     storage.execute("begin");
     Query blob(storage, "insert into QVSys.QVMailQ(emBody,emState) values(hex(randomblob(512*1024)),0)");
     for (std::size_t i = 0; i < megabytes(); ++i) blob.start().run();
-    storage.execute("insert into QVSys.tasks(taskName,taskType) values('nightly',2)");
-    storage.execute(
-        "with recursive n(i) as (select 1 union all select i+1 from n where i<1000000) "
-        "insert into QVSys.QVTaskSche(taskId,schNo,pTime,state) select 1,i,13000000000000+i*18000,i<999000 from n");
     storage.execute("commit");
     std::ofstream(file()) << std::string(megabytes() << 20, 'x');
   }
@@ -49,6 +45,23 @@ struct Ground {
 const Ground& ground() {
   static const Ground made;
   return made;
+}
+
+// An installation with a plan that ran for years, and its next runs.
+const test::TestInstallation& longHistory() {
+  static const test::TestInstallation installation;
+  static const bool filled = [] {
+    Storage storage(installation.folder());
+    storage.execute("begin");
+    storage.execute("insert into QVSys.tasks(taskName,taskType) values('nightly',2)");
+    storage.execute(
+        "with recursive n(i) as (select 1 union all select i+1 from n where i<1000000) "
+        "insert into QVSys.QVTaskSche(taskId,schNo,pTime,state) select 1,i,13000000000000+i*18000,i<999000 from n");
+    storage.execute("commit");
+    return true;
+  }();
+  static_cast<void>(filled);
+  return installation;
 }
 
 void requireStorage(int code) {
@@ -131,7 +144,7 @@ Call sumFloor() {
 
 std::shared_ptr<cSchedule> schedule() {
   auto made = std::make_shared<cSchedule>();
-  made->connect(ground().installation.server());
+  made->connect(longHistory().server());
   made->cycle(1);
   made->wks("1000100");
   made->interval(15);
@@ -175,7 +188,7 @@ class DueFloor {
   void run() { query_.start(std::int64_t{0}).step(); }
 
  private:
-  Storage storage_{ground().installation.folder()};
+  Storage storage_{longHistory().folder()};
   Query query_{storage_,
                "select t.taskType,t.taskId,s.schNo,s.pTime from QVSys.QVTaskSche s join QVSys.tasks t on "
                "t.taskId=s.taskId where s.state=0 and s.pTime>=?1 order by s.pTime limit 1"};
