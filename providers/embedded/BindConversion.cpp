@@ -21,7 +21,7 @@ bool sameForm(const Type& from, const Type& to, Purpose purpose) {
 
 }  // namespace
 
-BoundPtr Binder::parameter(Parameter value) {
+BoundPtr Binder::parameter(const Parameter& value) {
   auto bound = std::make_unique<BoundExpression>();
   bound->kind = BoundExpression::Kind::parameter;
   bound->type = value.type;

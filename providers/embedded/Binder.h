@@ -129,7 +129,7 @@ class Binder {
   static BoundPtr collate(BoundPtr value);
   // The type that two types meet in, by the dialect's precedence.
   static Type common(const Type& a, const Type& b);
-  BoundPtr parameter(Parameter value);
+  BoundPtr parameter(const Parameter& value);
   Parameter literalParameter(const tsql::Token& token, Parameter::Source source) const;
 
   static BoundPtr call(const std::string& function, const Type& type, std::vector<BoundPtr> operands);
