@@ -7,6 +7,7 @@
 #include "providers/embedded/Binder.h"
 #include "providers/embedded/Emitter.h"
 #include "providers/embedded/Literal.h"
+#include "providers/embedded/PushDown.h"
 #include "providers/tsql/OuterJoins.h"
 
 namespace QVSa::embedded {
@@ -35,6 +36,7 @@ Step compileQuery(const tsql::Select& select, Binder& binder, bool updatable) {
   Step step;
   step.kind = Step::Kind::query;
   const BoundQuery query = binder.bindQuery(select, updatable);
+  pushDown(*query.select);
   step.main = std::make_unique<Compiled>(emit(*query.select));
   setColumns(step, *query.select);
   if (query.claim) setClaim(step, *query.claim);
