@@ -91,9 +91,7 @@ bool matchesLike(std::string_view value, std::string_view text, std::optional<ch
       retry = at;
       continue;
     }
-    const char* const before = at;
     if (pattern.take(foldCase(nextSymbol(at, end)))) continue;
-    at = before;
     if (!behindAny) return false;
     nextSymbol(retry, end);
     at = retry;

@@ -6,17 +6,11 @@
 
 namespace QVSa::odbc {
 
-namespace {
-
-SQLPOINTER number(std::int64_t value) { return reinterpret_cast<SQLPOINTER>(static_cast<SQLULEN>(value)); }
-
-}  // namespace
-
 Connection::Connection(const String& odbcText, const String& password, std::chrono::seconds loginTimeout) {
   if (!SQL_SUCCEEDED(SQLAllocHandle(SQL_HANDLE_DBC, environment(), &handle_))) {
     throw failure(diagnostics(SQL_HANDLE_ENV, environment()));
   }
-  SQLSetConnectAttrW(handle_, SQL_ATTR_LOGIN_TIMEOUT, number(loginTimeout.count()), SQL_IS_UINTEGER);
+  SQLSetConnectAttrW(handle_, SQL_ATTR_LOGIN_TIMEOUT, attributeValue(loginTimeout.count()), SQL_IS_UINTEGER);
   std::u16string text = toWide(odbcText);
   const SQLRETURN rc = SQLDriverConnectW(handle_, nullptr, wideData(text), static_cast<SQLSMALLINT>(text.size()),
                                          nullptr, 0, nullptr, SQL_DRIVER_NOPROMPT);
@@ -66,7 +60,7 @@ void Connection::makeRoom() {
 }
 
 void Connection::autocommit(bool on) {
-  check(SQLSetConnectAttrW(handle_, SQL_ATTR_AUTOCOMMIT, number(on ? SQL_AUTOCOMMIT_ON : SQL_AUTOCOMMIT_OFF),
+  check(SQLSetConnectAttrW(handle_, SQL_ATTR_AUTOCOMMIT, attributeValue(on ? SQL_AUTOCOMMIT_ON : SQL_AUTOCOMMIT_OFF),
                            SQL_IS_UINTEGER));
 }
 

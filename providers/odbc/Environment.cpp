@@ -8,9 +8,8 @@ namespace {
 
 SQLHENV makeEnvironment() {
   SQLHENV handle = SQL_NULL_HENV;
-  const auto version = reinterpret_cast<SQLPOINTER>(SQLULEN{SQL_OV_ODBC3});
   if (!SQL_SUCCEEDED(SQLAllocHandle(SQL_HANDLE_ENV, SQL_NULL_HANDLE, &handle)) ||
-      !SQL_SUCCEEDED(SQLSetEnvAttr(handle, SQL_ATTR_ODBC_VERSION, version, 0))) {
+      !SQL_SUCCEEDED(SQLSetEnvAttr(handle, SQL_ATTR_ODBC_VERSION, attributeValue(SQL_OV_ODBC3), 0))) {
     throw Failure(number::general, "ODBC", "The ODBC driver manager is not available.");
   }
   return handle;

@@ -3,23 +3,18 @@
 #include <algorithm>
 #include <limits>
 
+#include "providers/odbc/Environment.h"
 #include "providers/odbc/Failure.h"
 
 namespace QVSa::odbc {
-
-namespace {
-
-SQLPOINTER number(std::int64_t value) { return reinterpret_cast<SQLPOINTER>(static_cast<SQLULEN>(value)); }
-
-}  // namespace
 
 Statement::Statement(SQLHDBC connection, std::chrono::seconds timeout) {
   if (!SQL_SUCCEEDED(SQLAllocHandle(SQL_HANDLE_STMT, connection, &handle_))) {
     throw failure(diagnostics(SQL_HANDLE_DBC, connection));
   }
   // A driver that has no time-out, or sends texts unread anyway, refuses these; nothing is lost by that.
-  SQLSetStmtAttrW(handle_, SQL_ATTR_QUERY_TIMEOUT, number(timeout.count()), SQL_IS_UINTEGER);
-  SQLSetStmtAttrW(handle_, SQL_ATTR_NOSCAN, number(SQL_NOSCAN_ON), SQL_IS_UINTEGER);
+  SQLSetStmtAttrW(handle_, SQL_ATTR_QUERY_TIMEOUT, attributeValue(timeout.count()), SQL_IS_UINTEGER);
+  SQLSetStmtAttrW(handle_, SQL_ATTR_NOSCAN, attributeValue(SQL_NOSCAN_ON), SQL_IS_UINTEGER);
 }
 
 Statement::~Statement() { SQLFreeHandle(SQL_HANDLE_STMT, handle_); }
