@@ -68,10 +68,10 @@ lint:  ## Check format and run clang-tidy over all sources
 	$(say) 'Checking the format'
 	@clang-format --dry-run --Werror $(sources)
 	$(say) 'Running clang-tidy'
-	@cmake --preset release --log-level=NOTICE
-	@cmake --build --preset release -j $(JOBS) --target qvsa_database
+	@cmake --preset release -B build/lint -DCMAKE_DISABLE_PRECOMPILE_HEADERS=ON --log-level=NOTICE
+	@cmake --build build/lint -j $(JOBS) --target qvsa_database
 	@git ls-files --cached --others --exclude-standard '*.cpp' | grep -v '^bench/\|Fuzz' | \
-	  xargs -P $(JOBS) -n 4 clang-tidy -p build/release --quiet --extra-arg=-Wno-unknown-warning-option --warnings-as-errors='*'
+	  xargs -P $(JOBS) -n 4 clang-tidy -p build/lint --quiet --extra-arg=-Wno-unknown-warning-option --warnings-as-errors='*'
 
 clean:  ## Remove everything that was built
 	@rm -rf build
