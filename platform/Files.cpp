@@ -106,6 +106,7 @@ void writeFile(const String& path, const Bytes& content) {
 }
 
 NewFile::NewFile(const String& path) : target_(localPath(path)), beside_(nameBeside(target_)) {
+  if (!target_.has_filename()) throw runtimeFailure(number::pathAccess);
   requireWritable(target_);
   handle_ = ::open(beside_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
   if (handle_ < 0) fail(target_);

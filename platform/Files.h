@@ -25,7 +25,8 @@ std::optional<Date> lastModified(const String& path);
 void deleteFile(const String& path);
 
 // A file that is written piece by piece beside its target and takes its place at the end: nobody ever sees a part of
-// it. A target that is there and can't be written, or is no plain file, is refused at once.
+// it. A path without a file's name, and a target that is there and can't be written or is no plain file, are refused at
+// once.
 class NewFile {
  public:
   explicit NewFile(const String& path);

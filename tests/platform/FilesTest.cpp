@@ -1,11 +1,13 @@
 #include <gtest/gtest.h>
 #include <unistd.h>
 
-#include "QVSa/frame/Failure.h"
 #include "platform/Files.h"
+#include "tests/support/Failures.h"
 
 namespace QVSa::platform {
 namespace {
+
+using test::failureOf;
 
 class Files : public testing::Test {
  protected:
@@ -21,16 +23,6 @@ class Files : public testing::Test {
   std::size_t entries() const {
     return static_cast<std::size_t>(
         std::distance(std::filesystem::directory_iterator(folder_), std::filesystem::directory_iterator()));
-  }
-
-  template <typename Call>
-  static Long failure(Call call) {
-    try {
-      call();
-    } catch (const Failure& thrown) {
-      return thrown.number();
-    }
-    return 0;
   }
 
   std::filesystem::path folder_;
@@ -56,26 +48,30 @@ TEST_F(Files, AreFoundByEitherSeparator) {
 
 TEST_F(Files, FailWithTheRunTimesNumbers) {
   writeFile(path("file"), {1});
-  EXPECT_EQ(failure([&] { readFile(path("missing")); }), number::noFile);
-  EXPECT_EQ(failure([&] { readFile(path("missing/file")); }), number::noPath);
-  EXPECT_EQ(failure([&] { readFile(path("file/below")); }), number::noPath);
-  EXPECT_EQ(failure([&] { readFile(path("")); }), number::pathAccess);
-  EXPECT_EQ(failure([&] { writeFile(path("missing/file"), {1}); }), number::noPath);
+  EXPECT_EQ(failureOf([&] { readFile(path("missing")); }), number::noFile);
+  EXPECT_EQ(failureOf([&] { readFile(path("missing/file")); }), number::noPath);
+  EXPECT_EQ(failureOf([&] { readFile(path("file/below")); }), number::noPath);
+  EXPECT_EQ(failureOf([&] { readFile(path("")); }), number::pathAccess);
+  EXPECT_EQ(failureOf([&] { writeFile(path("missing/file"), {1}); }), number::noPath);
 }
 
-TEST_F(Files, ThatCannotTakeTheirPlaceLeaveNothingBehind) {
+TEST_F(Files, ThatDoNotTakeTheirPlaceLeaveNothingBehind) {
   std::filesystem::create_directories(folder_ / "taken" / "sub");
-  EXPECT_EQ(failure([&] { writeFile(path("taken"), {1}); }), number::pathAccess);
-  EXPECT_EQ(entries(), 1U);
+  EXPECT_EQ(failureOf([&] { writeFile(path("taken"), {1}); }), number::pathAccess);
+  EXPECT_EQ(failureOf([] { NewFile nameless(""); }), number::pathAccess);
+  writeFile(path("file"), {1});
+  NewFile(path("file")).write("given up");
+  EXPECT_EQ(readFile(path("file")), Bytes{1});
+  EXPECT_EQ(entries(), 2U);
 }
 
 TEST_F(Files, ThatTheUserMayNotTouchAreRefused) {
   if (geteuid() == 0) GTEST_SKIP() << "The superuser may touch everything.";
   writeFile(path("closed"), {1});
   std::filesystem::permissions(path("closed"), std::filesystem::perms::none);
-  EXPECT_EQ(failure([&] { readFile(path("closed")); }), number::accessDenied);
+  EXPECT_EQ(failureOf([&] { readFile(path("closed")); }), number::accessDenied);
   std::filesystem::permissions(folder_, std::filesystem::perms::owner_read | std::filesystem::perms::owner_exec);
-  EXPECT_EQ(failure([&] { writeFile(path("other"), {1}); }), number::accessDenied);
+  EXPECT_EQ(failureOf([&] { writeFile(path("other"), {1}); }), number::accessDenied);
   std::filesystem::permissions(folder_, std::filesystem::perms::owner_all);
 }
 
