@@ -6,6 +6,7 @@
 #include "console/Commands.h"
 #include "console/Table.h"
 #include "console/Waiting.h"
+#include "platform/Files.h"
 
 namespace QVSa::console {
 
@@ -77,7 +78,8 @@ Answer page(LogRecords& log, const Options& options) {
   const Long count = log.Count();
   const Long pages = (count + options.pageSize - 1) / options.pageSize;
   Recordset& rows = log.recordset();
-  for (Long i = 0; i < (options.page - 1) * options.pageSize && !rows.EOF_(); ++i) rows.MoveNext();
+  const std::int64_t before = (std::int64_t{options.page} - 1) * options.pageSize;
+  for (std::int64_t i = 0; i < before && !rows.EOF_(); ++i) rows.MoveNext();
   for (Long i = 0; i < options.pageSize && !rows.EOF_(); ++i, rows.MoveNext()) table.row(rowOf(rows));
   const String place = "Page " + std::to_string(options.page) + " of " + std::to_string(pages) + ", " +
                        std::to_string(count) + (count == 1 ? " entry" : " entries") + " in all.\n";
@@ -122,7 +124,7 @@ Answer exported(const Console& console, const Options& options) {
   LogRecords log;
   console.connect(log);
   exportTo(log, options);
-  const auto bytes = std::filesystem::file_size(options.file);
+  const auto bytes = std::filesystem::file_size(platform::localPath(options.file));
   return {"The log is in " + options.file + ", " + std::to_string(bytes) + " bytes.\n",
           {{"file", options.file}, {"bytes", bytes}}};
 }
