@@ -1,6 +1,7 @@
 #include <algorithm>
 #include <ctime>
 #include <memory>
+#include <optional>
 
 #include "QVSa/classification/Directory.h"
 #include "QVSa/identity/User.h"
@@ -79,7 +80,14 @@ Answer tree(const Console& console, const String& sentence = "") {
   return {sentence.empty() ? text : sentence + "\n\n" + text, {{"classes", document}}};
 }
 
+// The paths are made of names with dots around them, the full names and the lists of the library with commas between.
+void requirePlain(const String& name) {
+  if (name.empty() || name.find_first_of(",.") != String::npos)
+    throw Misuse("The name of a class can't be empty, nor hold a comma or a dot.");
+}
+
 Answer add(const Console& console, const Options& options) {
+  requirePlain(options.name);
   Directory node;
   console.connect(node);
   node.Class(options.name);
@@ -117,21 +125,37 @@ Answer move(const Console& console, const Options& options) {
   return tree(console, "The class is moved, with all below it, and the last there.");
 }
 
-void setOrder(const Console& console, const String& superior, const std::vector<String>& names) {
+// What the ordPath of a superior's members begins with; nothing where it was removed, or has no place in the order.
+std::optional<String> placeBelow(const Console& console, const String& superior) {
+  if (superior.empty()) return "";
   Directory above;
   console.connect(above);
-  String place;
-  if (!superior.empty()) place = load(console, superior).ordPath() + ".";
-  String list;
-  for (const String& name : names) list += (list.empty() ? "" : ",") + name;
-  require(above.updateSubOrder(place, list), above);
+  require(above.GetOne(byName, superior), above);
+  return above.ordPath().empty() ? std::nullopt : std::optional(above.ordPath() + ".");
+}
+
+// The members of one place as the library takes them.
+String listOf(const std::vector<String>& names) {
+  for (const String& name : names)
+    if (name.find(',') != String::npos) throw Misuse("A place with a comma in a class's name can't be put in order.");
+  return join(names, ",");
+}
+
+void setOrder(const Console& console, const String& ordPath, const String& list) {
+  Directory tree;
+  console.connect(tree);
+  require(tree.updateSubOrder(ordPath, list), tree);
 }
 
 // The library leaves the members under the old name of their superior, and puts what it saves to the end.
 Answer rename(const Console& console, const Options& options) {
+  requirePlain(options.newName);
   Directory node = load(console, options.name);
   const String oldName = node.Class();
+  const std::optional<String> place = placeBelow(console, node.superClass());
   std::vector<String> siblings = membersOf(console, node.superClass());
+  std::ranges::replace(siblings, oldName, options.newName);
+  const String list = place ? listOf(siblings) : "";
   const std::vector<String> members = membersOf(console, oldName);
   node.Class(options.newName);
   stamp(console, node, options.user);
@@ -141,8 +165,7 @@ Answer rename(const Console& console, const Options& options) {
     below.superClass(options.newName);
     require(below.Save(), below);
   }
-  std::ranges::replace(siblings, oldName, options.newName);
-  setOrder(console, node.superClass(), siblings);
+  if (place) setOrder(console, *place, list);
   return tree(console, "The class is renamed.");
 }
 
@@ -152,7 +175,9 @@ Answer order(const Console& console, const Options& options) {
   std::ranges::sort(known);
   std::ranges::sort(given);
   if (known != given) throw Misuse("Name all classes of that place, each once.");
-  setOrder(console, options.superior, options.names);
+  const std::optional<String> place = placeBelow(console, options.superior);
+  if (!place) throw Refusal(options.superior + " is not there, or has no place in the order itself.");
+  setOrder(console, *place, listOf(options.names));
   return tree(console, "The classes are in the new order.");
 }
 

@@ -33,16 +33,17 @@ TEST_F(LogAndClasses, EntriesAreWrittenFoundPagedExportedAndCleared) {
   const Outcome page = run("log list --type 1 --page-size 1 --page 2");
   EXPECT_EQ(functions(page), "one ");
   EXPECT_EQ(page.document["pages"], 2);
+  EXPECT_EQ(functions(run("log list --type 1 --page-size 100000 --page 2147483647")), "");
   for (const char* misuse : {"log query --users ,a", "log query --templates \"it's\"", "log list --from yesterday",
                              "log clear", "log clear --all --type 1", "log export x --type 4"})
     EXPECT_EQ(run(misuse).exitCode, 2) << misuse;
 
   const String file = (folder_.path() / "log.txt").string();
-  EXPECT_EQ(run("log export '" + file + "' --type 1").exitCode, 0);
+  const Outcome exported = run("log export '" + folder_.path().string() + "\\log.txt' --type 1");
+  EXPECT_EQ(exported.document["bytes"], std::filesystem::file_size(file));
   EXPECT_EQ(run("log clear --type 1 --export '" + folder_.path().string() + "'").exitCode, 1);
   EXPECT_EQ(value("select count(*) from QVApp..syslog"), "3") << "what could not be exported stays";
   EXPECT_EQ(run("log clear --type 1 --export '" + file + "'").exitCode, 0);
-  EXPECT_GT(std::filesystem::file_size(file), 100U);
   EXPECT_EQ(run("log clear --all").exitCode, 0);
   EXPECT_EQ(value("select count(*) from QVApp..syslog"), "0");
 }
@@ -61,6 +62,13 @@ TEST_F(LogAndClasses, ClassesAreKeptAsATree) {
   EXPECT_EQ(run("class remove First").exitCode, 1);
   EXPECT_EQ(run("class remove nothing").exitCode, 1);
   EXPECT_EQ(run("class remove First --cut-off").exitCode, 0);
+  EXPECT_EQ(names(run("class rename A11 Eleven")), "B A Eleven A,A2 ") << "what was cut off has no place";
+  EXPECT_EQ(run("class order Eleven --under First").exitCode, 1);
+  execute("insert into RptDirectory(class,superClass,path,fullName) values('x,y','','.x,y.','x,y')");
+  for (const char* misuse :
+       {"class add C.D", "class rename A ''", "class rename A a,b", "class order A B x,y", "class rename A C"})
+    EXPECT_EQ(run(misuse).exitCode, 2) << misuse;
+  EXPECT_EQ(value("select count(*) from RptDirectory where class in ('A','B','x,y')"), "3");
   EXPECT_EQ(value("select CreUName+UpdUName from RptDirectory where class='B'"),
             value("select userName+userName from users where userLogin='Admin'"));
 }
