@@ -7,8 +7,9 @@ namespace QVSa {
 // A node of the tree of report classes, and the operations on the whole tree.
 //   Directory node;  node.connect(server);
 //   node.Class("Invoices");  node.superClass("Sales");  node.Save();
-// Each row holds its ancestry three times, and the saves keep all three true: as a path, ".Sales.Invoices.", as a full
-// name, "Sales,Invoices", and as a text that sorts, "002.001".
+// Each row holds its ancestry three times: as a path, ".Sales.Invoices.", as a full name, "Sales,Invoices", and as a
+// text that sorts, the ordPath "002.001". A save keeps paths and full names true in all that lies below; the ordPath
+// more than one level down can be that of before.
 class Directory : private Frame {
  public:
   using Frame::connect;
@@ -60,7 +61,8 @@ class Directory : private Frame {
   // no such node.
   Boolean Delete(const String& Class = "");
   // Numbers the nodes named in `SubDirs`, "," between, in that order. `SuperOrdPath`: the ordPath above them with a
-  // trailing ".", empty for roots. Not one transaction.
+  // trailing ".", empty for roots. Not one transaction: a failure, as 5 at the thousandth name, leaves those before it
+  // renumbered.
   Boolean updateSubOrder(const String& SuperOrdPath, const String& SubDirs);
 
  private:

@@ -40,16 +40,18 @@ class IdMgr : private Frame {
   // holds the period's row at this moment (trying again is safe).
   String newId(const String& idName, const String& vConnstring = "", Long startNo = -1, const String& rcId = "",
                const String& sesId = "");
-  // Makes the next number of the current period `startNo`. 0 does nothing and is a success.
+  // Makes the next number of the current period `startNo`. 0 does nothing and is a success; a negative number issues an
+  // ordinary number, which is then used up.
   Boolean setStartNo(Long startNo);
 
   // Loads a rule; 0x800405DE where there is none.
   Boolean GetOne(const String& idName);
   // Removes the rule `idName` (empty: this one); its counters and released numbers stay.
   Boolean Delete(const String& idName = "");
-  // Inserts the rule, or updates the one that GetOne or an earlier Save left here. A width grown since GetOne widens
-  // the numbers already counted. 0x80040E2F the name is taken, 0x800405E4 the rule has issued numbers and can't be
-  // narrowed.
+  // Inserts the rule, or updates the one that GetOne or an earlier Save left here. A width above the one
+  // that GetOne read (0 where it never ran) widens the numbers already counted, with every Save anew: so call GetOne
+  // before another Save once numbers were issued, and after each change of the width, or numbers come twice. 0x80040E2F
+  // the name is taken, 0x800405E4 the rule has issued numbers and can't be narrowed.
   Boolean Save();
   // Loads `strOld` and saves it as `strNew`. Counters stay under the old name: the new one starts afresh.
   Boolean Rename(const String& strOld, const String& strNew);

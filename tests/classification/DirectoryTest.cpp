@@ -131,6 +131,19 @@ TEST_F(ReportClasses, GoToTheEndWithEverySaveAndTheRestMovesUp) {
   EXPECT_TRUE(node().updateSubOrder("", ""));
 }
 
+TEST_F(ReportClasses, ThatWereInsertedAndAreSavedAgainCloseAGapAmongTheRoots) {
+  for (const char* name : {"R1", "R2", "R3"}) add(name);
+  Directory b = node();
+  b.Class("B");
+  b.superClass("R1");
+  ASSERT_TRUE(b.Save());
+  b.ordNo(1);
+  ASSERT_TRUE(b.Save());
+  EXPECT_EQ(row("B"), ".R1.B.|R1,B|2|001.002");
+  EXPECT_EQ(row("R2"), ".R2.|R2|1|001");
+  EXPECT_EQ(row("R3"), ".R3.|R3|2|002");
+}
+
 TEST_F(ReportClasses, LoseAZeroWhereTheNumberLosesADigitUntilTheyAreReordered) {
   String names;
   for (int i = 1; i <= 10; ++i) {

@@ -128,6 +128,22 @@ TEST_F(Numbers, GoOnBehindTheWidthThatARuleWasGivenLater) {
   EXPECT_EQ(counters("inv"), "2024-03-01 00:00:00|AB240300000012\n2024-04-01 00:00:00|AB240400000008");
 }
 
+TEST_F(Numbers, ANewRuleIsInsertedThenUpdatedAndComesToDamageWithoutBeingRead) {
+  auto made = connected<IdMgr>();
+  made.idName("inv");
+  made.DateFormat(yymm);
+  made.numPlace(4);
+  EXPECT_TRUE(made.Save());
+  made.preFix("AB");
+  EXPECT_TRUE(made.Save()) << made.errDescription();
+  EXPECT_EQ(tables_.rows("select preFix,noStyle from idRule where idName='inv'"), Lines{"AB|4"});
+  EXPECT_EQ(issue("inv"), "AB24030001");
+  // The width that was read is 0 for it, so that the number grows by all its digits, at the end.
+  EXPECT_TRUE(made.Save());
+  EXPECT_EQ(counters("inv"), "2024-03-01 00:00:00|AB240300010000");
+  EXPECT_EQ(issue("inv"), "AB24030001");
+}
+
 TEST_F(Numbers, ARuleIsNarrowedOnlyBeforeItsFirstNumber) {
   addRule("inv", yymm, 4);
   IdMgr narrow = rule("inv");
@@ -164,6 +180,8 @@ TEST_F(Numbers, RunOutAtTheWidthOfTheRuleUntilItIsWidened) {
   addRule("none", noDate, 0);
   EXPECT_EQ(issue("none"), "");
   EXPECT_EQ(issue("none", 0), "N");
+  EXPECT_EQ(full.newId("none"), "");
+  EXPECT_EQ(full.errNumber(), number::type) << "its last number has no digits to go on from";
   tables_.run("update idRec set maxId='N1x' where idName='inv'");
   EXPECT_EQ(full.newId("inv"), "");
   EXPECT_EQ(full.errNumber(), number::type) << full.errDescription();
@@ -227,6 +245,24 @@ TEST_F(Numbers, OfARenamedRuleBeginAnewAndATakenNameIsRefused) {
   EXPECT_EQ(rules.Item(3), nullptr);
   EXPECT_TRUE(subject.Delete("new"));
   EXPECT_NE(counters("new"), "") << "counters stay";
+}
+
+TEST_F(Numbers, RulesAreListedTrimmedAndEachTimeAnew) {
+  tables_.run("insert into idRule(idName,preFix,nws) values(' inv ',' P ',2)");
+  IdMgrs rules;
+  rules.gsDBConnString(connected<IdMgrs>().gsDBConnString());
+  EXPECT_EQ(rules.gsDBConnString(), buildConnString(server(), "QVApp", false));
+  EXPECT_TRUE(rules.GetAll());
+  EXPECT_TRUE(rules.GetAll());
+  ASSERT_EQ(rules.Count(), 1);
+  EXPECT_EQ(rules.Item(1)->idName() + "|" + rules.Item(1)->preFix(), "inv|P");
+  EXPECT_TRUE(rules.Item(1)->whenSave());
+
+  IdMgr read = rule(" inv");
+  EXPECT_FALSE(read.whenSave());
+  EXPECT_TRUE(read.Delete());
+  EXPECT_TRUE(rules.GetAll());
+  EXPECT_EQ(rules.Count(), 0);
 }
 
 }  // namespace
