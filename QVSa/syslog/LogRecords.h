@@ -41,8 +41,9 @@ class LogRecords : private Frame {
   Boolean GetAll(Long LogType = 0, Date startDate = Date::empty(), Date endDate = Date::empty(), Long operator_ = 0,
                  const String& rtId = "", const String& desc = "", const String& ordByFld = "", Integer ordBy = 0,
                  Integer app = 0);
-  // Writes the entries of a type (1 to 3; any other: all) to a text file in the system's code page, with no heading: a
-  // line break before each entry, tabs between its values. The file is complete or as it was before.
+  // Writes the entries of a type (1 to 3; any other: all) to a text file in the system's code page ("?" for what that
+  // lacks), with no heading: a line break before each entry, tabs between its values. The file is complete or as it was
+  // before.
   Boolean saveLog(const String& vBakFile, const Long* vLogType = nullptr);
   // Deletes the entries of a type (1 to 3; any other: all), with `vSaveBackup` after an export to `vBakFile`. A failed
   // export does not keep the entries, and neither do entries that came after it.

@@ -2,6 +2,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "tests/support/FakeSession.h"
 #include "tests/syslog/LogInstallation.h"
 
 namespace QVSa {
@@ -36,6 +37,11 @@ TEST_F(LogExport, IsALineAnEntryInTheSystemsCodePage) {
             "\r\n2024-03-05 10:20:45\tZo\xEB\tzoe\t1\tpc\tf\t5 \x80 \x96 ?"
             "\r\n2024-03-06 00:00:00\tBob\tbob\t2\t\tg\ta"
             "\r\n2024-03-07 00:00:00\t\t\t5\t\t\t");
+
+  const test::EnvironmentLocale chinese{"zh_CN.UTF-8"};
+  const Long type = 1;
+  EXPECT_TRUE(log_.saveLog(path("log.txt"), &type));
+  EXPECT_EQ(content("log.txt"), "\r\n2024-03-05 10:20:45\tZo?\tzoe\t1\tpc\tf\t5 \x80 \xA8\x43 \xD6\xD0");
 }
 
 TEST_F(LogExport, TakesOneTypeOrAll) {
@@ -55,17 +61,25 @@ TEST_F(LogExport, TakesOneTypeOrAll) {
 TEST_F(LogExport, LeavesTheOldFileWhereItCannotBeDone) {
   writeThree();
   std::ofstream(path("log.txt")) << "old";
-  db_.run("update syslog set OpDesc=replicate('x',3000)");
   std::filesystem::create_directory(path("taken"));
   EXPECT_FALSE(log_.saveLog(path("taken")));
   EXPECT_EQ(log_.errNumber(), number::pathAccess);
   EXPECT_EQ(log_.errDescription(), "Error in saving system log." + runtimeFailure(number::pathAccess).description());
   EXPECT_FALSE(log_.saveLog(path("missing/log.txt")));
   EXPECT_EQ(log_.errNumber(), number::noPath);
-  db_.run("drop table syslog");
+
+  // The rows stream: what was written before the second one fails is gone, and the third is never asked for.
+  test::FakeServer server;
+  const String much(100000, 'x');
+  server.answer("select * from syslog",
+                {{{"LogTime"}, {"UserName"}, {"UserLogin"}, {"LogType"}, {"Computer"}, {"FuncName"}, {"OpDesc"}},
+                 {{"", "", "", 1, "", "", much}, {"", "", "", 1, "", "", Bytes{1}}, {"", "", "", 1, "", "", ""}}});
   EXPECT_FALSE(log_.saveLog(path("log.txt")));
-  EXPECT_EQ(log_.errNumber(), number::noTable);
+  EXPECT_EQ(log_.errNumber(), number::type);
+  EXPECT_EQ(server.fetchedRows, 2);
+  EXPECT_TRUE(server.lastBatch.updatable) << "a dynamic cursor, of which nothing is kept";
   EXPECT_EQ(content("log.txt"), "old");
+  EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder_.path()), {}), 2);
 }
 
 TEST_F(LogExport, HoldsEveryRowOfManyInOrder) {

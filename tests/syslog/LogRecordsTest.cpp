@@ -193,7 +193,10 @@ TEST_F(LogQueries, AListThatBeginsWithACommaFailsAtTheServer) {
   write("a", "20240305");
   for (const auto& values : {query(never, never, "", ",bob"), query(never, never, "", "", ",bob")}) {
     std::vector<Variant> refused = values;
+    ASSERT_TRUE(log_.GetAll(0, never, never, 0, "", "", "", 0, 2));
     EXPECT_FALSE(log_.GetLogByQuery(refused));
+    EXPECT_EQ(log_.begin(), log_.end());
+    EXPECT_EQ(log_.Count(), 0);
     EXPECT_EQ(log_.errNumber(), number::statement);
     EXPECT_EQ(log_.errDescription().find("Error in requesting system log."), 0U);
   }
