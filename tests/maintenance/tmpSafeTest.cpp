@@ -3,6 +3,7 @@
 #include "QVSa/frame/DeploymentSecrets.h"
 #include "QVSa/maintenance/tmpSafe.h"
 #include "platform/SecretMessage.h"
+#include "tests/support/FakeSession.h"
 #include "tests/support/PlainSession.h"
 #include "tests/support/TestInstallation.h"
 
@@ -61,6 +62,13 @@ TEST_F(TemplateSafe, TheFirstPasswordFreesTheTemplatesWithTheDefaultOne) {
   EXPECT_TRUE(second.Save());
   EXPECT_EQ(locked(), "last\nown\nsmall\nx-broken");
   EXPECT_EQ(stored(), "Secret 2");
+
+  // Without a row both passwords stay as they were.
+  db_.run("delete from QVTmpSafe");
+  String password;
+  EXPECT_TRUE(second.connect(installation_.server()) && second.Save() && second.getPwd("s1", password));
+  EXPECT_EQ(password, "Secret 2");
+  EXPECT_EQ(locked(), "last\nown\nsmall\nx-broken");
 }
 
 TEST_F(TemplateSafe, AChangeOfAllLeavesNoTemplateAPassword) {
@@ -79,6 +87,12 @@ TEST_F(TemplateSafe, OnlyALiveSessionReadsThePassword) {
   EXPECT_EQ(password, "");
   EXPECT_EQ(safe_.errNumber(), static_cast<Long>(0x80048215));
   EXPECT_EQ(safe_.errDesc(), "Illegal reading operation");
+
+  test::FakeServer server;
+  server.answer("select top 1 * from QVTmpSafe", {{{"protectPwd"}}, {}});
+  server.answer(" select sesid from sesLog where sesId = N's1'", {{{"sesid"}}, {{"s1"}}});
+  EXPECT_TRUE(safe_.connect("host", "QVApp") && safe_.getPwd("s1", password)) << safe_.errDesc();
+  EXPECT_EQ(server.lastOptions.database, "QVSys") << "where the sessions are, whatever the object's own database";
 }
 
 TEST_F(TemplateSafe, AnObjectThatIsNotConnectedFails) {
