@@ -1,10 +1,11 @@
 #include "platform/DirectoryLookup.h"
 
 #include <algorithm>
-#include <array>
 #include <ldap.h>
 #include <memory>
 #include <vector>
+
+#include "platform/SilenceLimit.h"
 
 namespace QVSa::platform {
 namespace {
@@ -70,13 +71,14 @@ String addressOf(const DirectoryQuery& query) {
 // No host would lead to the one that the system's LDAP settings name.
 bool isComplete(const DirectoryQuery& query) { return !query.host.empty() && 0 < query.port && query.port <= 65535; }
 
-Handle connected(const DirectoryQuery& query) {
+Handle connected(const DirectoryQuery& query, SilenceLimit& silence) {
   if (!isComplete(query)) throw Ended{directoryUnreachable};
   LDAP* raw = nullptr;
   require(ldap_initialize(&raw, addressOf(query).c_str()), directoryUnreachable);
   Handle handle(raw);
   const int version = LDAP_VERSION3;
   const timeval limit{query.seconds, 0};
+  require(silence.watch(raw), directoryUnreachable);
   ldap_set_option(raw, LDAP_OPT_PROTOCOL_VERSION, &version);
   ldap_set_option(raw, LDAP_OPT_NETWORK_TIMEOUT, &limit);
   ldap_set_option(raw, LDAP_OPT_TIMEOUT, &limit);
@@ -231,7 +233,8 @@ String search(LDAP* handle, const String& text) {
 
 String getUsersFromLD(const DirectoryQuery& query, const String& password, Integer& status) {
   try {
-    const Handle handle = connected(query);
+    SilenceLimit silence(query.seconds);
+    const Handle handle = connected(query, silence);
     bind(handle.get(), query.bindDn, password);
     String lines = search(handle.get(), query.searchText);
     status = directoryDone;

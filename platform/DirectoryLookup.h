@@ -20,7 +20,7 @@ struct DirectoryQuery {
   // login, mail address or name, anywhere in the directory.
   String searchText;
   Security security = Security::byPort;
-  int seconds = 10;  // for each answer of the server
+  int seconds = 10;  // for each answer of the server, in the TLS handshake too
 };
 
 // How a lookup ended. Home.getUsersFromLDS gives these as its result.

@@ -82,32 +82,6 @@ String manyEntries() {
   return entries;
 }
 
-sockaddr_in loopback(int port) {
-  sockaddr_in address{};
-  address.sin_family = AF_INET;
-  address.sin_port = htons(static_cast<std::uint16_t>(port));
-  address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-  return address;
-}
-
-Long freePort() {
-  const int socketHandle = ::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
-  sockaddr_in address = loopback(0);
-  socklen_t size = sizeof address;
-  ::bind(socketHandle, reinterpret_cast<sockaddr*>(&address), size);
-  ::getsockname(socketHandle, reinterpret_cast<sockaddr*>(&address), &size);
-  ::close(socketHandle);
-  return ntohs(address.sin_port);
-}
-
-bool answers(Long port) {
-  const int socketHandle = ::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
-  const sockaddr_in address = loopback(port);
-  const bool connected = ::connect(socketHandle, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0;
-  ::close(socketHandle);
-  return connected;
-}
-
 pid_t spawn(std::vector<String> words) {
   std::vector<char*> arguments;
   for (String& word : words) arguments.push_back(word.data());
@@ -137,9 +111,42 @@ void write(const std::filesystem::path& path, String text, const String& folder)
 
 }  // namespace
 
+// A free port of the loopback device, held by a socket that does not listen: the server, which takes it for reuse, can
+// still listen there, and nobody is given it meanwhile.
+class Slapd::Port {
+ public:
+  Port() {
+    const int yes = 1;
+    socklen_t size = sizeof address_;
+    address_.sin_family = AF_INET;
+    address_.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    if (::bind(holder_, address(), size) != 0 || ::getsockname(holder_, address(), &size) != 0 ||
+        ::setsockopt(holder_, SOL_SOCKET, SO_REUSEADDR, &yes, sizeof yes) != 0)
+      throw std::runtime_error("no port for the directory server");
+  }
+  ~Port() { ::close(holder_); }
+  Port(const Port&) = delete;
+  Port& operator=(const Port&) = delete;
+
+  Long number() const { return ntohs(address_.sin_port); }
+
+  bool answers() {
+    const int client = ::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+    const bool connected = ::connect(client, address(), sizeof address_) == 0;
+    ::close(client);
+    return connected;
+  }
+
+ private:
+  sockaddr* address() { return reinterpret_cast<sockaddr*>(&address_); }
+
+  int holder_ = ::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+  sockaddr_in address_{};
+};
+
 bool Slapd::isInstalled() { return ::access(program, X_OK) == 0; }
 
-Slapd::Slapd() : port_(freePort()), tlsPort_(freePort()) {
+Slapd::Slapd() : port_(std::make_unique<Port>()), tlsPort_(std::make_unique<Port>()) {
   const std::filesystem::path& folder = folder_.path();
   const String settings = folder / "slapd.conf";
   const String entries = folder / "entries.ldif";
@@ -147,17 +154,35 @@ Slapd::Slapd() : port_(freePort()), tlsPort_(freePort()) {
   write(settings, configuration, folder);
   write(entries, content + manyEntries(), folder);
   int status = 0;
-  waitpid(spawn({program, "-Tadd", "-f", settings, "-l", entries}), &status, 0);
+  waitpid(spawn({program, "-Tadd", "-q", "-f", settings, "-l", entries}), &status, 0);
   if (status != 0) throw std::runtime_error("slapd does not take its entries");
   const String addresses =
-      "ldap://127.0.0.1:" + std::to_string(port_) + "/ ldaps://127.0.0.1:" + std::to_string(tlsPort_) + "/";
+      "ldap://127.0.0.1:" + std::to_string(port()) + "/ ldaps://127.0.0.1:" + std::to_string(tlsPort()) + "/";
   process_ = spawn({program, "-f", settings, "-h", addresses, "-d", "0"});
-  for (int i = 0; i < 500 && !(answers(port_) && answers(tlsPort_)); ++i) usleep(20'000);
+  for (int i = 0; i < 1500; ++i) {
+    if (waitpid(process_, nullptr, WNOHANG) != 0) throw std::runtime_error("slapd has ended");
+    if (answers()) return;
+    usleep(20'000);
+  }
+  stop();
+  throw std::runtime_error("slapd does not answer");
 }
 
 Slapd::~Slapd() { stop(); }
 
-void Slapd::hang() const { ::kill(process_, SIGSTOP); }
+Long Slapd::port() const { return port_->number(); }
+
+Long Slapd::tlsPort() const { return tlsPort_->number(); }
+
+bool Slapd::answers() const { return port_->answers() && tlsPort_->answers(); }
+
+// The signal only begins it: threads that run at this moment still answer.
+void Slapd::hang() const {
+  int status = 0;
+  ::kill(process_, SIGSTOP);
+  if (waitpid(process_, &status, WUNTRACED) != process_ || !WIFSTOPPED(status))
+    throw std::runtime_error("slapd does not stop");
+}
 
 void Slapd::goOn() const { ::kill(process_, SIGCONT); }
 

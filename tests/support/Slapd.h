@@ -1,5 +1,6 @@
 #pragma once
 
+#include <memory>
 #include <sys/types.h>
 
 #include "QVSa/frame/Values.h"
@@ -17,6 +18,7 @@ namespace QVSa::test {
 //     ou=many     `many` users, more than one answer may hold
 // Only those who are bound may read. It takes StartTLS, and TLS from the first byte on a port of its own. Its
 // certificate, for 127.0.0.1, is what this process trusts if it asked no directory before the first server was made.
+// Its ports stay its own until the object goes: at a server that was stopped nobody else answers.
 class Slapd {
  public:
   static constexpr int many = 600;
@@ -27,17 +29,20 @@ class Slapd {
   Slapd(const Slapd&) = delete;
   Slapd& operator=(const Slapd&) = delete;
 
-  Long port() const { return port_; }
-  Long tlsPort() const { return tlsPort_; }
+  Long port() const;
+  Long tlsPort() const;
   // It keeps its connections open, takes new ones, and answers nothing.
   void hang() const;
   void goOn() const;
   void stop();
 
  private:
+  class Port;
+  bool answers() const;
+
   TestFolder folder_;
-  Long port_;
-  Long tlsPort_;
+  std::unique_ptr<Port> port_;
+  std::unique_ptr<Port> tlsPort_;
   pid_t process_ = 0;
 };
 
