@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <ldap.h>
 #include <memory>
+#include <span>
 #include <vector>
 
 #include "platform/SilenceLimit.h"
@@ -12,9 +13,12 @@ namespace {
 
 constexpr ber_int_t pageSize = 500;
 constexpr const char* persons = "(|(objectClass=person)(objectClass=account)(objectClass=posixAccount))";
+// Of each list, the first attribute that an entry has counts.
 constexpr const char* loginNames[] = {"sAMAccountName", "uid", "userPrincipalName"};
 constexpr const char* displayNames[] = {"displayName", "cn"};
 constexpr const char* mailNames[] = {"mail"};
+constexpr const char* classNames[] = {"objectClass"};
+using Names = std::span<const char* const>;
 
 struct Unbind {
   void operator()(LDAP* handle) const { ldap_unbind_ext_s(handle, nullptr, nullptr); }
@@ -121,7 +125,7 @@ std::vector<String> valuesOf(LDAP* handle, LDAPMessage* entry, const char* attri
 
 // Active Directory counts its computers among the persons. A filter can't say so to a server that has no such class.
 bool isComputer(LDAP* handle, LDAPMessage* entry) {
-  const std::vector<String> classes = valuesOf(handle, entry, "objectClass");
+  const std::vector<String> classes = valuesOf(handle, entry, classNames[0]);
   return std::find(classes.begin(), classes.end(), "computer") != classes.end();
 }
 
@@ -138,8 +142,7 @@ std::vector<String> rootsOf(LDAP* handle) {
   return entry == nullptr ? std::vector<String>{} : valuesOf(handle, entry, attribute.c_str());
 }
 
-template <std::size_t count>
-String firstOf(LDAP* handle, LDAPMessage* entry, const char* const (&attributes)[count]) {
+String firstOf(LDAP* handle, LDAPMessage* entry, Names attributes) {
   for (const char* attribute : attributes) {
     const std::vector<String> values = valuesOf(handle, entry, attribute);
     if (!values.empty()) return values.front();
@@ -176,6 +179,15 @@ String nextPage(LDAP* handle, LDAPMessage* answer) {
   return mark;
 }
 
+// All that is read of an entry: pictures and certificates stay with the server.
+std::vector<char*> wantedAttributes() {
+  std::vector<char*> wanted;
+  for (const Names names : {Names(loginNames), Names(displayNames), Names(mailNames), Names(classNames)})
+    for (const char* name : names) wanted.push_back(const_cast<char*>(name));
+  wanted.push_back(nullptr);
+  return wanted;
+}
+
 class Search {
  public:
   Search(LDAP* handle, String filter) : handle_(handle), filter_(std::move(filter)) {}
@@ -201,9 +213,10 @@ class Search {
     require(ldap_create_page_control(handle_, pageSize, &cookie, 0, &raw), directoryFailed);
     const Control control(raw);
     LDAPControl* controls[] = {control.get(), nullptr};
+    std::vector<char*> wanted = wantedAttributes();
     LDAPMessage* message = nullptr;
-    const int code = ldap_search_ext_s(handle_, base.c_str(), LDAP_SCOPE_SUBTREE, filter_.c_str(), nullptr, 0, controls,
-                                       nullptr, nullptr, LDAP_NO_LIMIT, &message);
+    const int code = ldap_search_ext_s(handle_, base.c_str(), LDAP_SCOPE_SUBTREE, filter_.c_str(), wanted.data(), 0,
+                                       controls, nullptr, nullptr, LDAP_NO_LIMIT, &message);
     Message answer(message);
     require(code, directoryFailed);
     return answer;

@@ -57,6 +57,15 @@ TEST_F(DirectoryLookupTest, ATextThatIsNoNameIsLookedUpLiterally) {
   EXPECT_EQ(status_, directoryDone);
 }
 
+TEST_F(DirectoryLookupTest, AWindowsDirectoryIsReadByItsOwnNames) {
+  const String windows = "ou=windows,dc=example,dc=org";
+  const String carlLine = "cn=Carl," + windows + "\tcarl\tCarl\t\n";
+  const String doraLine = "cn=Dora," + windows + "\tdora@corp\tDora\t\n";
+  EXPECT_EQ(find(windows), carlLine + doraLine) << "a computer is no person";
+  EXPECT_EQ(find("CARL"), carlLine);
+  EXPECT_EQ(find("carl@corp"), carlLine);
+}
+
 TEST_F(DirectoryLookupTest, ABindNeedsTheRightNameAndPassword) {
   query_.bindDn = ann;
   EXPECT_EQ(find(ann, "Secret-1"), annLine);

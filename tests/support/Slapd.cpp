@@ -23,6 +23,10 @@ constexpr const char* configuration = R"(
 include /etc/ldap/schema/core.schema
 include /etc/ldap/schema/cosine.schema
 include /etc/ldap/schema/inetorgperson.schema
+attributetype ( 1.1.1 NAME 'sAMAccountName' EQUALITY caseIgnoreMatch SYNTAX 1.3.6.1.4.1.1466.115.121.1.15 )
+attributetype ( 1.1.2 NAME 'userPrincipalName' EQUALITY caseIgnoreMatch SYNTAX 1.3.6.1.4.1.1466.115.121.1.15 )
+objectclass ( 1.1.3 NAME 'windowsAccount' SUP top AUXILIARY MAY ( sAMAccountName $ userPrincipalName ) )
+objectclass ( 1.1.4 NAME 'computer' SUP person STRUCTURAL )
 modulepath /usr/lib/ldap
 moduleload back_mdb
 pidfile FOLDER/slapd.pid
@@ -69,6 +73,31 @@ objectClass: inetOrgPerson
 uid: bob
 cn: Bob (Sales) *\
 sn: Sales
+
+dn: ou=windows,dc=example,dc=org
+objectClass: organizationalUnit
+ou: windows
+
+dn: cn=Carl,ou=windows,dc=example,dc=org
+objectClass: inetOrgPerson
+objectClass: windowsAccount
+cn: Carl
+sn: Example
+uid: c1
+sAMAccountName: carl
+userPrincipalName: carl@corp
+
+dn: cn=Dora,ou=windows,dc=example,dc=org
+objectClass: person
+objectClass: windowsAccount
+cn: Dora
+sn: Example
+userPrincipalName: dora@corp
+
+dn: cn=box,ou=windows,dc=example,dc=org
+objectClass: computer
+cn: box
+sn: box
 
 )";
 

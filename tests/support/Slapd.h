@@ -14,6 +14,9 @@ namespace QVSa::test {
 //     cn=service                      password Reader-7
 //     ou=people   uid=ann             password Secret-1; "Ann Example", ann@example.org
 //                 uid=bob             "Bob (Sales) *\" of cn, no mail
+//     ou=windows  cn=Carl             login carl by sAMAccountName, another one by uid
+//                 cn=Dora             login dora@corp by userPrincipalName alone
+//                 cn=box              a computer
 //     ou=empty
 //     ou=many     `many` users, more than one answer may hold
 // Only those who are bound may read. It takes StartTLS, and TLS from the first byte on a port of its own. Its
