@@ -11,7 +11,7 @@ namespace {
 String reasonOf(Integer status) {
   switch (status) {
     case platform::directoryUnreachable:
-      return "The directory server does not answer.";
+      return "The directory server does not answer, or this machine's directorySecurity is not understood.";
     case platform::directoryRefused:
       return "The directory server refuses the name or the password of the settings.";
     case platform::directoryDisabled:

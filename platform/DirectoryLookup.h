@@ -26,7 +26,7 @@ struct DirectoryQuery {
 // How a lookup ended. Home.getUsersFromLDS gives these as its result.
 enum DirectoryStatus : Integer {
   directoryDone = 0,
-  directoryUnreachable = 1,  // no server there, no answer in time, no TLS
+  directoryUnreachable = 1,  // no server there, no answer in time, no TLS, or it is not known which TLS is wanted
   directoryRefused = 2,      // name or password wrong, or not allowed
   directoryDisabled = 3,     // the settings do not use a directory; nothing is asked
   directoryFailed = 4        // the search: no such entry, not allowed, given up by the server

@@ -11,6 +11,13 @@ namespace {
 // A name that leads out of its folder belongs to no key.
 bool isPlain(const std::filesystem::path& part) { return part != "." && part != ".." && !part.is_absolute(); }
 
+// An answer that the system refuses is no No: a text that protects something must not count as absent.
+bool mayBeFolder(const std::filesystem::path& path) {
+  std::error_code refused;
+  const std::filesystem::file_type type = std::filesystem::status(path, refused).type();
+  return type == std::filesystem::file_type::directory || type == std::filesystem::file_type::none;
+}
+
 class Folder : public SettingsKey {
  public:
   explicit Folder(std::filesystem::path path) : path_(std::move(path)) {}
@@ -19,8 +26,9 @@ class Folder : public SettingsKey {
     try {
       const Bytes content = readFile(fileOf(name));
       return String(content.begin(), content.end());
-    } catch (const Failure&) {
-      return std::nullopt;
+    } catch (const Failure& failure) {
+      if (failure.number() == number::noFile) return std::nullopt;
+      throw;
     }
   }
 
@@ -54,8 +62,7 @@ std::unique_ptr<SettingsKey> openSettings(const String& path) {
     if (!isPlain(part)) return nullptr;
     folder /= part;
   }
-  std::error_code ignored;
-  if (!std::filesystem::is_directory(folder, ignored)) return nullptr;
+  if (!mayBeFolder(folder)) return nullptr;
   return std::make_unique<Folder>(std::move(folder));
 }
 

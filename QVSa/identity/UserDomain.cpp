@@ -44,13 +44,14 @@ void User::ldapBind(const String& host, Long port, const Variant& bindDn, const 
                     Boolean& ok) {
   ok = false;
   const auto& getUsersFromLD = platform::services().getUsersFromLD;
-  if (!getUsersFromLD) return;
+  const auto security = directorySecurity();
+  if (!getUsersFromLD || !security) return;
   platform::DirectoryQuery query;
   query.host = host;
   query.port = port;
   query.bindDn = bindDn.toText();
   query.searchText = dn.empty() ? query.bindDn : dn;
-  query.security = directorySecurity();
+  query.security = *security;
   Integer status = 0;
   ok = !getUsersFromLD(query, password, status).empty();
 }

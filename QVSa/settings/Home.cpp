@@ -134,13 +134,14 @@ Integer Home::getUsersFromLDS(String& items) {
   items.clear();
   if (ldEnabled_ == 0) return platform::directoryDisabled;
   const auto& getUsersFromLD = platform::services().getUsersFromLD;
-  if (!getUsersFromLD) return platform::directoryUnreachable;
+  const auto security = directorySecurity();
+  if (!getUsersFromLD || !security) return platform::directoryUnreachable;
   platform::DirectoryQuery query;
   query.host = ldHost_;
   query.port = LDPort_;
   query.bindDn = ldBindDN_;
   query.searchText = ldBaseDN_;
-  query.security = directorySecurity();
+  query.security = *security;
   Integer status = 0;
   items = getUsersFromLD(query, ldPasswd_.text(), status);
   return status;

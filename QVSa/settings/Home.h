@@ -144,8 +144,9 @@ class Home : private Frame {
   // read leaves its text in errDescription, and the rest is saved. Where the row is missing the server refuses the
   // statement.
   Boolean Save();
-  // The directory's users as platform/DirectoryLookup.h tells, and its status as the result: 0 done, 1 unreachable,
-  // 2 bind refused, 3 the directory is not enabled (nothing is asked), 4 the search failed.
+  // The directory's users as platform/DirectoryLookup.h tells, and its status as the result: 0 done, 1 unreachable, or
+  // this machine's directorySecurity is not understood, 2 bind refused, 3 the directory is not enabled (nothing is
+  // asked), 4 the search failed.
   Integer getUsersFromLDS(String& items);
 
  private:

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <optional>
+
 #include "QVSa/frame/Values.h"
 #include "platform/DirectoryLookup.h"
 
@@ -8,8 +10,9 @@ namespace QVSa {
 // The key under which a machine keeps its texts, in the host's settings store.
 constexpr const char* machineSettingsKey = "Software\\Morvane\\Tabulon";
 
-// How this machine speaks to the directory server, by the text "directorySecurity" under the key: "startTls", "tls", or
-// anything else, and nothing, for the rule of the port.
-platform::DirectoryQuery::Security directorySecurity();
+// How this machine speaks to the directory server, by the text "directorySecurity" under the key, without regard to
+// case and white space around: "startTls", "tls", or no text for the rule of the port. Nothing where the text is
+// another one or can't be read: the server then must not be asked, since passwords could go to it in clear.
+std::optional<platform::DirectoryQuery::Security> directorySecurity();
 
 }  // namespace QVSa

@@ -1,5 +1,7 @@
 #include <cstdlib>
+#include <map>
 
+#include "QVSa/identity/User.h"
 #include "QVSa/settings/MachineSettings.h"
 #include "platform/Files.h"
 #include "tests/support/SettingsScene.h"
@@ -52,12 +54,36 @@ TEST_F(MachineSettingsTest, TheStoreTellsHowToSpeakToTheDirectory) {
   makeKey();
   EXPECT_EQ(directorySecurity(), Security::byPort);
   const auto key = platform::openSettings(machineSettingsKey);
-  EXPECT_TRUE(key->write("directorySecurity", "startTls"));
-  EXPECT_EQ(directorySecurity(), Security::startTls);
-  EXPECT_TRUE(key->write("directorySecurity", "tls"));
-  EXPECT_EQ(directorySecurity(), Security::tls);
+  const std::map<String, std::optional<Security>> meanings = {
+      {"tls", Security::tls},   {"startTls", Security::startTls}, {" starttls\r\n", Security::startTls},
+      {"\n", Security::byPort}, {"start Tls", std::nullopt},      {"x", std::nullopt}};
+  for (const auto& [text, meaning] : meanings) {
+    EXPECT_TRUE(key->write("directorySecurity", text));
+    EXPECT_EQ(directorySecurity(), meaning) << text;
+  }
   EXPECT_TRUE(key->remove("directorySecurity"));
   EXPECT_TRUE(key->remove("directorySecurity")) << "there was none";
+  EXPECT_EQ(directorySecurity(), Security::byPort);
+}
+
+TEST_F(MachineSettingsTest, ADirectoryIsNotAskedWhereItIsNotKnownHow) {
+  makeKey();
+  std::filesystem::create_directory(root_.path() / "Software/Morvane/Tabulon/directorySecurity");
+  EXPECT_EQ(directorySecurity(), std::nullopt) << "there, and no text";
+  int asked = 0;
+  replace(&platform::Services::getUsersFromLD, {[&](const auto&, const String&, Integer&) {
+    ++asked;
+    return String("somebody");
+  }});
+  Home home = connected<Home>();
+  home.ldEnabled(true);
+  String items;
+  EXPECT_EQ(home.getUsersFromLDS(items), platform::directoryUnreachable);
+  plain_.run("update users set uType=3,ldDn='cn=admin',accstate=0 where userLogin='Admin'");
+  User admin = connected<User>();
+  EXPECT_FALSE(admin.GetOne(3, "Admin", true, "secret"));
+  EXPECT_EQ(admin.errNumber(), messageNumber(1131));
+  EXPECT_EQ(asked, 0);
 }
 
 }  // namespace
