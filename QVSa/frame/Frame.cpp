@@ -4,6 +4,19 @@
 #include "QVSa/resources/Messages.h"
 
 namespace QVSa {
+namespace {
+
+// What is quoted of a secret may be its beginning only, as far as a parser read it as one word.
+String withoutSecrets(String description, const std::vector<String>& secrets) {
+  constexpr std::size_t telling = 4;
+  for (const String& secret : secrets) {
+    const std::size_t at = secret.empty() ? String::npos : description.find(secret.substr(0, telling));
+    if (at != String::npos) description = description.substr(0, at) + "***";
+  }
+  return description;
+}
+
+}  // namespace
 
 Handler Handler::number(Long value) && {
   fixedNumber = value;
@@ -35,7 +48,11 @@ Handler silent() {
   return handler;
 }
 
-Statement::Statement(SQLFactory& factory, String text) : factory_(factory), text_(std::move(text)) { factory_.Clear(); }
+Statement::Statement(SQLFactory& factory, std::vector<String>& secrets, String text)
+    : factory_(factory), secrets_(secrets), text_(std::move(text)) {
+  factory_.Clear();
+  secrets_.clear();
+}
 
 Statement& Statement::number(const String& name, const Variant& value) {
   factory_.AddPara(name, paraNumber, value, false, true);
@@ -45,6 +62,11 @@ Statement& Statement::number(const String& name, const Variant& value) {
 Statement& Statement::text(const String& name, const Variant& value) {
   factory_.AddPara(name, paraText, value, false, true);
   return *this;
+}
+
+Statement& Statement::secret(const String& name, const String& value) {
+  secrets_.push_back(value);
+  return text(name, value);
 }
 
 Statement& Statement::date(const String& name, const Variant& value) {
@@ -100,7 +122,7 @@ void Frame::report(const Handler& handler, const Failure& failure) {
   if (handler.silent) return;
   const bool alone = failure.number() == number::integrity && !handler.aloneOnIntegrity.empty();
   note(handler.fixedNumber != 0 ? handler.fixedNumber : failure.number(),
-       alone ? handler.aloneOnIntegrity : handler.prefix + failure.description());
+       alone ? handler.aloneOnIntegrity : handler.prefix + withoutSecrets(failure.description(), secrets_));
 }
 
 }  // namespace QVSa

@@ -35,15 +35,19 @@ Handler silent();
 // empty text and not as NULL, trailing blanks are cut.
 class Statement {
  public:
-  Statement(SQLFactory& factory, String text);
+  Statement(SQLFactory& factory, std::vector<String>& secrets, String text);
   Statement& number(const String& name, const Variant& value);
   Statement& text(const String& name, const Variant& value);
+  // A password as it is stored. A server may quote a piece of the statement: the object's error text then ends before
+  // the password.
+  Statement& secret(const String& name, const String& value);
   Statement& date(const String& name, const Variant& value);
   Statement& list(const String& name, const String& value);
   operator String();
 
  private:
   SQLFactory& factory_;
+  std::vector<String>& secrets_;
   String text_;
 };
 
@@ -73,7 +77,7 @@ class Frame {
   // An open connection on the object's own string.
   Connection open() const;
   // Clears the object's factory and starts a statement on it.
-  Statement sql(const String& text) { return Statement(factory_, text); }
+  Statement sql(const String& text) { return Statement(factory_, secrets_, text); }
 
   // Runs `body` and returns its result. A failure is turned into the two error values by `handler`, and the result is
   // the body type's negative one: False, the empty text, no object. A body that also refuses names its type:
@@ -139,6 +143,7 @@ class Frame {
   String DBName_;
   String connectionString_;
   SQLFactory factory_;
+  std::vector<String> secrets_;  // of the last statement
   Long errNumber_ = 0;
   String errDescription_;
 };

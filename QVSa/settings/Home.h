@@ -40,7 +40,7 @@ class Home : private Frame {
   void taxNo(String value) { taxNo_ = std::move(value); }
   String jPerson() const { return jPerson_; }
   void jPerson(String value) { jPerson_ = std::move(value); }
-  // For the hosts; nothing in this library acts on these five and attLimit.
+  // For the hosts; nothing in this library acts on these four and attLimit.
   Integer AcctDay() const { return AcctDay_; }
   void AcctDay(Integer value) { AcctDay_ = value; }
   Integer acctTime() const { return acctTime_; }
@@ -160,7 +160,7 @@ class Home : private Frame {
   void write(Connection& connection);
   String insertText() const;
   String updateText() const;
-  Statement filled(const String& statement, const String& storedEmailPassword, const String& storedLdPasswd);
+  Statement filled(const String& statement);
   void sendPicture(Connection& connection, const String& path, const String& clear, const String& select);
 
   void fetchText(const Field& column, const String& name, String& value);

@@ -15,18 +15,6 @@ void rollBack(Connection& connection) {
   }
 }
 
-// A server may quote a piece of the statement, and with it a password in the form in which it is stored: the text then
-// ends before it.
-Failure withoutSecrets(const Failure& failure, std::initializer_list<String> secrets) {
-  constexpr std::size_t telling = 12;
-  String description = failure.description();
-  for (const String& secret : secrets) {
-    const std::size_t at = secret.empty() ? String::npos : description.find(secret.substr(0, telling));
-    if (at != String::npos) description = description.substr(0, at) + "***";
-  }
-  return Failure(failure.number(), failure.source(), description, failure.native());
-}
-
 }  // namespace
 
 Boolean Home::Save() {
@@ -47,13 +35,7 @@ Boolean Home::Save() {
 
 void Home::write(Connection& connection) {
   const Boolean exists = !connection.Execute("select id from Homeinfo where Id=1").EOF_();
-  const String emailPassword = platform::encryptText(emailPassword_.text(), smtpServer_);
-  const String ldPasswd = scrambleText(ldPasswd_.text());
-  try {
-    connection.Execute(filled(exists ? updateText() : insertText(), emailPassword, ldPasswd));
-  } catch (const Failure& failure) {
-    throw withoutSecrets(failure, {emailPassword, ldPasswd});
-  }
+  connection.Execute(filled(exists ? updateText() : insertText()));
   connection.Execute(sql("update Departments set "
                          " deptName=<name>,fullName=<name>"
                          " where deptNo='_root'")
@@ -130,7 +112,7 @@ String Home::updateText() const {
          " where id=1";
 }
 
-Statement Home::filled(const String& statement, const String& storedEmailPassword, const String& storedLdPasswd) {
+Statement Home::filled(const String& statement) {
   return sql(statement)
       .text("name", homeName_)
       .text("enName", enName_)
@@ -152,12 +134,12 @@ Statement Home::filled(const String& statement, const String& storedEmailPasswor
       .text("emailContent", emailContent_)
       .text("emailPContent", emailPContent_)
       .text("emailRContent", emailRContent_)
-      .text("emailPassword", storedEmailPassword)
+      .secret("emailPassword", platform::encryptText(emailPassword_.text(), smtpServer_))
       .text("ldsName", ldServerName_)
       .text("ldHost", ldHost_)
       .text("ldBaseDN", ldBaseDN_)
       .text("ldBindDN", ldBindDN_)
-      .text("ldPasswd", storedLdPasswd)
+      .secret("ldPasswd", scrambleText(ldPasswd_.text()))
       .text("LoginNewsUrl", LoginNewsUrl_)
       .text("attLimit", attLimit_)
       .text("loginTitle", loginTitle_)
