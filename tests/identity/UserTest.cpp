@@ -240,6 +240,22 @@ TEST_F(UserTest, ASaveThatRepeatsAPasswordIsRefusedBeforeAnythingIsWritten) {
   EXPECT_EQ(server_.log, (Log{"open", readPolicy, "close", "open", history, "close"}));
 }
 
+TEST_F(UserTest, AnApplicantWithoutHisRowOfExtraDataIsDeletedAgain) {
+  User applicant;
+  applicant.connect("host");
+  applicant.Name("Ben");
+  applicant.Login("ben");
+  server_.answer("select * from departments where deptNo=N'_root'", {{{"deptId"}}, {}});
+  answer("select scope_identity()", "", {Long{8}});
+  answer("select * from QVUserRegInfo where userId=8", "UserId", {});
+  EXPECT_FALSE(applicant.Reg());
+  EXPECT_EQ(applicant.errNumber(), messageNumber(1130));
+  EXPECT_EQ(applicant.errDescription(), LoadResString(1130));
+  EXPECT_TRUE(sent("delete from users where userId=8"));
+  EXPECT_EQ(server_.log.back(), "close") << "no settings are read and no mail is queued after it";
+  for (const String& statement : server_.log) EXPECT_EQ(statement.find("QVMailQ"), String::npos);
+}
+
 TEST_F(UserTest, AnInsertTakesTheRootForNoDepartmentAndKeepsThePasswordUnderTheName) {
   User added;
   added.connect("host");

@@ -62,7 +62,7 @@ class HomeTest : public test::SettingsScene {};
 TEST_F(HomeTest, EverySettingGoesRoundThroughItsOwnColumn) {
   Home home = connected<Home>();
   for (const TextSetting& setting : texts) (home.*setting.set)(String(setting.column) + " d'\xC3\x84");
-  for (const Flag& flag : flags) (home.*flag.set)(true);
+  home.ldEnabled(true);
   home.AcctDay(25);
   home.acctTime(-3);
   home.timeOut(90000);
@@ -93,6 +93,22 @@ TEST_F(HomeTest, EverySettingGoesRoundThroughItsOwnColumn) {
             "companyName d'\xC3\x84|companyName d'\xC3\x84");
 }
 
+TEST_F(HomeTest, EveryFlagIsStoredInItsOwnColumn) {
+  Home home = connected<Home>();
+  for (const Flag& flag : flags) {
+    String columns;
+    String expected;
+    for (const Flag& other : flags) {
+      const bool isSet = &other == &flag;
+      (home.*other.set)(isSet);
+      columns += (columns.empty() ? "" : ",") + String(other.column);
+      expected += (expected.empty() ? "" : "|") + String(isSet ? "1" : "0");
+    }
+    ASSERT_TRUE(home.Save()) << home.errDescription();
+    EXPECT_EQ(stored(columns), expected) << flag.column;
+  }
+}
+
 TEST_F(HomeTest, OnlyOneIsTrueAndEachFlagKnowsItsNull) {
   for (const Flag& flag : flags) {
     const String column = flag.column;
@@ -108,11 +124,16 @@ TEST_F(HomeTest, OnlyOneIsTrueAndEachFlagKnowsItsNull) {
 }
 
 TEST_F(HomeTest, ANullReadsAsItsOwnDefaultAndFailsTheDaysOfAccount) {
-  store(
-      "ldEnable=1,companyName=null,timeOut=null,smtpPort=null,smtpAuth=null,emailPassword=null,LDHost=null,"
-      "LDport=null,LDPasswd=null");
-  const Home home = connected<Home>();
-  EXPECT_EQ(home.homeName() + home.ldHost() + home.emailPassword(), "");
+  store("ldEnable=1,timeOut=null,smtpPort=null,smtpAuth=null,emailPassword=null,LDport=null,LDPasswd=null");
+  Home home;
+  for (const TextSetting& setting : texts) {
+    store(String(setting.column) + "=null");
+    (home.*setting.set)("from before");
+  }
+  home.emailPassword("from before");
+  ASSERT_TRUE(home.connect(installation_.server())) << home.errDescription();
+  for (const TextSetting& setting : texts) EXPECT_EQ((home.*setting.get)(), "") << setting.column;
+  EXPECT_EQ(home.emailPassword(), "");
   EXPECT_EQ(home.timeOut(), 0);
   EXPECT_EQ(home.smtpPort(), 25);
   EXPECT_EQ(home.smtpAuth(), 0);
