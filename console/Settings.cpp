@@ -93,9 +93,13 @@ void save(Home& home, const Options& options) {
 
 // The class has no way to set it: only the row decides.
 void setDirectoryPort(const Console& console, Long port) {
-  Connection connection;
-  connection.Open(buildConnString(console.place().server, console.place().database, false));
-  connection.Execute("update homeinfo set LDport=" + std::to_string(port) + " where id=1");
+  try {
+    Connection connection;
+    connection.Open(buildConnString(console.place().server, console.place().database, false));
+    connection.Execute("update homeinfo set LDport=" + std::to_string(port) + " where id=1");
+  } catch (const Failure& failure) {
+    throw Refusal("The settings are stored, the port is not: " + failure.description(), failure.number());
+  }
 }
 
 Answer set(const Console& console, const Options& options) {
