@@ -1,6 +1,7 @@
 #include "platform/CodePage.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <iconv.h>
 #include <strings.h>
 
@@ -20,7 +21,7 @@ class Converter {
     if (exists()) iconv_close(handle_);
   }
 
-  bool exists() const { return handle_ != reinterpret_cast<iconv_t>(-1); }
+  bool exists() const { return reinterpret_cast<std::intptr_t>(handle_) != -1; }
 
   // One character; empty where the code page lacks it.
   String convert(String character) const {
