@@ -98,7 +98,7 @@ TEST(Login, ThePasswordHasToBeRightEachTime) {
     EXPECT_NO_THROW(checkLogin(*handle, "sa", "sa-password"));
     for (const auto& [user, password] :
          {std::pair("sa", "user-password"), std::pair("sa", ""), std::pair("nobody", "x"), std::pair("nobody", "")}) {
-      const Failure failure = failureOf([&] { checkLogin(*handle, user, password); });
+      const Failure failure = failureOf([&, name = user, word = password] { checkLogin(*handle, name, word); });
       EXPECT_EQ(failure.native(), 18456);
       EXPECT_EQ(failure.number(), number::login);
       EXPECT_EQ(failure.description(), "Login failed for user '" + std::string(user) + "'.");

@@ -18,8 +18,9 @@ TEST(Date, CountsDaysFromItsFirstOne) {
 
 TEST(Date, EveryDayIsReadBackFromItsParts) {
   Date before(1599, 12, 31);
-  for (double day = before.days() + 1; day < Date(2401, 1, 1).days(); ++day) {
-    const Date date(day);
+  const int end = static_cast<int>(Date(2401, 1, 1).days());
+  for (int day = static_cast<int>(before.days()) + 1; day < end; ++day) {
+    const Date date(static_cast<double>(day));
     ASSERT_EQ(Date(date.year(), date.month(), date.day()), date) << day;
     const bool nextDay = date.day() == before.day() + 1 && date.month() == before.month();
     const bool nextMonth = date.day() == 1 && before.day() >= 28;

@@ -10,7 +10,6 @@ namespace QVSa {
 namespace {
 
 using test::FakeServer;
-using test::FakeTable;
 using Log = std::vector<String>;
 
 const char* const readRule =

@@ -16,7 +16,7 @@ template <class Function>
 Function* next(Function*, const char* name) {
   return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
 }
-#define NEXT(function) next(&function, #function)
+#define NEXT(function) next(&(function), #function)
 
 SQLRETURN execute(SQLHSTMT statement, std::string text) {
   for (auto at = text.find("N'"); at != std::string::npos; at = text.find("N'", at)) text.erase(at, 1);

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <cstdint>
 #include <gtest/gtest.h>
 #include <memory>
 #include <openssl/err.h>
@@ -61,7 +62,7 @@ class Writer {
     int rest = 0;
     EVP_EncryptUpdate(run, result.data(), &length, plain.data(), static_cast<int>(plain.size()));
     EVP_EncryptFinal_ex(run, result.data() + length, &rest);
-    result.resize(static_cast<std::size_t>(length + rest));
+    result.resize(static_cast<std::size_t>(length) + static_cast<std::size_t>(rest));
     EVP_CIPHER_CTX_free(run);
     EVP_CIPHER_free(cipher);
     return result;
@@ -187,7 +188,7 @@ TEST(SecretMessage, WithAnyByteOfItsStructureChangedIsRefusedOrRead) {
                    static_cast<int>(message.size()));
   EVP_DecodeFinal(decoder, der.data() + length, &rest);
   EVP_ENCODE_CTX_free(decoder);
-  der.resize(static_cast<std::size_t>(length + rest));
+  der.resize(static_cast<std::size_t>(length) + static_cast<std::size_t>(rest));
   const auto encode = [](const Bytes& bytes) {
     String base64(bytes.size() * 2 + 4, '\0');
     base64.resize(static_cast<std::size_t>(EVP_EncodeBlock(reinterpret_cast<unsigned char*>(base64.data()),
@@ -235,14 +236,14 @@ TEST(Md5Hex, FailsWithOverflowWhereACharacterIsNotOneByte) {
 
 TEST(ClearSecret, OverwritesTheMemory) {
   String text = "a secret that is longer than a small text";
-  const char* memory = text.data();
+  const auto place = reinterpret_cast<std::uintptr_t>(text.data());
   const std::size_t size = text.size();
   clearSecret(text);
   EXPECT_TRUE(text.empty());
   // The text keeps its memory, so it may be looked at.
   text.resize(1);
-  ASSERT_EQ(text.data(), memory);
-  EXPECT_TRUE(std::all_of(memory + 1, memory + size, [](char c) { return c == '\0'; }));
+  ASSERT_EQ(reinterpret_cast<std::uintptr_t>(text.data()), place);
+  EXPECT_TRUE(std::all_of(text.data() + 1, text.data() + size, [](char c) { return c == '\0'; }));
 }
 
 }  // namespace
