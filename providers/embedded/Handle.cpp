@@ -116,6 +116,7 @@ void Handle::open() {
   registerFunctions(handle_, context_);
   for (std::size_t i = 0; i < databaseNames.size(); ++i) attach(i);
   execute("pragma temp_store=memory");
+  mark_.emplace(lockFile(folder_, databaseNames[0]));
 }
 
 bool Handle::isCurrent() const {

@@ -12,6 +12,7 @@
 #include <vector>
 
 #include "QVSa/frame/Failure.h"
+#include "providers/embedded/CatalogueMark.h"
 #include "providers/embedded/Functions.h"
 #include "providers/embedded/Layout.h"
 #include "providers/embedded/Prepared.h"
@@ -67,9 +68,16 @@ class Handle {
   bool inTransaction() const;
   // The stored digest of a log-in's password; empty for a log-in that does not exist.
   std::string loginDigest(const std::string& user);
+  // The log-in that was last found right on this handle, and the mark of that moment.
+  struct CheckedLogin {
+    std::uint64_t mark = 0;
+    Bytes fingerprint;
+  };
+  std::optional<CheckedLogin>& checkedLogin() { return checkedLogin_; }
 
-  // Changes with every definition in any database, by whichever session, and with every restore. What was read under
-  // one value is never the truth under it again.
+  const CatalogueMark& mark() const { return *mark_; }
+  // As the files tell it. Changes with every definition in any database, by whichever session, and with every restore.
+  // What was read under one value is never the truth under it again.
   std::int64_t catalogueVersion();
 
   // Ends what a session may have left: running statements, a transaction, row locks, its place in the databases, the
@@ -94,6 +102,7 @@ class Handle {
   std::string master_;  // the path of the first file, and which file that is
   dev_t masterDevice_ = 0;
   ino_t masterNumber_ = 0;
+  std::optional<CatalogueMark> mark_;
   sqlite3* handle_ = nullptr;
   FunctionContext context_;
   std::array<std::unique_ptr<RowLocks>, databaseNames.size()> locks_;
@@ -105,6 +114,7 @@ class Handle {
   std::optional<Prepared> version_;
   std::vector<Prepared> schemas_;
   std::shared_ptr<void> attachment_;
+  std::optional<CheckedLogin> checkedLogin_;
   std::optional<std::chrono::steady_clock::time_point> deadline_;
   std::minstd_rand random_;
 };

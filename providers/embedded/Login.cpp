@@ -40,23 +40,32 @@ CheckedLogins& checkedLogins() {
   return theLogins;
 }
 
-// The digest is salted: the same one for the same password means the same log-in.
-Bytes fingerprintOf(const std::string& digest, const std::string& password) {
-  std::string text = digest + '\0' + password;
+// Of a name or a digest with its password. The digest is salted: the same one for the same password means the same
+// log-in.
+Bytes fingerprintOf(const std::string& owner, const std::string& password) {
+  std::string text = owner + '\0' + password;
   const Bytes result = platform::fingerprint(text);
   platform::clearSecret(text);
   return result;
 }
 
-}  // namespace
-
-void checkLogin(Handle& handle, const std::string& user, const std::string& password) {
-  const std::string digest = handle.loginDigest(user);
+void checkAgainstDigest(const std::string& digest, const std::string& user, const std::string& password) {
   const Bytes fingerprint = fingerprintOf(digest, password);
   if (checkedLogins().contains(fingerprint)) return;
   if (!platform::passwordMatches(password, digest))
     throw tsql::sqlFailure(18456, "Login failed for user '" + user + "'.");
   checkedLogins().add(fingerprint);
+}
+
+}  // namespace
+
+void checkLogin(Handle& handle, const std::string& user, const std::string& password) {
+  const std::uint64_t mark = handle.mark().value();
+  const Bytes fingerprint = fingerprintOf(user, password);
+  auto& checked = handle.checkedLogin();
+  if (checked && checked->mark == mark && checked->fingerprint == fingerprint) return;
+  checkAgainstDigest(handle.loginDigest(user), user, password);
+  if (CatalogueMark::isSettled(mark)) checked = {mark, fingerprint};
 }
 
 }  // namespace QVSa::embedded

@@ -14,6 +14,7 @@ namespace QVSa::embedded {
 // What a handle keeps between sessions: the catalogue, and the plans that were bound against it.
 struct EmbeddedSession::Cache {
   std::shared_ptr<const Catalogue> catalogue;
+  std::uint64_t mark = 0;                                 // under which the catalogue was found right
   std::array<PlanCache, 2 * databaseNames.size()> plans;  // by current database and whether rows are to be written back
 };
 
@@ -87,6 +88,8 @@ EmbeddedSession::EmbeddedSession(PooledHandle handle, std::size_t database, bool
 
 EmbeddedSession::~EmbeddedSession() {
   for (auto* rows : rows_) rows->close();
+  // What it has defined and not committed is undone now.
+  if (change_) cache_->catalogue.reset();
   try {
     endTransaction();
     if (handle_->inTransaction()) handle_->execute("rollback");
@@ -96,6 +99,9 @@ EmbeddedSession::~EmbeddedSession() {
 }
 
 void EmbeddedSession::refreshCatalogue() {
+  const std::uint64_t mark = handle_->mark().value();
+  if (cache_->catalogue && cache_->mark == mark && CatalogueMark::isSettled(mark)) return;
+  cache_->mark = mark;
   if (cache_->catalogue && cache_->catalogue->version() == handle_->catalogueVersion()) return;
   for (auto& plans : cache_->plans) plans.clear();
   cache_->catalogue = std::make_shared<const Catalogue>(*handle_);
@@ -339,6 +345,7 @@ void EmbeddedSession::defineObject(const tsql::Statement& statement) {
   const bool own = !marked_;
   if (own) begin();
   try {
+    if (!change_) change_.emplace(handle_->mark());
     const std::size_t database = definedDatabase(statement, database_);
     enter(database);
     prepareWrite(database);
@@ -408,6 +415,7 @@ void EmbeddedSession::rollback() {
 
 void EmbeddedSession::endTransaction() {
   marked_ = started_ = false;
+  change_.reset();
   writing_.clear();
   handle_->releaseLocks();
   leaveOthers();

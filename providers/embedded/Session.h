@@ -75,9 +75,10 @@ class EmbeddedSession : public ProviderSession {
   std::shared_ptr<Cache> cache_;
   std::size_t database_;
   bool administrator_;
-  bool marked_ = false;            // begin was called
-  bool started_ = false;           // the storage library's transaction is open
-  std::set<std::size_t> writing_;  // databases whose writer's place is taken
+  bool marked_ = false;                    // begin was called
+  bool started_ = false;                   // the storage library's transaction is open
+  std::set<std::size_t> writing_;          // databases whose writer's place is taken
+  std::optional<CatalogueChange> change_;  // from the transaction's first definition on
   std::vector<EmbeddedRows*> rows_;
   std::set<std::size_t> entered_;                       // databases that this session uses now, its current one always
   std::pair<std::size_t, std::string> identityInsert_;  // the table that takes identity values as they are given

@@ -109,6 +109,7 @@ void EmbeddedSession::restoreDatabase(const tsql::RestoreDatabase& restore) {
   checkMoves(restore, handle_->folder(), database);
   {
     const AloneMeanwhile alone(handle_->locks(database), restore.database);
+    const CatalogueChange change(handle_->mark());
     restoreCopy(*handle_, database, restore.file.text);
   }
   refreshCatalogue();

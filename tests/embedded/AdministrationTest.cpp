@@ -1,8 +1,11 @@
 #include <filesystem>
 #include <gtest/gtest.h>
+#include <optional>
 #include <thread>
 
 #include "QVSa/frame/ConnectionString.h"
+#include "providers/embedded/CatalogueMark.h"
+#include "providers/embedded/Layout.h"
 #include "providers/embedded/Pool.h"
 #include "providers/embedded/Provider.h"
 #include "tests/support/Failures.h"
@@ -111,6 +114,33 @@ TEST_F(Administration, ARestoreBringsTheCopyBackAndEverySessionSeesIt) {
   EXPECT_EQ(value(*warm, "select max(n) from QVSys..t").toLong(), 1);
   EXPECT_EQ(native(*warm, "select name from QVSys..t"), 207);
   EXPECT_EQ(native(*warm, "insert into QVSys..t(n) values(1)"), 2627);
+}
+
+// The second time under a mark that somebody left behind who died in the middle of a definition.
+TEST_F(Administration, AWarmHandleKnowsWhatHasChangedSinceItsLastSession) {
+  auto session = administrator();
+  session->run({"create view QVSys..v as select 0 as a"});
+  const embedded::CatalogueMark mark(embedded::lockFile(installation_.folder(), "master"));
+  std::optional<embedded::CatalogueChange> unfinished;
+  for (Long now : {1, 2}) {
+    EXPECT_EQ(value(*open("QVSys"), "select a from v").toLong(), now - 1);
+    EXPECT_EQ(embedded::CatalogueMark::isSettled(mark.value()), !unfinished);
+    session->run({"drop view QVSys..v"});
+    session->run({"create view QVSys..v as select " + std::to_string(now) + " as a"});
+    EXPECT_EQ(value(*open("QVSys"), "select a from v").toLong(), now);
+    unfinished.emplace(mark);
+  }
+  unfinished.reset();
+  {
+    auto undone = open("QVSys");
+    undone->begin();
+    undone->run({"drop view v"});
+  }
+  EXPECT_EQ(value(*open("QVSys"), "select a from v").toLong(), 2);
+  session->run({"drop login QVUser"});
+  EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
+  session->run({"create login QVUser with password=N'another'"});
+  EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
 }
 
 TEST_F(Administration, ARestoreNeedsTheDatabaseForItself) {
