@@ -50,14 +50,15 @@ Boolean Department::insertDept() {
     place = {trim(superior->path.value_or("")), superior->fullNameBelow};
   }
 
+  // Numbers first, here and below: one filled in behind a text would be stored in place of its own token in that text.
   connection.Execute(sql("insert into departments(deptNo,deptName,superDept,fullName,isOrg,isOuter) "
                          " values(<deptNo>,<deptName>,<superDept>,<fullName>,<isOrg>,<isOuter>)")
+                         .number("superDept", superInnerId_)
+                         .number("isOrg", isOrg_)
+                         .number("isOuter", isOuter_ ? 1 : 0)
                          .text("deptNo", Id_)
                          .text("deptName", Name_)
-                         .number("superDept", superInnerId_)
-                         .text("fullName", place.fullName)
-                         .number("isOrg", isOrg_)
-                         .number("isOuter", isOuter_ ? 1 : 0));
+                         .text("fullName", place.fullName));
   {
     Recordset row = connection.Execute("select scope_identity()");
     if (row.EOF_()) fail("Department", 1103);
@@ -134,12 +135,12 @@ void Department::updateRow(Connection& connection, const Place& place) {
                          "superDept=<superDept>,"
                          "isOrg=" +
                          text(isOrg_) + " where deptId=<oldId>")
+                         .number("superDept", superInnerId_)
+                         .number("oldId", InnerId_)
+                         .text("path", place.path)
                          .text("deptNo", Id_)
                          .text("deptName", Name_)
-                         .text("fullName", place.fullName)
-                         .text("path", place.path)
-                         .number("superDept", superInnerId_)
-                         .number("oldId", InnerId_));
+                         .text("fullName", place.fullName));
 }
 
 // The row itself is left out: updateRow wrote it.
@@ -152,9 +153,9 @@ void Department::rewriteSubtree(Connection& connection, const Stored& stored, co
                          text(InnerId_))
                          .text("path_old", stored.path)
                          .text("path", place.path)
+                         .text("pathPattern", stored.path + "%")
                          .text("fullName_old", stored.fullName)
-                         .text("fullName", place.fullName)
-                         .text("pathPattern", stored.path + "%"));
+                         .text("fullName", place.fullName));
 }
 
 }  // namespace QVSa

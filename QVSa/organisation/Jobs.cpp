@@ -14,7 +14,11 @@ Boolean Jobs::GetAll(const String& deptId, const String& roleName, Long userId) 
     if (!roleName.empty()) statement += " and r.roleName=<roleName>";
     if (userId != 0) statement += " and jobId in (select jobId from userJob where userId=" + text(userId) + ")";
     statement += " order by j.deptId";
-    addRows(connection.Execute(sql(statement).text("deptNo", deptId).text("roleName", roleName)));
+    Statement filled = sql(statement);
+    // The empty text of a filter that is not given would stand in place of its token inside the other one.
+    if (!deptId.empty()) filled.text("deptNo", deptId);
+    if (!roleName.empty()) filled.text("roleName", roleName);
+    addRows(connection.Execute(filled));
     return true;
   });
 }

@@ -82,7 +82,7 @@ Boolean Users::GetAll(const String& deptId, Long roleId, Boolean noBuiltIn, Long
     statement +=
         " and(u.accstate=0 or u.accstate=1)"
         " order by username ";
-    Recordset row = connection.Execute(sql(statement).text("deptNo", deptId).number("roleId", roleId));
+    Recordset row = connection.Execute(sql(statement).number("roleId", roleId).text("deptNo", deptId));
     // All rows first, then the groups of each on the same connection.
     for (row.ActiveConnection(nullptr); !row.EOF_(); row.MoveNext()) {
       auto user = readAccount(row);

@@ -13,7 +13,10 @@ const String hardTexts[] = {"O'Brien''s",
                             "\xE9\x94\x80\xE5\x94\xAE\xE9\x83\xA8",
                             "a|b\"c\\d\te"};
 
-class HardTextsTest : public test::Company {};
+class HardTextsTest : public test::Company {
+ protected:
+  test::Lines tree() const { return tables_.rows("select deptNo,deptName,fullName,path from departments"); }
+};
 
 TEST_F(HardTextsTest, ARoleAGroupAndADepartmentAreFoundByThemAgain) {
   for (const String& name : hardTexts) {
@@ -44,14 +47,51 @@ TEST_F(HardTextsTest, ARoleAGroupAndADepartmentAreFoundByThemAgain) {
   EXPECT_TRUE(groups.GetAll()) << groups.errDescription();
 }
 
+TEST_F(HardTextsTest, ATokenOfItsOwnStatementsIsKeptByADepartmentOrRefused) {
+  const String works = idOf("W");
+  int kept = 0;
+  const auto save = [&](Department subject, bool isNumber, const String& token) {
+    const test::Lines before = tree();
+    isNumber ? subject.Id(token) : subject.Name(token);
+    if (!subject.Save()) {
+      EXPECT_EQ(tree(), before) << token;
+      return;
+    }
+    ++kept;
+    EXPECT_EQ(tables_.text("select deptNo,deptName,fullName from departments where deptId=" + text(subject.InnerId())),
+              subject.Id() + "|" + subject.Name() + "|" + subject.Name());
+    EXPECT_TRUE(connected<Department>().GetOne(isNumber ? 1 : 2, token)) << token;
+  };
+  for (const char* token : {"<superDept>", "<isOrg>", "<isOuter>", "<oldId>", "<fullName>"}) {
+    for (const bool isNumber : {false, true}) {
+      auto added = connected<Department>(), changed = connected<Department>();
+      added.Id("N");
+      added.Name("North");
+      added.Super("_root");
+      save(added, isNumber, token);
+      ASSERT_TRUE(changed.GetOne(3, works));
+      save(changed, isNumber, token);
+    }
+  }
+  EXPECT_EQ(kept, 16) << "all but the token that is filled in last";
+}
+
 TEST_F(HardTextsTest, AnXmlKeepsThem) {
   const Long hub = job(manager_, "H");
-  for (const String& name : {hardTexts[0], hardTexts[5], hardTexts[6]})
-    manager_.UpdateUsers(text(addUser(name, "H")) + "," + text(hub), "");
-  String xml;
-  ASSERT_TRUE(manager_.GetUsers2(xml));
-  for (const String& name : {hardTexts[0], hardTexts[5], hardTexts[6]})
-    EXPECT_NE(xml.find(" name=\"" + name + "\" "), String::npos) << xml;
+  test::Lines ids, pairs;
+  for (const String& name : hardTexts) {
+    ids.push_back(text(addUser(name, "H")));
+    pairs.push_back(ids.back() + "," + text(hub));
+  }
+  ASSERT_TRUE(manager_.UpdateUsers(join(pairs, "|"), "")) << manager_.errDescription();
+  String holders;
+  ASSERT_TRUE(manager_.GetUsers2(holders));
+  const String members = addGroup("All", join(ids, ",")).GetUsers();
+  for (String name : hardTexts) {
+    for (const auto& [sign, written] : {std::pair("&", "&amp;"), {"<", "&lt;"}, {"\"", "&quot;"}, {"\t", "&#09;"}})
+      name = replaceAll(name, sign, written);
+    for (const String& xml : {holders, members}) EXPECT_NE(xml.find(" name=\"" + name + "\" "), String::npos) << xml;
+  }
 }
 
 TEST_F(HardTextsTest, ATextOfFourThousandCharactersIsRefusedWhereItsColumnIsShorterAndStoredWhereNot) {
@@ -66,6 +106,18 @@ TEST_F(HardTextsTest, ATextOfFourThousandCharactersIsRefusedWhereItsColumnIsShor
   EXPECT_FALSE(group.Save());
   EXPECT_EQ(group.errNumber(), number::range);
   EXPECT_EQ(tables_.text("select count(*) from ItemGroups"), "0");
+  auto branch = connected<Department>();
+  branch.Id("L");
+  branch.Name(longText);
+  EXPECT_FALSE(branch.Save());
+  EXPECT_EQ(branch.errNumber(), number::range);
+  tables_.run("update departments set fullName='Sales-East-'+replicate('x',3985) where deptNo='H'");
+  const test::Lines before = tree();
+  Department sales = department("S");
+  sales.Name("Sales and more");
+  EXPECT_FALSE(sales.Save()) << "too long a full name, two levels below";
+  EXPECT_EQ(sales.errNumber(), number::range);
+  EXPECT_EQ(tree(), before);
   EXPECT_FALSE(role.GetOne(2, longText));
   EXPECT_EQ(role.errNumber(), messageNumber(1201));
   tables_.run(

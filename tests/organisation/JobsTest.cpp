@@ -40,6 +40,11 @@ TEST_F(JobsTest, TheyAreListedByDepartmentRoleAndHolder) {
   EXPECT_EQ(names(jobs_), (Lines{"Sales-East--Manager"}));
   ASSERT_TRUE(jobs_.GetAll("H", "", ann));
   EXPECT_EQ(jobs_.Count(), 0);
+
+  addDepartment("<roleName>", "Odd", "W");
+  job(clerk_, "<roleName>");
+  ASSERT_TRUE(jobs_.GetAll("<roleName>"));
+  EXPECT_EQ(names(jobs_), (Lines{"Works-Odd--Clerk"})) << "a number that reads as a token";
 }
 
 TEST_F(JobsTest, ADepartmentListsTheJobsBelowItToo) {
