@@ -49,7 +49,8 @@ class Department : private Frame {
   Boolean GetOne(Integer keyName, const String& keyValue);
   // Inserts the department, or updates it where `InnerId` is not 0; a change of place or name rewrites the paths and
   // full names of all below it, in the same transaction. A place inside its own subtree is not refused. 0x800403EA
-  // number or name empty, 0x800403EB no such superior.
+  // number or name empty, 0x800403EB no such superior. An insert is not one transaction: where its last step fails, the
+  // row stays without a path, with `InnerId` set; delete it before trying again.
   Boolean Save();
   // Deletes the department numbered `Id` (empty: this one) and its jobs. 0x800403E9 there is none, 0x800403EC it has
   // sub departments, 0x800403EE it has users. Not one transaction: the jobs stay removed where the last step fails.

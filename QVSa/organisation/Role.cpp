@@ -55,12 +55,14 @@ Boolean Role::insertRole() {
                " , CreUId , CreUName , CreateTime , UpdUId , UpdUName , UpdTime , OtherCanUpd ) "
                " values(<roleName>,<roleDesc>,0 "
                " ,<CreUId>,<CreUName>,<CreateTime>,<UpdUId>,<UpdUName>,<UpdTime>,<OtherCanUpd>) "));
+    Long id = 0;
     {
       Recordset row = connection.Execute("select scope_identity()");
       if (row.EOF_()) return refuse(1203);
-      Id_ = row[0].asLong();
+      id = row[0].asLong();
     }
     connection.CommitTrans();
+    Id_ = id;
     return true;
   });
 }

@@ -113,12 +113,14 @@ Boolean userGroup::insertGroup() {
                            " values(<gName>,<gDesc>)")
                            .text("gDesc", description_)
                            .text("gName", Name_));
+    Long id = 0;
     {
       Recordset row = connection.Execute("select scope_identity()");
       if (row.EOF_()) return refuse(1802);
-      Id_ = row[0].asLong();
+      id = row[0].asLong();
     }
     connection.CommitTrans();
+    Id_ = id;
     return true;
   });
 }

@@ -1,6 +1,8 @@
 #include <gtest/gtest.h>
 
 #include "QVSa/organisation/Department.h"
+#include "QVSa/organisation/Role.h"
+#include "QVSa/organisation/userGroup.h"
 #include "QVSa/resources/Messages.h"
 #include "tests/support/FakeSession.h"
 
@@ -142,10 +144,51 @@ TEST_F(DepartmentTest, ANewDepartmentIsInsertedFirstAndGetsItsPathFromItsId) {
   EXPECT_EQ(added.InnerId(), 9);
   EXPECT_EQ(added.fullName(), "North") << "the root's name stands in no chain";
   EXPECT_EQ(added.fullId(), "");
-  EXPECT_EQ(server_.log[3],
-            "insert into departments(deptNo,deptName,superDept,fullName,isOrg,isOuter) "
-            " values(N'N',N'North',5,N'North',0,0)");
-  EXPECT_EQ(server_.log[5], "update departments set path=N'.1.9.' where deptId=9");
+  const String insert =
+      "insert into departments(deptNo,deptName,superDept,fullName,isOrg,isOuter) "
+      " values(N'N',N'North',5,N'North',0,0)";
+  EXPECT_EQ(server_.log[3], insert);
+  const String path = "update departments set path=N'.1.9.' where deptId=9";
+  EXPECT_EQ(server_.log[5], path);
+
+  Department half;
+  half.connect("host");
+  half.Id("N");
+  half.Name("North");
+  half.Super("_root");
+  server_.fail(path, Failure(number::timeout, "server", "late."));
+  server_.log.clear();
+  EXPECT_FALSE(half.Save());
+  EXPECT_EQ(half.InnerId(), 9) << "the row is there, without its path";
+  EXPECT_EQ(Log(server_.log.begin() + 3, server_.log.end()), (Log{insert, "select scope_identity()", path, "close"}))
+      << "nothing takes the insert back";
+}
+
+template <class Object>
+Object refusedNew(Long errNumber, const Log& lastOfLog, FakeServer& server) {
+  Object object;
+  object.connect("host");
+  if constexpr (std::is_same_v<Object, Department>) object.Id("N");
+  object.Name("N");
+  EXPECT_FALSE(object.Save());
+  EXPECT_EQ(object.errNumber(), errNumber);
+  EXPECT_EQ(Log(server.log.end() - static_cast<int>(lastOfLog.size()), server.log.end()), lastOfLog);
+  return object;
+}
+
+TEST_F(DepartmentTest, ARowWhoseIdCantBeReadOrThatIsNotCommittedHasNone) {
+  const String identity = "select scope_identity()";
+  server_.answer("select count(*) from roles where roleName=N'N'", {{{""}}, {{Long{0}}}});
+  server_.answer("select count(*) from ItemGroups where gName=N'N'", {{{""}}, {{Long{0}}}});
+  server_.answer(identity, {{{""}}, {}});
+  EXPECT_EQ(refusedNew<Department>(messageNumber(1103), {identity, "close"}, server_).InnerId(), 0);
+  EXPECT_EQ(refusedNew<Role>(messageNumber(1203), {identity, "rollback", "close"}, server_).Id(), 0);
+  EXPECT_EQ(refusedNew<userGroup>(messageNumber(1802), {identity, "rollback", "close"}, server_).Id(), 0);
+
+  server_.answer(identity, {{{""}}, {{9.0}}});
+  server_.fail("commit", Failure(number::timeout, "server", "late."));
+  EXPECT_EQ(refusedNew<Role>(number::timeout, {"commit", "rollback", "close"}, server_).Id(), 0);
+  EXPECT_EQ(refusedNew<userGroup>(number::timeout, {"commit", "rollback", "close"}, server_).Id(), 0);
 }
 
 TEST_F(DepartmentTest, AMissingNameOrSuperiorRefusesTheSaveBeforeAnythingIsWritten) {
