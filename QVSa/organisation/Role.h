@@ -51,13 +51,13 @@ class Role : private Frame {
   Boolean Delete(Long Id = 0);
 
   // The holders, directly or through a group; `deptId`: only those of the department of that number. `noBuiltIn`:
-  // without built-in users. `haveAuth` plays no part. No object on failure; two holders of one name are one.
+  // without built-in users. `haveAuth` plays no part. No object on failure, and 457 where two holders have one name.
   std::shared_ptr<Users> GetUsers(Boolean haveAuth = true, Boolean noBuiltIn = true, const String& deptId = "");
   // Users by department, with all below it, and by role name, empty for any. `deptId` is an inner id as text, empty for
-  // any; no object and 6 where it is above 32,767.
+  // any; no object and 6 where it is above 32,767. Of two users of one name only the first is listed.
   std::shared_ptr<Users> GetUsersOfRole(const String& deptId = "", const String& roleName = "");
-  // The same as XML: <users><user id name deptid deptname jobid deptno/>...</users>, one `user` for each job held; the
-  // department is the holder's home. Direct holders only.
+  // The direct holders as XML: <users><user id name deptid deptname jobid deptno/>...</users>, one `user` for each job
+  // held; the department is the holder's home.
   Boolean GetUsers2(String& UsersXml);
   // Adds and removes holders: pairs "userId,jobId" with "|" between, of whatever role. Removes first. No transaction:
   // what was done before a failure stays. 9 for a pair without a comma.

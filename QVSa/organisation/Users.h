@@ -45,8 +45,7 @@ class Users : public Collection<User> {
 
   // Fills the row set of users in whatever state, of a department by its inner id (0: all) and all below it. Columns,
   // in the system's language: one without a name, empty; userid, Name, Login, Department, Remark ("BuiltIn" or empty),
-  // State
-  // ("Locked" or empty). The number of rows, -1 on failure. The row set stands by itself: no connection is held.
+  // State ("Locked" or empty). The number of rows, -1 on failure. The row set stands by itself: no connection is held.
   Long GetList(Long deptId);
   // The names of the data members: "users".
   std::vector<String> DataMembers() const { return {"users"}; }

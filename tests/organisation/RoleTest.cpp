@@ -153,6 +153,13 @@ TEST_F(RoleTest, HoldersComeDirectlyOrThroughAGroup) {
   EXPECT_EQ(names(*manager_.GetUsersOfRole(idOf("S"), "Manager")), (Lines{"ann"}));
   EXPECT_EQ(names(*manager_.GetUsersOfRole("", "manager")), (Lines{"ann", "bob"}));
 
+  tables_.run(
+      "insert into users(userName,userLogin,deptId) select userName,'twin',deptId from users where userName='bob'"
+      " insert into grpUser(gId,userId) select gId,userId from ItemGroups,users where userLogin='twin'");
+  EXPECT_EQ(manager_.GetUsers(true, false), nullptr) << "two of one name";
+  EXPECT_EQ(manager_.errNumber(), number::keyExists);
+  EXPECT_EQ(names(*manager_.GetUsersOfRole("", "Manager")), (Lines{"ann", "bob"}));
+
   EXPECT_EQ(manager_.GetUsersOfRole("40000"), nullptr);
   EXPECT_EQ(manager_.errNumber(), number::overflow);
   EXPECT_EQ(manager_.errDescription(), "Error in listing users who have the role [Manager]. Overflow");
