@@ -41,6 +41,8 @@ class Collection : protected Frame {
   }
   // Throws 457 where the key is taken.
   void add(std::shared_ptr<Record> record, const String& key) { items_.add(std::move(record), key); }
+  // Passes over a record whose key is taken.
+  void addIfNew(std::shared_ptr<Record> record, const String& key) { items_.addIfNew(std::move(record), key); }
   // Emptying counts the items: a collection that has outgrown its counter can't be emptied.
   void clearItems() {
     static_cast<void>(Count());

@@ -29,10 +29,15 @@ class KeyedCollection {
 
   // Throws Failure 457 where the key is taken; nothing is added then.
   void add(Pointer record, const String& key) {
+    if (!addIfNew(std::move(record), key)) throw runtimeFailure(number::keyExists);
+  }
+  // False where the key is taken; nothing is added then.
+  bool addIfNew(Pointer record, const String& key) {
     const String folded = lowerCase(key);
-    if (!index_.emplace(folded, record).second) throw runtimeFailure(number::keyExists);
+    if (!index_.emplace(folded, record).second) return false;
     items_.push_back(std::move(record));
     keys_.push_back(folded);
+    return true;
   }
 
   // By position where `index` is a number, by key where it is a text. Throws 9 for a position out of range, 5 for an

@@ -83,7 +83,7 @@ Boolean Users::GetAllOfTheDeptAndRole(Long deptId, const String& roleName) {
       user->deptInnerId(row["deptId"].asLong());
       user->deptName_ = row["deptName"].asText();
       // Who has several roles has several rows: the first one stands.
-      if (!Item(user->Name())) add(user, user->Name());
+      addIfNew(user, user->Name());
     }
     return true;
   });
