@@ -18,6 +18,7 @@ class Jobs : public Collection<Job> {
 
  private:
   friend class Department;
+  friend class JobsTest;
   friend class Role;
 
   void addRows(Recordset row);

@@ -1,7 +1,6 @@
 #include "tests/organisation/Company.h"
 
 namespace QVSa {
-namespace {
 
 using test::Lines;
 using test::names;
@@ -12,6 +11,14 @@ class JobsTest : public test::Company {
     manager_.setJobs(idOf("S") + "," + idOf("E") + "," + idOf("H"));
     clerk_ = addRole("Clerk");
     clerk_.setJobs(idOf("H"));
+  }
+
+  Boolean remove(Long roleId, Long deptId) const {
+    Connection connection;
+    connection.Open(buildConnString(installation_.server(), "QVApp", false));
+    Boolean ok = false;
+    connected<Jobs>().removeJobs(connection, roleId, deptId, ok);
+    return ok;
   }
 
   Role clerk_;
@@ -66,6 +73,15 @@ TEST_F(JobsTest, TheJobsOfAHoldersRolesNameTheirDepartmentByItsInnerId) {
   EXPECT_EQ(jobs_.Count(), 8);
 }
 
+TEST_F(JobsTest, OnlyTheJobOfTheRoleInTheDepartmentGoesWhereBothAreNamed) {
+  EXPECT_TRUE(remove(0, 0) && connected<Role>().Delete());
+  ASSERT_TRUE(jobs_.GetAll());
+  EXPECT_EQ(jobs_.Count(), 8) << "nothing was named";
+  EXPECT_TRUE(remove(manager_.Id(), department("H").InnerId()));
+  ASSERT_TRUE(jobs_.GetAllOfDept(department("S").InnerId()));
+  EXPECT_EQ(names(jobs_), (Lines{"Sales--Manager", "Sales-East--Manager", "Sales-East-Hub--Clerk"}));
+}
+
 TEST_F(JobsTest, AJobWithoutItsDepartmentIsInNoList) {
   tables_.run("delete from departments where deptNo='H'");
   ASSERT_TRUE(jobs_.GetAll("", "Clerk"));
@@ -76,5 +92,4 @@ TEST_F(JobsTest, AJobWithoutItsDepartmentIsInNoList) {
   EXPECT_EQ(jobs_.Count(), 6);
 }
 
-}  // namespace
 }  // namespace QVSa
