@@ -2,7 +2,6 @@
 
 #include <set>
 
-#include "QVSa/organisation/Departments.h"
 #include "QVSa/organisation/Jobs.h"
 #include "QVSa/organisation/Role.h"
 #include "console/Progress.h"
@@ -10,18 +9,15 @@
 namespace QVSa::console {
 
 void HoldingsImport::run() {
-  Departments departments;
-  console_.connect(departments);
-  require(departments.GetAll(), departments);
-  for (const auto& department : departments) departmentIds_[department->Id()] = department->InnerId();
+  console_.connect(departments_);
+  require(departments_.GetAll(), departments_);
 
-  std::set<String> roles;
-  std::map<String, std::vector<const HoldingRow*>> byLogin;
+  std::map<String, Rows> byRole, byLogin;
   for (const HoldingRow& row : holdings_) {
-    roles.insert(row.role);
+    byRole[lowerCase(row.role)].push_back(&row);
     byLogin[row.login].push_back(&row);
   }
-  for (const String& role : roles) importRole(role);
+  for (const auto& [role, rows] : byRole) importRole(rows);
   Progress progress("holders", byLogin.size());
   for (const auto& [login, rows] : byLogin) {
     importHolder(login, rows);
@@ -29,7 +25,14 @@ void HoldingsImport::run() {
   }
 }
 
-void HoldingsImport::importRole(const String& name) {
+String HoldingsImport::departmentId(const String& number) const {
+  const auto department = departments_.Item(number);
+  if (!department) throw Refusal("There is no department " + number + ".");
+  return text(department->InnerId());
+}
+
+void HoldingsImport::importRole(const Rows& rows) {
+  const String& name = rows.front()->role;
   Role role;
   console_.connect(role);
   const bool found = role.GetOne(2, name);
@@ -41,15 +44,16 @@ void HoldingsImport::importRole(const String& name) {
   }
 
   readJobs(name);
-  std::set<String> seen;
+  std::set<Job> seen;
   std::vector<String> missing;
-  for (const HoldingRow& row : holdings_) {
-    if (row.role != name || !seen.insert(row.department).second) continue;
-    const bool isThere = jobIds_.count({name, row.department}) != 0;
+  for (const HoldingRow* row : rows) {
+    const Job job = jobOf(row->role, row->department);
+    if (!seen.insert(job).second) continue;
+    const bool isThere = jobIds_.count(job) != 0;
     ++(isThere ? jobs_.unchanged : jobs_.added);
-    if (!isThere) missing.push_back(text(departmentIds_[row.department]));
+    if (!isThere && !dryRun_) missing.push_back(departmentId(row->department));
   }
-  if (dryRun_ || missing.empty()) return;
+  if (missing.empty()) return;
   require(role.setJobs(join(missing, ",")), role);
   readJobs(name);
 }
@@ -58,10 +62,10 @@ void HoldingsImport::readJobs(const String& role) {
   Jobs jobs;
   console_.connect(jobs);
   require(jobs.GetAll("", role), jobs);
-  for (const auto& job : jobs) jobIds_.emplace(Job(role, job->deptId()), job->Id());
+  for (const auto& job : jobs) jobIds_.emplace(jobOf(role, job->deptId()), job->Id());
 }
 
-void HoldingsImport::importHolder(const String& login, const std::vector<const HoldingRow*>& rows) {
+void HoldingsImport::importHolder(const String& login, const Rows& rows) {
   const Long userId = userIds_.at(login);
   std::set<Long> held;
   if (userId != 0) {
@@ -72,8 +76,10 @@ void HoldingsImport::importHolder(const String& login, const std::vector<const H
   }
   std::vector<String> pairs;
   for (const HoldingRow* row : rows) {
-    const auto job = jobIds_.find({row->role, row->department});
-    const bool holds = job != jobIds_.end() && held.count(job->second) != 0;
+    const auto job = jobIds_.find(jobOf(row->role, row->department));
+    const bool isThere = job != jobIds_.end();
+    if (!isThere && !dryRun_) throw Refusal("The job " + row->role + " could not be made in " + row->department + ".");
+    const bool holds = isThere && !held.insert(job->second).second;
     ++(holds ? holders_.unchanged : holders_.added);
     if (!holds && !dryRun_) pairs.push_back(text(userId) + "," + text(job->second));
   }

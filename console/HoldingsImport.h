@@ -2,6 +2,7 @@
 
 #include <map>
 
+#include "QVSa/organisation/Departments.h"
 #include "console/Console.h"
 #include "console/OrganisationFiles.h"
 
@@ -30,17 +31,23 @@ class HoldingsImport {
   const Tally& holders() const { return holders_; }
 
  private:
+  using Rows = std::vector<const HoldingRow*>;
   using Job = std::pair<String, String>;  // role and department number
 
-  void importRole(const String& name);
+  // In small letters, as the database ignores the case.
+  static Job jobOf(const String& role, const String& department) { return {lowerCase(role), lowerCase(department)}; }
+
+  // All rows of one role, all rows of one user.
+  void importRole(const Rows& rows);
+  void importHolder(const String& login, const Rows& rows);
   void readJobs(const String& role);
-  void importHolder(const String& login, const std::vector<const HoldingRow*>& rows);
+  String departmentId(const String& number) const;
 
   const Console& console_;
   const std::vector<HoldingRow>& holdings_;
   std::map<String, Long> userIds_;
   bool dryRun_;
-  std::map<String, Long> departmentIds_;
+  Departments departments_;
   std::map<Job, Long> jobIds_;
   Tally roles_;
   Tally jobs_;

@@ -99,7 +99,7 @@ void Import::importDepartments() {
 
 void Import::importDepartment(const DepartmentRow& row, Department& department) {
   const bool isNew = department.InnerId() == 0;
-  if (!isNew && department.Name() == row.name && department.Super() == row.superior &&
+  if (!isNew && department.Name() == row.name && sameText(department.Super(), row.superior) &&
       department.isOrg() == row.isOrganisation) {
     ++departments_.unchanged;
     return;
@@ -125,7 +125,7 @@ void Import::importUser(const UserRow& row) {
   if (!user.GetOne(3, row.login)) {
     if (user.errNumber() != messageNumber(1101)) require(false, user);
     addUser(row, user);
-  } else if (user.Name() == row.name && user.deptId() == row.department) {
+  } else if (user.Name() == row.name && sameText(user.deptId(), row.department)) {
     ++users_.unchanged;
   } else {
     changeUser(row, user);

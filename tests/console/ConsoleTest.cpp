@@ -198,6 +198,10 @@ TEST_F(Program, AnImportOfHoldingsAddsWhatIsMissing) {
   EXPECT_EQ(import(), "d0030 u0020 r0010 j0020 h1010 ");
   EXPECT_EQ(run("role holders Clerk").document["holders"].size(), 2U);
   EXPECT_EQ(run("job list --user ann").document["jobs"].size(), 2U) << "nothing is taken away";
+
+  execute("update departments set deptNo='D1' where deptNo='d1'");
+  write("ann,clerk,d1\nbob,CLERK,d1\nbob,Chief,d1\nbob,chief,d1\n");
+  EXPECT_EQ(import(), "d0030 u0020 r1010 j1010 h1030 ") << "the database ignores the case";
 }
 
 TEST_F(Program, RolesAreSetInDepartmentsAndHeldThere) {
