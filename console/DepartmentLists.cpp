@@ -45,21 +45,30 @@ Answer list(const Console& console, const Options& options) {
 class Tree {
  public:
   explicit Tree(const Departments& departments) {
-    for (const auto& department : departments) numbers_[department->InnerId()] = department;
+    for (const auto& department : departments) undrawn_[department->InnerId()] = department->Id();
     for (const auto& department : departments) {
-      const bool isTop = numbers_.count(department->superInnerId()) == 0;
+      const bool isTop = undrawn_.count(department->superInnerId()) == 0;
       (isTop ? tops_ : below_[department->superInnerId()]).push_back(department);
     }
     for (auto& [superior, children] : below_) sort(children);
   }
 
-  Answer answer() const {
+  Answer answer() {
     Answer result;
-    result.document = {{"tree", Json::array()}};
+    result.document = {{"tree", Json::array()}, {"onNoTop", Json::array()}};
+    const std::size_t all = undrawn_.size();
     for (const auto& top : tops_) {
       result.text += label(*top) + "\n";
       result.document["tree"].push_back(draw(*top, "", result.text));
     }
+    result.text += "\n" + counted(all - undrawn_.size(), "department") + "; * marks an organisation.\n";
+    if (undrawn_.empty()) return result;
+    result.text += counted(undrawn_.size(), "more department") + " on no top, in a ring or below one:";
+    for (const auto& [id, number] : undrawn_) {
+      result.text += " " + number;
+      result.document["onNoTop"].push_back(number);
+    }
+    result.text += "\n";
     return result;
   }
 
@@ -74,7 +83,8 @@ class Tree {
     return department.Name() + (department.isOrg() ? " *" : "") + "  (" + department.Id() + ")";
   }
 
-  Json draw(const Department& department, const String& indent, String& text) const {
+  Json draw(const Department& department, const String& indent, String& text) {
+    undrawn_.erase(department.InnerId());
     Json node{{"number", department.Id()}, {"name", department.Name()}, {"isOrganisation", department.isOrg()}};
     Json& below = node["below"] = Json::array();
     const auto children = below_.find(department.InnerId());
@@ -87,7 +97,7 @@ class Tree {
     return node;
   }
 
-  std::map<Long, std::shared_ptr<Department>> numbers_;
+  std::map<Long, String> undrawn_;  // numbers by inner id
   std::map<Long, Children> below_;
   Children tops_;
 };
@@ -95,10 +105,7 @@ class Tree {
 Answer tree(const Console& console, const Options& options) {
   Departments departments;
   read(console, options, departments);
-  Answer answer = Tree(departments).answer();
-  answer.text +=
-      "\n" + counted(static_cast<std::size_t>(departments.Count()), "department") + "; * marks an organisation.\n";
-  return answer;
+  return Tree(departments).answer();
 }
 
 }  // namespace

@@ -35,10 +35,18 @@ Answer saved(const Console& console, const String& number, const String& sentenc
   return answer;
 }
 
-Answer add(const Console& console, const Options& options) {
+void requireNew(const Console& console, const String& number) {
   Department department;
   console.connect(department);
-  if (department.GetOne(1, options.number)) throw Refusal("Department " + options.number + " exists already.");
+  if (department.GetOne(1, number)) throw Refusal("Department " + number + " exists already.");
+  // Any other failure tells nothing of whether it exists.
+  require(department.errNumber() == messageNumber(1001), department);
+}
+
+Answer add(const Console& console, const Options& options) {
+  requireNew(console, options.number);
+  Department department;
+  console.connect(department);
   department.Id(options.number);
   department.Name(options.name);
   department.Super(options.superior);
@@ -50,9 +58,16 @@ Answer add(const Console& console, const Options& options) {
 
 Answer rename(const Console& console, const Options& options) {
   Department department = departmentOf(console, options.number);
+  if (department.Id() == "_root")
+    throw Refusal("_root bears the company's name; \"settings set --name\" changes both.");
   department.Name(options.name);
   require(department.Save(), department);
   return saved(console, options.number, "The department is renamed, with the full names of all below it.");
+}
+
+void refuseTop(const Department& department) {
+  if (department.Id() == "_root" || department.Id() == "_out")
+    throw Refusal("The department " + department.Id() + " belongs to the system.");
 }
 
 // The library moves a department below itself when asked to, which would cut the branch off the tree.
@@ -63,6 +78,7 @@ void refuseRing(const Department& department, const Department& superior) {
 
 Answer move(const Console& console, const Options& options) {
   Department department = departmentOf(console, options.number);
+  refuseTop(department);
   refuseRing(department, departmentOf(console, options.superior));
   department.Super(options.superior);
   require(department.Save(), department);
@@ -70,8 +86,8 @@ Answer move(const Console& console, const Options& options) {
 }
 
 Answer remove(const Console& console, const String& number) {
-  if (number == "_root" || number == "_out") throw Refusal("The department " + number + " belongs to the system.");
   Department department = departmentOf(console, number);
+  refuseTop(department);
   require(department.Delete(), department);
   return {"Department " + number + " is removed, with its jobs.\n", {{"removed", number}}};
 }

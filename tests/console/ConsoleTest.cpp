@@ -153,12 +153,17 @@ TEST_F(Program, DepartmentsMoveWithTheirBranchButNeverBelowThemselves) {
   run("dept add c C --organisation");
   EXPECT_EQ(run("dept move a b").exitCode, 1);
   EXPECT_EQ(run("dept move a a").exitCode, 1);
+  EXPECT_EQ(run("dept move _OUT _root").exitCode, 1);
+  EXPECT_EQ(run("dept rename _root Acme").exitCode, 1) << "the company's name is a setting";
   EXPECT_EQ(run("dept move a c").exitCode, 0);
   EXPECT_EQ(run("dept show b").document["fullName"], "C-A-B");
   EXPECT_EQ(run("dept show b").document["organisation"], "c");
   EXPECT_EQ(run("dept rename c See").document["fullName"], "See");
   EXPECT_EQ(run("dept show b").document["fullName"], "See-A-B");
   EXPECT_EQ(run("dept add a Again").exitCode, 1);
+  execute("update departments set path=null where deptNo='c'");
+  EXPECT_EQ(run("dept add c Again").error(), "94") << "it can't be read, and is there";
+  EXPECT_EQ(value("select deptName from departments where deptNo='c'"), "See");
   EXPECT_EQ(run("dept remove a").error(), "0x800403EC");
   EXPECT_EQ(run("dept remove _out").exitCode, 1);
   EXPECT_EQ(run("dept remove b").exitCode, 0);
@@ -256,6 +261,9 @@ TEST_F(Program, TheTreeIsDrawnWithEachBranchUnderItsSuperior) {
       String(buffer, read),
       "Company *  (_root)\n├── A  (a)\n└── B *  (b)\n    └── C  (c)\n\n4 departments; * marks an organisation.\n");
   EXPECT_EQ(run("dept list --by-level").document["departments"][3]["number"], "c");
+  execute("update departments set superDept=" + value("select deptId from departments where deptNo='c'") +
+          " where deptNo='b'");
+  EXPECT_EQ(run("dept tree").document["onNoTop"], Json::array({"b", "c"}));
 }
 
 TEST_F(Program, DoctorTellsWhatASignOnWouldPassOver) {
