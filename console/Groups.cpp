@@ -1,6 +1,5 @@
 #include <memory>
 
-#include "QVSa/organisation/Users.h"
 #include "QVSa/organisation/userGroups.h"
 #include "console/Commands.h"
 #include "console/Lookup.h"
@@ -32,11 +31,11 @@ Answer show(const Console& console, const String& name) {
   userGroup group = groupOf(console, name);
   String roles;
   require(group.GetRoles(roles), group);
-  Users members;
-  console.connect(members);
-  require(members.GetAll("", 0, false, group.Id()), members);
   Table table({{"Login", "login"}, {"Name", "name"}, {"Department", "department"}});
-  for (const auto& user : members) table.row({user->Login(), user->Name(), user->deptFullName()});
+  for (const String& id : memberIds(group)) {
+    const User user = userWithId(console, id);
+    table.row({user.Login(), user.Name(), user.deptFullName()});
+  }
   Sheet sheet;
   sheet.line("Name", "name", group.Name()).line("Id", "id", group.Id());
   sheet.line("Description", "description", group.description()).line("Roles", "roles", roles);
@@ -60,8 +59,12 @@ Answer set(const Console& console, const Options& options) {
   std::vector<String> ids;
   for (const String& login : options.members) ids.push_back(text(userOf(console, login).Id()));
   for (const String& role : options.roles) roleOf(console, role);
-  if (options.clearsMembers || !ids.empty()) require(group.SetUsers(join(ids, ",")), group);
-  if (options.clearsRoles || !options.roles.empty()) require(group.SetRoles(join(options.roles, ",")), group);
+  const bool setsMembers = options.clearsMembers || !ids.empty();
+  const bool setsRoles = options.clearsRoles || !options.roles.empty();
+  if (setsMembers) require(group.SetUsers(join(ids, ",")), group);
+  if (setsRoles && !group.SetRoles(join(options.roles, ",")))
+    throw Refusal((setsMembers ? "The members are set, the roles are not: " : "") + group.errDescription(),
+                  group.errNumber());
   return show(console, options.name);
 }
 

@@ -4,6 +4,7 @@
 
 #include "QVSa/organisation/Jobs.h"
 #include "QVSa/organisation/userGroups.h"
+#include "console/Lookup.h"
 
 namespace QVSa::console {
 
@@ -23,17 +24,6 @@ String jobsOf(const Console& console, Long userId) {
   return join(ids, ",");
 }
 
-// The ids of <users><user id="12" .../>...</users>. No value holds a "<", so that the beginning of an element is plain.
-std::vector<String> idsIn(const String& xml) {
-  const String mark = "<user id=\"";
-  std::vector<String> ids;
-  for (std::size_t place = xml.find(mark); place != String::npos; place = xml.find(mark, place + 1)) {
-    const std::size_t start = place + mark.size();
-    ids.push_back(xml.substr(start, xml.find('"', start) - start));
-  }
-  return ids;
-}
-
 std::vector<Membership> membershipsOf(const Console& console, const User& user) {
   if (user.grpName().empty()) return {};
   userGroups groups;
@@ -41,8 +31,7 @@ std::vector<Membership> membershipsOf(const Console& console, const User& user) 
   require(groups.GetAll(), groups);
   std::vector<Membership> result;
   for (const auto& group : groups) {
-    std::vector<String> members = idsIn(group->GetUsers());
-    require(group->errNumber() == 0, *group);
+    std::vector<String> members = memberIds(*group);
     if (std::find(members.begin(), members.end(), text(user.Id())) != members.end())
       result.push_back({group, std::move(members)});
   }

@@ -64,20 +64,30 @@ String userName(const Console& console, Long id) {
   return user.GetOne(1, id) ? user.Name() : "";
 }
 
+// Two of one name can't be listed. What the command did before is done all the same, so that this is a note.
+void addSubordinates(Answer& answer, User& user) {
+  const auto subordinates = user.getSubUsers();
+  if (!subordinates) {
+    answer.text += "\n" + user.errDescription() + "\n";
+    answer.document["note"] = user.errDescription();
+    return;
+  }
+  Table table({{"Subordinates", "login"}, {"", "name"}});
+  for (const auto& subordinate : *subordinates) table.row({subordinate->Login(), subordinate->Name()});
+  if (table.size() != 0) answer.text += "\n" + table.text();
+  answer.document["subordinates"] = table.document();
+}
+
 Answer showManager(const Console& console, User& user) {
   Integer flag = byNobody;
   Long jobId = 0, userId = 0;
   require(user.getManager(flag, jobId, userId), user);
-  const auto subordinates = user.getSubUsers();
-  require(subordinates != nullptr, user);
   Sheet sheet;
   sheet.line("User", "user", user.Name());
   sheet.line("Supervising job", "job", flag == byJob ? Json(jobName(console, jobId)) : Json());
   sheet.line("Supervisor", "supervisor", flag == byUser ? Json(userName(console, userId)) : Json());
-  Table table({{"Subordinates", "login"}, {"", "name"}});
-  for (const auto& subordinate : *subordinates) table.row({subordinate->Login(), subordinate->Name()});
-  Answer answer{sheet.text() + (table.size() == 0 ? "" : "\n" + table.text()), sheet.document()};
-  answer.document["subordinates"] = table.document();
+  Answer answer{sheet.text(), sheet.document()};
+  addSubordinates(answer, user);
   return answer;
 }
 

@@ -245,6 +245,23 @@ TEST_F(Program, SupervisorsAreSetByJobOrByUser) {
   EXPECT_EQ(run("user list --role Administrators").document["users"][0]["login"], "Admin");
 }
 
+TEST_F(Program, WhatWasDoneIsToldAlsoWhereTwoBearOneName) {
+  addAnn();
+  run("user add ann2 'Ann A'", "Ann-pass-1\n");
+  run("group add Twins");
+  EXPECT_EQ(run("group set Twins --members ann,ann2").document["members"].size(), 2U);
+  run("user manager ann --user Admin");
+  run("user manager ann2 --user Admin");
+  const Outcome set = run("user manager Admin --job 1");
+  EXPECT_EQ(set.exitCode, 0);
+  EXPECT_EQ(set.document["job"], "Company--Administrators");
+  EXPECT_EQ(set.document["note"].get<String>().substr(0, 38), "Error in listing user's subordinates.T");
+
+  execute("drop table grpRole");
+  const Json refused = run("group set Twins --members ann --roles Administrators").document["error"];
+  EXPECT_EQ(refused["description"].get<String>().substr(0, 39), "The members are set, the roles are not:");
+}
+
 TEST_F(Program, TheTreeIsDrawnWithEachBranchUnderItsSuperior) {
   run("dept add b B --organisation");
   run("dept add c C --under b");
