@@ -1,6 +1,7 @@
 #include "QVSa/organisation/Jobs.h"
 
 #include <memory>
+#include <optional>
 
 #include "QVSa/organisation/Departments.h"
 #include "console/Commands.h"
@@ -12,22 +13,22 @@ namespace QVSa::console {
 namespace {
 
 struct Options {
-  String department;
+  std::optional<String> department;
   bool below = false;
-  String role;
-  String login;
+  std::optional<String> role;
+  std::optional<String> login;
   std::vector<Long> jobs;
 };
 
 Answer list(const Console& console, const Options& options) {
-  const Long userId = options.login.empty() ? 0 : userOf(console, options.login).Id();
+  const Department department = options.department ? departmentOf(console, *options.department) : Department();
+  const Role role = options.role ? roleOf(console, *options.role) : Role();
+  const Long userId = options.login ? userOf(console, *options.login).Id() : 0;
   Jobs jobs;
   console.connect(jobs);
-  if (options.below) {
-    require(jobs.GetAllOfDept(departmentOf(console, options.department).InnerId(), options.role, userId), jobs);
-  } else {
-    require(jobs.GetAll(options.department, options.role, userId), jobs);
-  }
+  require(options.below ? jobs.GetAllOfDept(department.InnerId(), role.Name(), userId)
+                        : jobs.GetAll(department.Id(), role.Name(), userId),
+          jobs);
   Table table({{"Job", "job"}, {"Name", "name"}, {"Department", "department"}, {"Role", "role"}});
   for (const auto& job : jobs) table.row({job->Id(), job->Name(), job->deptId(), job->roleName()});
   return {table.text() + "\n" + counted(table.size(), "job") + ".\n", {{"jobs", table.document()}}};

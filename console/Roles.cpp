@@ -80,6 +80,7 @@ Answer hold(const Console& console, const Options& options, bool gives) {
 
 Answer holders(const Console& console, const Options& options) {
   Role role = roleOf(console, options.role);
+  if (!options.department.empty()) departmentOf(console, options.department);
   constexpr Boolean builtInToo = false;
   const auto users = role.GetUsers(true, builtInToo, options.department);
   require(users != nullptr, role);

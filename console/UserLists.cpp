@@ -1,4 +1,5 @@
 #include <memory>
+#include <optional>
 
 #include "QVSa/organisation/Jobs.h"
 #include "QVSa/organisation/Users.h"
@@ -11,14 +12,14 @@ namespace QVSa::console {
 namespace {
 
 struct Options {
-  String department;
+  std::optional<String> department;
   bool below = false;
-  String role;
-  String group;
+  std::optional<String> role;
+  std::optional<String> group;
   bool withoutBuiltIn = false;
   String login;
-  Long job = 0;
-  String supervisor;
+  std::optional<Long> job;
+  std::optional<String> supervisor;
   bool none = false;
 };
 
@@ -26,23 +27,24 @@ constexpr Integer byNobody = 0;
 constexpr Integer byJob = 1;
 constexpr Integer byUser = 2;
 
-Answer listSubtree(const Console& console, const Options& options) {
+Answer listSubtree(const Console& console, const Department& top, const std::optional<Role>& role) {
   Users users;
   console.connect(users);
-  const Long top = departmentOf(console, options.department).InnerId();
-  require(options.role.empty() ? users.GetAllOfTheDept(top) : users.GetAllOfTheDeptAndRole(top, options.role), users);
+  require(role ? users.GetAllOfTheDeptAndRole(top.InnerId(), role->Name()) : users.GetAllOfTheDept(top.InnerId()),
+          users);
   Table table({{"Id", "id"}, {"Name", "name"}, {"Department", "department"}});
   for (const auto& user : users) table.row({user->Id(), user->Name(), user->deptFullName()});
   return {table.text() + "\n" + counted(table.size(), "user") + ".\n", {{"users", table.document()}}};
 }
 
 Answer list(const Console& console, const Options& options) {
-  if (options.below) return listSubtree(console, options);
+  const Department department = options.department ? departmentOf(console, *options.department) : Department();
+  const std::optional<Role> role = options.role ? std::optional(roleOf(console, *options.role)) : std::nullopt;
+  if (options.below) return listSubtree(console, department, role);
   Users users;
   console.connect(users);
-  const Long roleId = options.role.empty() ? 0 : roleOf(console, options.role).Id();
-  const Long groupId = options.group.empty() ? -1 : groupOf(console, options.group).Id();
-  require(users.GetAll(options.department, roleId, options.withoutBuiltIn, groupId), users);
+  const Long groupId = options.group ? groupOf(console, *options.group).Id() : -1;
+  require(users.GetAll(department.Id(), role ? role->Id() : 0, options.withoutBuiltIn, groupId), users);
   Table table(
       {{"Login", "login"}, {"Name", "name"}, {"Department", "department"}, {"Groups", "groups"}, {"Locked", "locked"}});
   for (const auto& user : users)
@@ -93,11 +95,11 @@ Answer showManager(const Console& console, User& user) {
 
 Answer manager(const Console& console, const Options& options) {
   User user = userOf(console, options.login);
-  if (options.job != 0) {
-    if (jobName(console, options.job).empty()) throw Refusal("There is no job " + text(options.job) + ".");
-    require(user.setManager(byJob, options.job), user);
-  } else if (!options.supervisor.empty()) {
-    require(user.setManager(byUser, 0, userOf(console, options.supervisor).Id()), user);
+  if (options.job) {
+    if (jobName(console, *options.job).empty()) throw Refusal("There is no job " + text(*options.job) + ".");
+    require(user.setManager(byJob, *options.job), user);
+  } else if (options.supervisor) {
+    require(user.setManager(byUser, 0, userOf(console, *options.supervisor).Id()), user);
   } else if (options.none) {
     require(user.setManager(byNobody), user);
   }

@@ -216,6 +216,9 @@ TEST_F(Program, RolesAreSetInDepartmentsAndHeldThere) {
   EXPECT_EQ(run("role add Clerk --description 'Does it'").exitCode, 0);
   EXPECT_EQ(run("role add clerk").error(), "0x800404B9");
   EXPECT_EQ(run("role give Clerk ann b").error(), "0x800404BA");
+  for (const char* nothing : {"job list --dept x", "job list --role x", "user list --dept x", "user list --dept ''",
+                              "user list --dept a --below --role x", "role holders Clerk --dept x"})
+    EXPECT_EQ(run(nothing).exitCode, 1) << nothing;
   EXPECT_EQ(run("role set Clerk --in a,b").document["jobs"].size(), 2U);
   EXPECT_EQ(run("role give Clerk ann b").exitCode, 0);
   EXPECT_EQ(run("role holders Clerk").document["holders"][0]["login"], "ann");
@@ -241,7 +244,8 @@ TEST_F(Program, SupervisorsAreSetByJobOrByUser) {
   EXPECT_EQ(run("user manager bob --user ann").document["supervisor"], "Ann A");
   EXPECT_EQ(run("user manager Admin").document["subordinates"].size(), 0U);
   EXPECT_TRUE(run("user manager bob --none").document["supervisor"].is_null());
-  EXPECT_EQ(run("user manager bob --job 99").exitCode, 1);
+  for (const char* nobody : {"--job 99", "--job 0", "--user ''"})
+    EXPECT_EQ(run(String("user manager bob ") + nobody).exitCode, 1) << nobody;
   EXPECT_EQ(run("user list --role Administrators").document["users"][0]["login"], "Admin");
 }
 
