@@ -7,6 +7,7 @@
 
 #include "QVSa/QVSa.h"
 #include "QVSa/frame/ConnectionString.h"
+#include "examples/Steps.h"
 
 namespace {
 
@@ -20,9 +21,9 @@ const String database = "QVApp";
 
 String counted(std::size_t count, const String& noun) { return std::to_string(count) + " " + noun; }
 
-class Walk {
+class Walk : private Steps {
  public:
-  Walk(String server, String login) : server_(std::move(server)), login_(std::move(login)) {}
+  Walk(String server, String login) : Steps(std::move(server)), login_(std::move(login)) {}
 
   int walk() {
     meet();
@@ -31,25 +32,10 @@ class Walk {
     showCandidates();
     showReach();
     showChain();
-    std::printf("\n%s\n", asExpected_ ? "The walk was gone to its end." : "NOT EVERY STEP WENT AS IT SHOULD.");
-    return asExpected_ ? 0 : 1;
+    return finish("The walk was gone to its end.");
   }
 
  private:
-  void title(const char* text) { std::printf("\n%2d  %s\n", ++step_, text); }
-
-  void line(const String& call, const String& returned, bool expected) {
-    asExpected_ = asExpected_ && expected;
-    std::printf("      %-58s %s%s\n", call.c_str(), returned.c_str(), expected ? "" : "   <- unexpected");
-  }
-
-  template <class Object>
-  Object connected() {
-    Object object;
-    if (!object.connect(server_, database)) line("connect", object.errDescription(), false);
-    return object;
-  }
-
   template <class List, class Describe>
   void list(const String& call, bool done, const List& items, const String& noun, Describe describe) {
     const auto count = static_cast<std::size_t>(items.Count());
@@ -156,26 +142,12 @@ class Walk {
          [](const QVSa::Department& department) { return department.fullName(); });
   }
 
-  String server_;
   String login_;
   QVSa::User user_;
   QVSa::Jobs jobs_;
   QVSa::Role role_;
-  int step_ = 0;
-  bool asExpected_ = true;
 };
 
 }  // namespace
 
-int main(int argc, char** argv) {
-  if (argc != 3) {
-    std::fprintf(stderr, "usage: organisation_walk SERVER LOGIN\n");
-    return 2;
-  }
-  try {
-    return Walk(argv[1], argv[2]).walk();
-  } catch (const std::exception& error) {
-    std::fprintf(stderr, "organisation_walk: %s\n", error.what());
-    return 1;
-  }
-}
+int main(int argc, char** argv) { return walkAs<Walk>("organisation_walk", argc, argv); }

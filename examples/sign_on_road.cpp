@@ -11,6 +11,7 @@
 #include "QVSa/identity/safeRule.h"
 #include "QVSa/numbering/IdMgr.h"
 #include "QVSa/organisation/Department.h"
+#include "examples/Steps.h"
 
 namespace {
 
@@ -19,13 +20,12 @@ using QVSa::String;
 
 constexpr QVSa::Integer byLogin = 3;
 constexpr QVSa::Integer byNumber = 1;
-const String database = "QVApp";
 
 String quoted(const String& text) { return "\"" + text + "\""; }
 
-class Road {
+class Road : private Steps {
  public:
-  Road(String server, String login) : server_(std::move(server)), login_(std::move(login)) {
+  Road(String server, String login) : Steps(std::move(server)), login_(std::move(login)) {
     password_ = "Road-2-" + std::to_string(std::time(nullptr));
   }
 
@@ -42,18 +42,10 @@ class Road {
     end(first);
     issueAgain(number);
     renameDepartment();
-    std::printf("\n%s\n", asExpected_ ? "The road was walked to its end." : "NOT EVERY STEP WENT AS IT SHOULD.");
-    return asExpected_ ? 0 : 1;
+    return finish("The road was walked to its end.");
   }
 
  private:
-  void title(const char* text) { std::printf("\n%2d  %s\n", ++step_, text); }
-
-  void line(const String& call, const String& returned, bool expected) {
-    asExpected_ = asExpected_ && expected;
-    std::printf("      %-58s %s%s\n", call.c_str(), returned.c_str(), expected ? "" : "   <- unexpected");
-  }
-
   template <class Object>
   void show(const String& call, Boolean result, Boolean expected, const Object& object) {
     String returned = result ? "True" : "False";
@@ -63,13 +55,6 @@ class Road {
       returned += "  " + String(number) + "  " + object.errDescription();
     }
     line(call, returned, result == expected);
-  }
-
-  template <class Object>
-  Object connected() {
-    Object object;
-    if (!object.connect(server_, database)) line("connect", object.errDescription(), false);
-    return object;
   }
 
   QVSa::User loaded() {
@@ -219,24 +204,10 @@ class Road {
     line("its path, as before", after.fullId(), after.fullId() == home.fullId());
   }
 
-  String server_;
   String login_;
   String password_;
-  int step_ = 0;
-  bool asExpected_ = true;
 };
 
 }  // namespace
 
-int main(int argc, char** argv) {
-  if (argc != 3) {
-    std::fprintf(stderr, "usage: sign_on_road SERVER LOGIN\n");
-    return 2;
-  }
-  try {
-    return Road(argv[1], argv[2]).walk();
-  } catch (const std::exception& error) {
-    std::fprintf(stderr, "sign_on_road: %s\n", error.what());
-    return 1;
-  }
-}
+int main(int argc, char** argv) { return walkAs<Road>("sign_on_road", argc, argv); }
