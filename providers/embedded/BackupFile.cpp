@@ -1,6 +1,7 @@
 #include "providers/embedded/BackupFile.h"
 
 #include <cerrno>
+#include <charconv>
 #include <sys/stat.h>
 #include <system_error>
 #include <unistd.h>
@@ -18,6 +19,13 @@ using tsql::sqlFailure;
 
 constexpr int stepsBetweenLooks = 1000;
 constexpr const char* pageSize = "4096";
+
+// 0 for a text that is no whole number.
+int wholeNumber(const std::string& text) {
+  int number = 0;
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+  return error == std::errc() && end == text.data() + text.size() ? number : 0;
+}
 
 }  // namespace
 
@@ -54,24 +62,30 @@ void BackupFile::open() {
 // A page of another size would need the file's own pages cut anew, which a restore in one step cannot do.
 void BackupFile::checkForm() {
   if (read("pragma application_id") != std::to_string(applicationId) || read("pragma page_size") != pageSize) refuse();
-  const std::string layout = read("select layout from engine");
-  if (layout.empty()) refuse();
-  if (std::stoi(layout) > layoutVersion)
-    throw sqlFailure(3169, "The database was backed up with layout " + layout + ". This program knows layouts up to " +
-                               std::to_string(layoutVersion) + "; a newer release has to restore it.");
+  const int layout = wholeNumber(read("select layout from engine"));
+  if (layout < 1) refuse();
+  if (layout > layoutVersion)
+    throw sqlFailure(3169, "The database was backed up with layout " + std::to_string(layout) +
+                               ". This program knows layouts up to " + std::to_string(layoutVersion) +
+                               "; a newer release has to restore it.");
+}
+
+bool BackupFile::isOf(std::size_t database) {
+  const int mark = wholeNumber(read("pragma user_version"));
+  return mark == 0 || mark == static_cast<int>(database) + 1;
 }
 
 void BackupFile::check() {
   if (read("pragma integrity_check(1)") != "ok") refuse();
 }
 
-// The first column of the first row; empty without one, and where the file cannot be read.
+// The first column of the first row; empty without one, for NULL, and where the file cannot be read.
 std::string BackupFile::read(const std::string& query) {
   sqlite3_stmt* statement = nullptr;
   int code = sqlite3_prepare_v2(handle_, query.c_str(), -1, &statement, nullptr);
   if (code == SQLITE_OK) code = sqlite3_step(statement);
-  std::string result;
-  if (code == SQLITE_ROW) result = reinterpret_cast<const char*>(sqlite3_column_text(statement, 0));
+  const unsigned char* const text = code == SQLITE_ROW ? sqlite3_column_text(statement, 0) : nullptr;
+  const std::string result = text == nullptr ? "" : reinterpret_cast<const char*>(text);
   sqlite3_finalize(statement);
   if (code == SQLITE_INTERRUPT) throw timeExpired();
   return result;

@@ -26,6 +26,8 @@ class BackupFile {
   BackupFile& operator=(const BackupFile&) = delete;
 
   sqlite3* get() const { return handle_; }
+  // Whether it is a copy of this database, as far as it says so.
+  bool isOf(std::size_t database);
   // Reads all of it. Throws 3241 for a damaged one, the time-out behind the deadline.
   void check();
 

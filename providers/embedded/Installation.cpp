@@ -116,7 +116,8 @@ void makeFile(const fs::path& path) {
   require(::fchmod(file.get(), fileMode) == 0);
 }
 
-void makeDatabase(const fs::path& folder, const std::string& database) {
+void makeDatabase(const fs::path& folder, std::size_t place) {
+  const std::string database = databaseNames[place];
   makeFile(lockFile(folder, database));
   makeFile(databaseFile(folder, database));
   sqlite3* handle = nullptr;
@@ -125,7 +126,7 @@ void makeDatabase(const fs::path& folder, const std::string& database) {
   const std::string text =
       "pragma page_size=4096; pragma auto_vacuum=none; pragma encoding='UTF-8';"
       "pragma application_id=" +
-      std::to_string(applicationId) +
+      std::to_string(applicationId) + "; pragma user_version=" + std::to_string(place + 1) +
       ";"
       "pragma journal_mode=wal;"
       "create table engine(layout integer not null, catalogue integer not null);"
@@ -145,7 +146,7 @@ void addLogin(Handle& handle, const std::string& name, const std::string& passwo
 }
 
 void fill(const fs::path& folder, const InstallationPlan& plan) {
-  for (const char* database : databaseNames) makeDatabase(folder, database);
+  for (std::size_t i = 0; i < databaseNames.size(); ++i) makeDatabase(folder, i);
   {
     const PooledHandle handle = acquireHandle(folder);
     for (std::size_t i = 0; i < databaseNames.size(); ++i) {

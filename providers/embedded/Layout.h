@@ -12,7 +12,8 @@ inline constexpr std::array<const char*, 4> databaseNames = {"master", "QVSys", 
 
 // The layout of the files that this build writes, and the mark that tells an installation's file from any other.
 // Each file holds engine(layout, catalogue), one row: its layout and a count of changed definitions; and gate(n),
-// empty, which is written to where the writer's place has to be taken and nothing else is to change.
+// empty, which is written to where the writer's place has to be taken and nothing else is to change. The library's
+// user_version says which database it is: its place above plus 1; 0 in a file that was made before this was written.
 inline constexpr int layoutVersion = 1;
 inline constexpr int applicationId = 0x51565361;
 

@@ -32,6 +32,9 @@ void emptyLog(Handle& target, std::size_t database) {
 
 void restoreCopy(const Handle& handle, std::size_t database, const String& path) {
   BackupFile copy(path, handle.deadline());
+  if (!copy.isOf(database))
+    throw tsql::sqlFailure(
+        3234, "The copy on device '" + path + "' is not one of database '" + databaseNames[database] + "'.");
   copy.check();
   Handle target(handle.folder());
   target.deadline(handle.deadline());

@@ -176,11 +176,16 @@ TEST_F(Administration, WhatIsNoBackupIsRefused) {
   sqlite3_close(foreign);
   EXPECT_EQ(native(*session, restoring("QVSys", "foreign")), 3241);
 
-  session->run({"backup database QVSys to disk='" + file("newer") + "' with init"});
-  ASSERT_EQ(sqlite3_open(file("newer").c_str(), &foreign), SQLITE_OK);
-  EXPECT_EQ(sqlite3_exec(foreign, "update engine set layout=layout+1", nullptr, nullptr, nullptr), SQLITE_OK);
-  sqlite3_close(foreign);
-  EXPECT_EQ(native(*session, restoring("QVSys", "newer")), 3169);
+  session->run({"backup database QVSys to disk='" + file("odd") + "' with init"});
+  EXPECT_EQ(native(*session, restoring("QVApp", "odd")), 3234) << "a copy of the other database";
+  for (const auto& [layout, refused] : {std::pair{"2", 3169}, {"0", 3241}, {"'x'", 3241}, {"null", 3241}}) {
+    ASSERT_EQ(sqlite3_open(file("odd").c_str(), &foreign), SQLITE_OK);
+    const std::string change =
+        std::string("drop table engine; create table engine(layout); insert into engine values(") + layout + ")";
+    EXPECT_EQ(sqlite3_exec(foreign, change.c_str(), nullptr, nullptr, nullptr), SQLITE_OK);
+    sqlite3_close(foreign);
+    EXPECT_EQ(native(*session, restoring("QVSys", "odd")), refused) << layout;
+  }
 }
 
 TEST_F(Administration, ABackupTakesTheOldFilesPlaceOnlyWhenItIsWhole) {
