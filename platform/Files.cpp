@@ -51,25 +51,11 @@ bool folderExists(const std::filesystem::path& file) {
   }
 }
 
-// The target is replaced and not opened, so its own permission has to be asked for.
-void requireWritable(const std::filesystem::path& target) {
-  struct stat state {};
-  if (::stat(target.c_str(), &state) != 0) return;
-  if (!S_ISREG(state.st_mode)) throw runtimeFailure(number::pathAccess);
-  if (::access(target.c_str(), W_OK) != 0) fail(target);
-}
-
 std::filesystem::path nameBeside(const std::filesystem::path& target) {
   std::random_device random;
   std::filesystem::path path = target;
   path += "." + std::to_string(random()) + std::to_string(random()) + ".new";
   return path;
-}
-
-// The file is in its place already: a file system that cannot sync a folder is no failure.
-void syncFolderOf(const std::filesystem::path& file) {
-  const Descriptor folder(file.has_parent_path() ? file.parent_path() : ".", O_RDONLY | O_DIRECTORY);
-  if (folder.isOpen()) ::fsync(folder.handle());
 }
 
 }  // namespace
@@ -106,8 +92,10 @@ void writeFile(const String& path, const Bytes& content) {
 }
 
 NewFile::NewFile(const String& path) : target_(localPath(path)), beside_(nameBeside(target_)) {
-  if (!target_.has_filename()) throw runtimeFailure(number::pathAccess);
-  requireWritable(target_);
+  if (const int reason = reasonAgainstReplacing(target_); reason != 0) {
+    errno = reason;
+    fail(target_);
+  }
   handle_ = ::open(beside_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666);
   if (handle_ < 0) fail(target_);
 }
@@ -130,7 +118,21 @@ void NewFile::write(std::string_view bytes) {
 void NewFile::keep() {
   if (::fsync(handle_) != 0 || ::rename(beside_.c_str(), target_.c_str()) != 0) fail(target_);
   ::close(std::exchange(handle_, -1));
-  syncFolderOf(target_);
+  if (!syncFolderOf(target_)) fail(target_);
+}
+
+int reasonAgainstReplacing(const std::filesystem::path& target) {
+  if (!target.has_filename()) return EINVAL;
+  struct stat state {};
+  if (::stat(target.c_str(), &state) != 0) return 0;
+  if (!S_ISREG(state.st_mode)) return S_ISDIR(state.st_mode) ? EISDIR : EINVAL;
+  return ::access(target.c_str(), W_OK) == 0 ? 0 : errno;
+}
+
+bool syncFolderOf(const std::filesystem::path& file) {
+  const Descriptor folder(file.has_parent_path() ? file.parent_path() : ".", O_RDONLY | O_DIRECTORY);
+  if (folder.isOpen() && ::fsync(folder.handle()) == 0) return true;
+  return errno == EINVAL || errno == ENOTSUP || errno == EACCES;
 }
 
 std::optional<Date> lastModified(const String& path) {

@@ -24,6 +24,13 @@ std::optional<Date> lastModified(const String& path);
 // Deletes the file; one that is not there is no failure. Throws as readFile does.
 void deleteFile(const String& path);
 
+// For who writes a file beside its target and renames it. Why a file of this name can't be replaced, as the system's
+// error number; 0 where it can. The target is replaced and not opened, so its own permission has to be asked for.
+int reasonAgainstReplacing(const std::filesystem::path& target);
+// Whether the name of a file is on the disk with it; true as well where the folder is none that can be synced, which is
+// no failure: the file is in its place already. False leaves the reason in errno.
+bool syncFolderOf(const std::filesystem::path& file);
+
 // A file that is written piece by piece beside its target and takes its place at the end: nobody ever sees a part of
 // it. A path without a file's name, and a target that is there and can't be written or is no plain file, are refused at
 // once.

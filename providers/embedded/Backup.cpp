@@ -1,8 +1,8 @@
 #include "providers/embedded/Backup.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <fcntl.h>
-#include <random>
 #include <sys/stat.h>
 #include <system_error>
 #include <unistd.h>
@@ -17,6 +17,8 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr mode_t fileMode = S_IRUSR | S_IWUSR | S_IRGRP | S_IWGRP;
+// Far behind the bytes that the storage library locks in the same file.
+constexpr off_t lockByte = off_t{1} << 62;
 
 Failure terminated(const std::string& reason) {
   return tsql::sqlFailure(3013, reason + " BACKUP DATABASE is terminating abnormally.");
@@ -26,50 +28,99 @@ Failure cannotWrite(const String& path) {
   return terminated("Write on '" + path + "' failed: " + std::generic_category().message(errno) + ".");
 }
 
-bool sync(const fs::path& path, int flags) {
-  const int file = ::open(path.c_str(), flags | O_CLOEXEC);
-  if (file < 0) return false;
-  const bool done = ::fsync(file) == 0;
-  const int reason = errno;
-  ::close(file);
-  errno = reason;
-  return done;
+// A file of a database, there or not: what lies in their folder and is named as they are.
+bool isOfInstallation(const fs::path& target, const fs::path& folder) {
+  std::error_code error;
+  if (!fs::equivalent(target.has_parent_path() ? target.parent_path() : ".", folder, error)) return false;
+  const std::string name = target.filename().string();
+  return std::ranges::any_of(databaseNames, [&](const std::string& database) {
+    return name.starts_with(database + ".db") || name == database + ".lock";
+  });
 }
 
-// A new empty file beside the target, which goes again unless it was moved to its place.
+class Descriptor {
+ public:
+  explicit Descriptor(int file) : file_(file) {}
+  ~Descriptor() {
+    if (file_ >= 0) ::close(file_);
+  }
+  Descriptor(const Descriptor&) = delete;
+  Descriptor& operator=(const Descriptor&) = delete;
+  int get() const { return file_; }
+
+ private:
+  int file_;
+};
+
+// The new content beside its target, which goes again unless it was moved to its place. Its name is always the same, so
+// that the next backup takes over what a killed one left; a lock tells that from one that is being written.
 class PassingFile {
  public:
-  explicit PassingFile(const String& path) : path_(path), target_(platform::localPath(path)), beside_(target_) {
-    std::random_device random;
-    beside_ += "." + std::to_string(random()) + ".new";
-    const int file = ::open(beside_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, fileMode);
-    if (file < 0) throw cannotOpenDevice(path, errno);
-    ::close(file);
+  PassingFile(const String& path, const fs::path& installation)
+      : path_(path),
+        target_(platform::localPath(path)),
+        beside_(target_.string() + ".new"),
+        file_(openBeside(installation)) {
+    if (const int reason = reasonAgainstTaking(); reason != 0) throw cannotOpenDevice(path_, reason);
+    discard(journal());
+    if (::ftruncate(file_.get(), 0) != 0) throw cannotWrite(path_);
   }
-  ~PassingFile() { ::unlink(beside_.c_str()); }
+  ~PassingFile() {
+    // Once it was moved, another backup's file may bear the name.
+    if (moved_) return;
+    discard(journal());
+    discard(beside_);
+  }
   PassingFile(const PassingFile&) = delete;
   PassingFile& operator=(const PassingFile&) = delete;
 
-  std::string name() const { return beside_.string(); }
+  const std::string& name() const { return beside_; }
 
   void moveToTarget() {
-    if (!sync(beside_, O_RDONLY)) throw cannotWrite(path_);
+    if (::fsync(file_.get()) != 0) throw cannotWrite(path_);
     if (::rename(beside_.c_str(), target_.c_str()) != 0) throw cannotOpenDevice(path_, errno);
-    const fs::path folder = target_.has_parent_path() ? target_.parent_path() : fs::path(".");
-    if (!sync(folder, O_RDONLY | O_DIRECTORY)) throw cannotWrite(path_);
+    moved_ = true;
+    if (!platform::syncFolderOf(target_)) throw cannotWrite(path_);
   }
 
  private:
+  int openBeside(const fs::path& installation) const {
+    const int reason = isOfInstallation(target_, installation) ? EBUSY : platform::reasonAgainstReplacing(target_);
+    if (reason != 0) throw cannotOpenDevice(path_, reason);
+    const int file = ::open(beside_.c_str(), O_RDWR | O_CREAT | O_NOFOLLOW | O_CLOEXEC, fileMode);
+    if (file < 0) throw cannotOpenDevice(path_, errno);
+    return file;
+  }
+
+  // Its holder may have moved or removed it between the opening and the lock: the name has to mean this file still.
+  int reasonAgainstTaking() const {
+    struct flock lock {};
+    lock.l_type = F_WRLCK;
+    lock.l_whence = SEEK_SET;
+    lock.l_start = lockByte;
+    lock.l_len = 1;
+    if (::fcntl(file_.get(), F_OFD_SETLK, &lock) != 0) return errno;
+    struct stat mine {
+    }, named{};
+    if (::fstat(file_.get(), &mine) != 0 || ::lstat(beside_.c_str(), &named) != 0) return errno;
+    return mine.st_dev == named.st_dev && mine.st_ino == named.st_ino ? 0 : EBUSY;
+  }
+
+  std::string journal() const { return beside_ + "-journal"; }
+  static void discard(const std::string& file) { ::unlink(file.c_str()); }
+
   String path_;
   fs::path target_;
-  fs::path beside_;
+  std::string beside_;
+  Descriptor file_;  // open until the end: its lock is what keeps others away
+  bool moved_ = false;
 };
 
 }  // namespace
 
 // On a handle of its own: the session's may have row sets or a transaction open, in which the library makes no copy.
 void backUp(const Handle& handle, std::size_t database, const String& path) {
-  PassingFile file(path);
+  PassingFile file(path, handle.folder());
   Handle source(handle.folder());
   source.deadline(handle.deadline());
   try {

@@ -1,7 +1,11 @@
+#include <fcntl.h>
 #include <filesystem>
+#include <fstream>
 #include <gtest/gtest.h>
 #include <optional>
+#include <sys/stat.h>
 #include <thread>
+#include <unistd.h>
 
 #include "QVSa/frame/ConnectionString.h"
 #include "providers/embedded/CatalogueMark.h"
@@ -190,15 +194,30 @@ TEST_F(Administration, WhatIsNoBackupIsRefused) {
 
 TEST_F(Administration, ABackupTakesTheOldFilesPlaceOnlyWhenItIsWhole) {
   auto session = open("master");
-  const std::string backup = "backup database QVSys to disk='" + file("a") + "' with init";
+  const auto backingUp = [](const std::string& path) {
+    return "backup database QVSys to disk='" + path + "' with init";
+  };
+  const std::string backup = backingUp(file("a"));
+  // What a killed one left is taken over, but not from one that is at it.
+  for (const char* left : {"a.new", "a.new-journal"}) std::ofstream(file(left)) << "left";
+  const int other = ::open(file("a.new").c_str(), O_RDWR | O_CLOEXEC);
+  struct flock whole {};
+  whole.l_type = F_WRLCK;
+  EXPECT_EQ(::fcntl(other, F_OFD_SETLK, &whole), 0);
+  EXPECT_EQ(native(*session, backup), 3201);
+  ::close(other);
   session->run({backup});
   session->run({"restore verifyonly from disk='" + file("a") + "'"});
   session->run({"create table QVSys..t (n int null)"});
   session->run({backup});
   EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder_.path()), {}), 1) << "nothing is left beside it";
   std::filesystem::create_directories(file("taken") + "/inside");
-  EXPECT_EQ(native(*session, "backup database QVSys to disk='" + file("taken") + "' with init"), 3201);
-  EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder_.path()), {}), 2) << "a failed one is gone";
+  EXPECT_EQ(::mkfifo(file("pipe").c_str(), 0600), 0);
+  for (const char* name : {"taken", "pipe"}) EXPECT_EQ(native(*session, backingUp(file(name))), 3201) << name;
+  EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder_.path()), {}), 3) << "a failed one is gone";
+  for (const char* own : {"QVSys.db", "QVApp.db-wal", "master.db-journal", "QVSys.lock"})
+    EXPECT_EQ(native(*session, backingUp((installation_.folder() / own).string())), 3201) << own;
+  EXPECT_EQ(native(*session, "insert into QVSys..t(n) values(1)"), 0);
 }
 
 }  // namespace QVSa::test

@@ -1,4 +1,5 @@
 #include <chrono>
+#include <filesystem>
 #include <thread>
 
 #include "tests/processes/Worker.h"
@@ -11,7 +12,7 @@ using std::chrono::steady_clock;
 
 class BackupsAmongProcesses : public Scene {
  protected:
-  static constexpr const char* password = "test-admin";
+  static constexpr const char* password = TestInstallation::administratorPassword;
 
   // Files of a pair with this name.
   String sys(const String& name) const { return (folder_.path() / (name + "-sys.bak")).string(); }
@@ -23,6 +24,11 @@ class BackupsAmongProcesses : public Scene {
     ASSERT_TRUE(manager_.RestoreDB(server(), sys(name), app(name), password)) << manager_.errDescription();
   }
   Worker restoring(const String& name) const { return Worker("restore", {server(), sys(name), app(name), password}); }
+  Worker backingUp(const String& name, const std::vector<std::string>& more = {}) const {
+    std::vector<std::string> words{server(), sys(name), app(name)};
+    words.insert(words.end(), more.begin(), more.end());
+    return Worker("back-up", words);
+  }
   // Both databases say the word in many rows.
   void say(const String& word) {
     for (const PlainSession* database : {&system_, &tables_}) {
@@ -88,6 +94,36 @@ TEST_F(BackupsAmongProcesses, KilledInTheMiddleOfARestoreLeaveTheOldDatabaseOrTh
     backUp("check");
   }
   EXPECT_GT(changed, 0) << "no kill came late enough";
+}
+
+TEST_F(BackupsAmongProcesses, KilledOrWithoutRoomLeaveTheOldFilesWhole) {
+  makeWords();
+  say("old");
+  backUp("x");
+  say("new");
+  const auto files = [&] { return std::distance(std::filesystem::directory_iterator(folder_.path()), {}); };
+  Worker full = backingUp("x", {"50000"});
+  full.go();
+  EXPECT_NE(full.line().find("BACKUP DATABASE is terminating abnormally."), String::npos);
+  EXPECT_EQ(files(), 2);
+  restore("x");
+  EXPECT_EQ(tables_.text("select distinct w from word"), "old");
+
+  Worker whole = backingUp("x");
+  const auto before = steady_clock::now();
+  whole.go();
+  ASSERT_EQ(whole.line(), "done");
+  const auto duration = steady_clock::now() - before;
+  constexpr int moments = 20;
+  for (int moment = 1; moment <= moments; ++moment) {
+    Worker worker = backingUp("x");
+    worker.go();
+    std::this_thread::sleep_for(duration * moment / moments);
+    worker.kill();
+    for (const String& file : {sys("x"), app("x")}) tables_.run("restore verifyonly from disk='" + file + "'");
+  }
+  backUp("x");
+  EXPECT_EQ(files(), 2) << "what the killed ones left is gone";
 }
 
 TEST_F(BackupsAmongProcesses, AreNotRestoredWhileAnotherProcessUsesTheDatabase) {

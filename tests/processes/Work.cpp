@@ -1,6 +1,8 @@
 #include "tests/processes/Work.h"
 
+#include <csignal>
 #include <iostream>
+#include <sys/resource.h>
 #include <unistd.h>
 
 #include "QVSa/QVSa.h"
@@ -97,6 +99,18 @@ void restore(const Words& words) {
   writeLine(done ? "done" : failureText(manager.errNumber(), manager.errDescription()));
 }
 
+void backUp(const Words& words) {
+  if (words.size() > 3) {
+    const rlim_t most = std::stoul(words.at(3));
+    const rlimit limit{most, most};
+    ::signal(SIGXFSZ, SIG_IGN);
+    ::setrlimit(RLIMIT_FSIZE, &limit);
+  }
+  DBMgr manager;
+  const bool done = manager.BackUpDB(words.at(0), words.at(1), words.at(2));
+  writeLine(done ? "done" : failureText(manager.errNumber(), manager.errDescription()));
+}
+
 void write(const Words& words) {
   for (int times = 1;; ++times) {
     try {
@@ -131,6 +145,7 @@ int doWork(const Words& words) {
   if (words.at(0) == "load-as-nobody") loadAsNobody(arguments);
   if (words.at(0) == "stay") stay(arguments);
   if (words.at(0) == "restore") restore(arguments);
+  if (words.at(0) == "back-up") backUp(arguments);
   if (words.at(0) == "write") write(arguments);
   return 0;
 }

@@ -17,6 +17,8 @@ namespace QVSa::test {
 //                                   hexadecimal and its text
 //   stay SERVER DATABASE            opens a connection to the database; "staying", and stays
 //   restore SERVER SYS APP PASSWORD restores the two files; "done", or the failure's number and text
+//   back-up SERVER SYS APP [SIZE]   backs up into the two files, on a disk that takes none above so many bytes; "done",
+//                                   or the failure's number and text
 //   write SERVER                    adds 1 to both rows of the table pair in one transaction, signs Ann on, and so on
 //                                   without end; "writing" after the first time, and a line for each failure
 // Gives the exit code.

@@ -11,8 +11,6 @@ namespace QVSa::test {
 
 namespace {
 
-constexpr const char* administratorPassword = "test-admin";
-
 std::filesystem::path newFolder() {
   const std::filesystem::path base =
       std::filesystem::is_directory("/dev/shm") ? "/dev/shm" : std::filesystem::temp_directory_path();
@@ -32,7 +30,7 @@ class Model : public TestFolder {
  public:
   explicit Model(TestInstallation::Content content) {
     embedded::createInstallation(
-        {path(), defaultDbPwd(), administratorPassword,
+        {path(), defaultDbPwd(), TestInstallation::administratorPassword,
          content == TestInstallation::Content::shipped ? shippedScripts() : std::vector<embedded::DatabaseScript>{}});
   }
 };

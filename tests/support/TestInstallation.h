@@ -9,6 +9,8 @@ namespace QVSa::test {
 // folder goes with the object. It lies on a memory-backed file system where there is one.
 class TestInstallation {
  public:
+  static constexpr const char* administratorPassword = "test-admin";  // of the log-in sa
+
   enum class Content { shipped, empty };
   explicit TestInstallation(Content content = Content::shipped);
   ~TestInstallation();
