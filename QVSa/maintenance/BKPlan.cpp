@@ -47,7 +47,8 @@ void BKPlan::read(Recordset& row) {
 }
 
 Boolean BKPlan::Save() {
-  return operation(prefixed(3115).onIntegrity(3116), [&]() -> Boolean {
+  const Long before = Id_;
+  const Boolean saved = operation(prefixed(3115).onIntegrity(3116), [&]() -> Boolean {
     const bool isNew = Id_ == 0;
     const String schDesc = schedule()->description();
     Connection connection = open();
@@ -64,24 +65,33 @@ Boolean BKPlan::Save() {
     connection.CommitTrans();
     return true;
   });
+  // The number that a new plan was given went with its rows.
+  if (!saved) Id_ = before;
+  return saved;
+}
+
+Statement BKPlan::taskSql(const String& statement, const String& schDesc) {
+  return sql(statement)
+      .number("id", Id_)
+      .text("name", Name_)
+      .number("cycle", schedule_->cycle())
+      .number("cycleNum", schedule_->cycleNum())
+      .text("wk", schedule_->wks())
+      .number("md", schedule_->monthDay())
+      .number("tod", schedule_->timesOneDay())
+      .date("startTime", schedule_->StartTime())
+      .number("interval", schedule_->interval())
+      .number("intervalUnit", schedule_->valUnit())
+      .text("schDesc", schDesc);
 }
 
 Boolean BKPlan::insertTask(Connection& connection, const String& schDesc) {
   connection.Execute(
-      sql("insert into tasks(taskName,taskType,cTime,schType,cycle,cycleNum,wk,md,tod,startTime,hInterval,"
-          "intervalUnit,schDesc)"
-          "values(<name>,2,getdate(),1,<cycle>,<cycleNum>,<wk>,<md>,<tod>,<startTime>,<interval>,<intervalUnit>,"
-          "<schDesc>)")
-          .text("name", Name_)
-          .number("cycle", schedule_->cycle())
-          .number("cycleNum", schedule_->cycleNum())
-          .text("wk", schedule_->wks())
-          .number("md", schedule_->monthDay())
-          .number("tod", schedule_->timesOneDay())
-          .date("startTime", schedule_->StartTime())
-          .number("interval", schedule_->interval())
-          .number("intervalUnit", schedule_->valUnit())
-          .text("schDesc", schDesc));
+      taskSql("insert into tasks(taskName,taskType,cTime,schType,cycle,cycleNum,wk,md,tod,startTime,hInterval,"
+              "intervalUnit,schDesc)"
+              "values(<name>,2,getdate(),1,<cycle>,<cycleNum>,<wk>,<md>,<tod>,<startTime>,<interval>,<intervalUnit>,"
+              "<schDesc>)",
+              schDesc));
   Recordset row = connection.Execute("select scope_identity()");
   if (row.EOF_()) return refuse(3101);
   Id_ = row[0].asLong();
@@ -95,25 +105,16 @@ Boolean BKPlan::insertTask(Connection& connection, const String& schDesc) {
 }
 
 void BKPlan::updateTask(Connection& connection, const String& schDesc) {
-  connection.Execute(sql("update tasks set "
-                         "taskName=<name>"
-                         ",cycle=<cycle>,cycleNum=<cycleNum>"
-                         ",wk=<wk>,md=<md>"
-                         ",tod=<tod>,startTime=<startTime>,hInterval=<interval>"
-                         ",intervalUnit=<intervalUnit>"
-                         ",schDesc=<schDesc>"
-                         " where taskId=<id>")
-                         .number("id", Id_)
-                         .text("name", Name_)
-                         .number("cycle", schedule_->cycle())
-                         .number("cycleNum", schedule_->cycleNum())
-                         .text("wk", schedule_->wks())
-                         .number("md", schedule_->monthDay())
-                         .number("tod", schedule_->timesOneDay())
-                         .date("startTime", schedule_->StartTime())
-                         .number("interval", schedule_->interval())
-                         .number("intervalUnit", schedule_->valUnit())
-                         .text("schDesc", schDesc));
+  connection.Execute(
+      taskSql("update tasks set "
+              "taskName=<name>"
+              ",cycle=<cycle>,cycleNum=<cycleNum>"
+              ",wk=<wk>,md=<md>"
+              ",tod=<tod>,startTime=<startTime>,hInterval=<interval>"
+              ",intervalUnit=<intervalUnit>"
+              ",schDesc=<schDesc>"
+              " where taskId=<id>",
+              schDesc));
   connection.Execute(sql("update qvbkplan set path=<path>"
                          ",delOld=" +
                          text(delFiles_ ? -1 : 0) + ",delNum=" + text(delNum_) + ",delUnit=" + text(delUnit_) +

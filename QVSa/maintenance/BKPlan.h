@@ -40,7 +40,7 @@ class BKPlan : private Frame {
   // Loads a plan by its Id (`keyName` 1) or its Name (2); by anything else the first of all. 0x80040C1C: no plan.
   Boolean GetOne(Integer keyName = 0, const String& keyValue = "");
   // Inserts a plan without an Id, else updates it. Pending runs are replaced by the next one from now, finished ones
-  // stay. 0x80040E2F the name is taken.
+  // stay. 0x80040E2F the name is taken. A new plan has its Id from a save that succeeded.
   Boolean Save();
   // Queues the next run where none is pending in the future: for a plan whose chain of runs was broken. Throws Failure.
   void newSche();
@@ -56,6 +56,8 @@ class BKPlan : private Frame {
 
   // Everything but delFiles, which its readers take differently.
   void read(Recordset& row);
+  // A statement on tasks with the plan's values.
+  Statement taskSql(const String& statement, const String& schDesc);
   Boolean insertTask(Connection& connection, const String& schDesc);
   void updateTask(Connection& connection, const String& schDesc);
   void queueNext(Connection& connection, Date serverTime);
