@@ -17,7 +17,7 @@ class SingleUserMode {
     if (ended_) return;
     try {
       end();
-    } catch (const Failure&) {
+    } catch (...) {
       // What ended the restore is what the caller hears of.
     }
   }

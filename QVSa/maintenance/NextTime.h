@@ -17,7 +17,7 @@ struct Recurrence {
   Integer valUnit = 0;
 };
 
-// The next due moment at or after `now`, computed from `now` alone: nothing anchors it to an earlier run. `timeOfDay`
+// The next due moment behind `now`, computed from `now` alone: nothing anchors it to an earlier run. `timeOfDay`
 // is set to its time as soon as that is known, before the day is. Whole numbers have 16 bits; throws Failure 6 where
 // one overflows or the result lies outside a date's range, 9 for more than seven weekdays, 13 for one that is no digit.
 Date nextTime(const Recurrence& schedule, Date now, Date& timeOfDay);
