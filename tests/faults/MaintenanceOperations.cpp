@@ -16,6 +16,8 @@ String backupPath() {
   return folder.path().string();
 }
 
+String groundCopy(const String& name) { return backupPath() + "/ground-" + name; }
+
 void loadPlan(BKPlan& plan) { require(plan.GetOne(2, "nightly")); }
 
 void fillPlan(BKPlan& plan) {
@@ -46,14 +48,19 @@ std::vector<Operation> planOperations() {
   };
 }
 
-// A class without a connect, whose operations name their server.
-Operation managerOperation(const char* name, std::function<bool(DBMgr&, const String& server)> run,
-                           std::vector<Report> reports) {
+// Of a class without the usual connect: the operation names its server, and may raise.
+template <class Class>
+Operation unconnected(const char* name, std::function<bool(Class&, const String& server)> run,
+                      std::vector<Report> reports) {
   const auto prepare = [run](const String& server) -> std::function<Outcome()> {
     return [run, server] {
-      DBMgr manager;
-      const bool positive = run(manager, server);
-      return Outcome{positive, manager.errNumber(), manager.errDescription()};
+      try {
+        Class object;
+        const bool positive = run(object, server);
+        return Outcome{positive, object.errNumber(), object.errDescription()};
+      } catch (const Failure& failure) {
+        return Outcome{false, failure.number(), failure.description()};
+      }
     };
   };
   return {name, prepare, std::move(reports), false};
@@ -71,15 +78,39 @@ std::vector<Operation> maintenanceOperations() {
         Date due;
         return schedule.getNextSch(Date(2024, 3, 1), type, task, run, due) == 1;
       }));
-  result.push_back(managerOperation("DBMgr.BackUpDB with a lock",
-                                    [](DBMgr& manager, const String& server) {
-                                      return manager.BackUpDB(server, backupPath() + "/sys", backupPath() + "/app", "",
-                                                              "lock");
-                                    },
-                                    {{"", LoadResString(2906), false, messageNumber(2906)}}));
+  result.push_back(unconnected<DBMgr>("DBMgr.BackUpDB with a lock",
+                                      [](DBMgr& manager, const String& server) {
+                                        return manager.BackUpDB(server, backupPath() + "/sys", backupPath() + "/app",
+                                                                "", "lock");
+                                      },
+                                      {{"", LoadResString(2906), false, messageNumber(2906)}}));
   result.push_back(
-      managerOperation("DBMgr.decryptTmps",
-                       [](DBMgr& manager, const String& server) { return manager.decryptTmps(server, "lock"); }, {}));
+      unconnected<DBMgr>("DBMgr.decryptTmps",
+                         [](DBMgr& manager, const String& server) { return manager.decryptTmps(server, "lock"); }, {}));
+  const String restoring = LoadResString(2905);
+  result.push_back(unconnected<DBMgr>("DBMgr.RestoreDB",
+                                      [](DBMgr& manager, const String& server) {
+                                        return manager.RestoreDB(server, groundCopy("sys"), groundCopy("app"),
+                                                                 TestInstallation::administratorPassword);
+                                      },
+                                      {{"select isnull(release", restoring},
+                                       {"delete from sesLog", restoring},
+                                       {"update ", restoring},
+                                       {.statement = "", .prefix = "", .suffix = ":0"}}));
+  result.push_back(unconnected<BKPlan>("BKPlan.newSche",
+                                       [](BKPlan& plan, const String& server) {
+                                         plan.connect(server, "QVApp");
+                                         if (!plan.GetOne(2, "broken")) return false;
+                                         plan.newSche();
+                                         return true;
+                                       },
+                                       {}));
+  result.push_back(unconnected<QVAgent>("QVAgent.connect and newFiles",
+                                        [](QVAgent& agent, const String& server) {
+                                          agent.connect(server);
+                                          return agent.newFiles() == 1;
+                                        },
+                                        {}));
   return result;
 }
 
@@ -102,9 +133,17 @@ void fillMaintenance(const String& server) {
   fillPlan(plan);
   plan.Name("nightly");
   require(plan.Save());
+  BKPlan broken;
+  broken.connect(server, "QVApp");
+  fillPlan(broken);
+  broken.Name("broken");
+  require(broken.Save());
   // Reports, so that there is something to lock, and a lock to lift.
   PlainSession(server).run("insert into reports(repId,repName) values(3,'a') update roles set roleSpec=N'" +
-                           BackupLock{"3", "lock"}.cipher() + "' where roleId=4");
+                           BackupLock{"3", "lock"}.cipher() + "' where roleId=4 delete from QVTaskSche where taskId=2");
+  PlainSession(server, "QVUpdate").run("insert into sysfile(fileName) values('QVSa.dll')");
+  DBMgr manager;
+  require(manager.BackUpDB(server, groundCopy("sys"), groundCopy("app")));
 }
 
 }  // namespace QVSa::test
