@@ -2,6 +2,7 @@
 #include <fstream>
 
 #include "platform/Files.h"
+#include "platform/Folders.h"
 #include "tests/support/Failures.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
@@ -108,6 +109,12 @@ TEST_F(BackupPlans, HaveOnePendingRunAndKeepTheFinishedOnes) {
       << "the pending one was missed";
 
   saved("other");
+  nightly.delFiles(true);
+  nightly.delNum(5);
+  nightly.delUnit(1);
+  ASSERT_TRUE(nightly.Save());
+  EXPECT_EQ(tables_.text("select path,delOld,delNum,delUnit from QVBkPlan order by taskId"),
+            path() + "|-1|5|1\n" + path() + "|0|0|0");
   EXPECT_TRUE(nightly.Delete(2));
   EXPECT_EQ(tables_.text("select taskId from tasks"), "1");
   EXPECT_TRUE(nightly.Delete());
@@ -117,13 +124,20 @@ TEST_F(BackupPlans, HaveOnePendingRunAndKeepTheFinishedOnes) {
 TEST_F(BackupPlans, RunIntoAFolderOfTheirOwnAndQueueTheNextRun) {
   BKPlan nightly = saved("nightly");
   clock_.set(Date(2024, 3, 7, 10, 30, 0));
-  ASSERT_TRUE(nightly.exec(1)) << nightly.errDescription();
+  {
+    // The next run is counted from the beginning of this one, which takes two days.
+    RecordingProvider slow;
+    slow.beforeEach([&](const String& event) {
+      if (event.rfind(" backup database", 0) == 0) clock_.set(Date(2024, 3, 9, 11, 0, 0));
+    });
+    ASSERT_TRUE(nightly.exec(1)) << nightly.errDescription();
+  }
   const String folder = path() + "\\20240307103000";
   EXPECT_EQ(runs(), "1|1|2024-03-07 10:30:00|1|" + folder + "\n1|2|2024-03-09 10:30:00|0|-");
   EXPECT_TRUE(fs::exists(backups_.path() / "20240307103000" / "sys.bak"));
   EXPECT_TRUE(fs::exists(backups_.path() / "20240307103000" / "app.bak"));
   EXPECT_EQ(tables_.text("select logId,logType,LogTime,userId,UserName,Computer,FuncName,OpDesc from syslog"),
-            "24030700000001|3|2024-03-07 10:30:00|1||" + platform::services().computerName() +
+            "24030900000001|3|2024-03-09 11:00:00|1||" + platform::services().computerName() +
                 "|Backup database|Backup database to [" + folder + "]");
 }
 
@@ -137,16 +151,23 @@ TEST_F(BackupPlans, GoOnWhereABackupFails) {
   {
     RecordingProvider full;
     full.beforeEach([](const String& event) {
-      if (event.rfind(" backup database QVSys", 0) == 0)
+      if (event.rfind("restore verifyonly", 0) == 0)
         throw Failure(number::statement, "SQL Server", "There is no room.", 3013);
     });
     EXPECT_FALSE(nightly.exec(1));
   }
   EXPECT_EQ(nightly.errNumber(), messageNumber(2906));
   EXPECT_EQ(nightly.errDescription(), "Backup DB failed.Database backup error.There is no room.");
-  EXPECT_EQ(tables_.text("select schNo,state from QVTaskSche where schNo<7 order by schNo"), "1|2\n2|0");
+  const String folder = tables_.text("select msg from QVTaskSche where schNo=1");
+  EXPECT_EQ(folder.substr(0, path().size() + 3), path() + "\\20");
+  EXPECT_EQ(tables_.text("select schNo,state,msg from QVTaskSche where schNo<7 order by schNo"),
+            "1|2|" + folder + "\n2|0|-");
   EXPECT_EQ(tables_.text("select OpDesc from syslog"), nightly.errDescription());
   EXPECT_FALSE(fs::exists(old)) << "the cleaning takes place";
+  EXPECT_TRUE(platform::folderExists(folder));
+  clock_.set(realTime().addDays(1));
+  EXPECT_TRUE(nightly.exec(2));
+  EXPECT_FALSE(platform::folderExists(folder)) << "it holds both files";
 }
 
 TEST_F(BackupPlans, WithoutAFolderWriteNothing) {
@@ -190,7 +211,20 @@ TEST_F(BackupPlans, RemoveOnlyTheirOwnOldBackups) {
   clock_.set(realTime().addDays(1).addDays(1.0 / 1440));
   ASSERT_TRUE(nightly.exec(3)) << nightly.errDescription();
   EXPECT_FALSE(fs::exists(young)) << "all before this run is old by no days";
-  EXPECT_EQ(tables_.text("select count(*) from QVTaskSche where taskId=1 and state=1 and schNo<10"), "3")
+  // Three days old today: what one week takes, and one month.
+  nightly.delNum(1);
+  Long run = 4;
+  for (const auto& [unit, kept, gone] : {std::tuple<Integer, int, int>{1, 3, 5}, {2, 24, 40}}) {
+    nightly.delUnit(unit);
+    const fs::path folder = oldBackup("1");
+    clock_.set(realTime().addDays(kept));
+    ASSERT_TRUE(nightly.exec(run++)) << nightly.errDescription();
+    EXPECT_TRUE(fs::exists(folder)) << unit;
+    clock_.set(realTime().addDays(gone));
+    ASSERT_TRUE(nightly.exec(run++)) << nightly.errDescription();
+    EXPECT_FALSE(fs::exists(folder)) << unit;
+  }
+  EXPECT_EQ(tables_.text("select count(*) from QVTaskSche where taskId=1 and state=1 and schNo<10"), "7")
       << "the history stays";
 }
 

@@ -1,9 +1,12 @@
 #include <filesystem>
 
+#include "QVSa/frame/DeploymentSecrets.h"
 #include "QVSa/frame/Providers.h"
 #include "QVSa/frame/Text.h"
 #include "QVSa/maintenance/BackupLock.h"
+#include "QVSa/maintenance/RotatedKey.h"
 #include "platform/Files.h"
+#include "platform/SecretMessage.h"
 #include "providers/embedded/Provider.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
@@ -13,7 +16,7 @@ namespace {
 
 class Backups : public Scene {
  protected:
-  static constexpr const char* password = "test-admin";
+  static constexpr const char* password = TestInstallation::administratorPassword;
 
   String file(const String& name) const { return folder_.path().string() + "\\" + name; }
   void backUp(const String& lock = "") {
@@ -21,6 +24,11 @@ class Backups : public Scene {
   }
   Boolean restore() { return restore(server()); }
   Boolean restore(const String& where) { return manager_.RestoreDB(where, file("sys.bak"), file("app.bak"), password); }
+  void damage(const String& name) const {
+    Bytes content = platform::readFile(file(name));
+    std::fill_n(content.begin() + 5 * 4096, 4000, std::uint8_t{0x5A});
+    platform::writeFile(file(name), content);
+  }
   void addReports() { tables_.run("insert into reports(repId,repName) select 3,'a' union all select 5,'b'"); }
   String spec() const { return tables_.text("select roleSpec from roles where roleId=4"); }
 
@@ -103,13 +111,28 @@ TEST_F(Backups, SendTheirStatementsInOrder) {
     ASSERT_TRUE(restore());
     log = recorder.log();
   }
-  const String data = (installation_.folder() / "QVSys.db").string();
-  const Lines first(log.begin(), log.begin() + 9);
-  EXPECT_EQ(first, (Lines{"open master", "alter database QVSys set SINGLE_USER", "use QVSys",
-                          "select name, fileName from sysfiles", "use master",
-                          "RESTORE DATABASE QVSys FROM DISK = N'" + sys + "' With  move N'QVSys' to N'" + data +
-                              "', move N'QVSys_log' to N'" + data + "-wal',replace",
-                          "alter database QVSys set MULTI_USER", "use QVSys", "sp_changedbowner N'QVUser'"}));
+  const auto restoring = [&](const String& database, const String& backup) {
+    const String data = (installation_.folder() / (database + ".db")).string();
+    return Lines{"open master",
+                 "alter database " + database + " set SINGLE_USER",
+                 "use " + database,
+                 "select name, fileName from sysfiles",
+                 "use master",
+                 "RESTORE DATABASE " + database + " FROM DISK = N'" + backup + "' With  move N'" + database +
+                     "' to N'" + data + "', move N'" + database + "_log' to N'" + data + "-wal',replace",
+                 "alter database " + database + " set MULTI_USER",
+                 "use " + database,
+                 "sp_changedbowner N'QVUser'",
+                 "close"};
+  };
+  Lines expected = restoring("QVSys", sys);
+  for (const Lines& more :
+       {Lines{"open QVSys", "select isnull(release,'6.5') from sysinfo", "close"}, restoring("QVApp", app),
+        Lines{"open QVSys", "delete from sesLog",
+              "update reptmps set ifCheckout=0,checkOutBy=null Where ifCheckOut = 1",
+              "update CFWorkItems set state=0,checkOutBy=0,checkOutByName='' where state=1", "close"}})
+    expected.insert(expected.end(), more.begin(), more.end());
+  EXPECT_EQ(log, expected);
 }
 
 TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
@@ -117,11 +140,16 @@ TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
   EXPECT_EQ(spec(), "-") << "without reports there is nothing to lock";
   addReports();
   backUp("lock");
-  const auto lock = BackupLock::read(spec());
-  ASSERT_TRUE(lock) << "the lock stays on the running system";
-  EXPECT_EQ(lock->list + "|" + lock->pwd, "3.5|lock");
+  const auto lock = [&] {
+    const auto found = BackupLock::read(spec());
+    return found ? found->list + "|" + found->pwd : "none";
+  };
+  EXPECT_EQ(lock(), "3.5|lock") << "the lock stays on the running system";
+  const String locked = spec();
   backUp();
-  EXPECT_NE(spec(), "-") << "without a password nobody touches it";
+  EXPECT_EQ(spec(), locked) << "without a password nobody touches it";
+  EXPECT_FALSE(manager_.BackUpDB(server(), file("no\\sys.bak"), file("app.bak"), "", "other"));
+  EXPECT_EQ(lock(), "3.5|other") << "it stays after a failure, too";
 
   ASSERT_TRUE(restore());
   QVAgent agent;
@@ -130,10 +158,17 @@ TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
   EXPECT_FALSE(manager_.decryptTmps(server(), "Lock"));
   EXPECT_EQ(manager_.errNumber(), messageNumber(2909));
   EXPECT_EQ(manager_.errDescription(), "Incorrect password.");
-  EXPECT_NE(spec(), "");
+  EXPECT_EQ(spec(), locked);
   EXPECT_TRUE(manager_.decryptTmps(server(), "lock"));
   EXPECT_EQ(spec(), "");
   EXPECT_TRUE(manager_.decryptTmps(server(), "anything"));
+
+  tables_.run("update roles set roleSpec=N'" + platform::encryptText("7.9", rotatedKey(secrets::backupLockKeyStart)) +
+              "' where roleId=4");
+  agent.connect(server());
+  EXPECT_EQ(agent.hiddenReps(), "7.9") << "without a bar all of it is the list";
+  EXPECT_FALSE(manager_.decryptTmps(server(), "lock"));
+  EXPECT_TRUE(manager_.decryptTmps(server(), "")) << "and the password is empty";
 }
 
 TEST_F(Backups, OfAnOlderReleaseGetTheTableOfRoles) {
@@ -145,7 +180,18 @@ TEST_F(Backups, OfAnOlderReleaseGetTheTableOfRoles) {
   tables_.run("update users set isRole=1,isAbstract=1,userDesc='a role',userPwd='spec' where userLogin='ann'");
   PlainSession(server(), "QVSys").run("drop table roles");
   makeOld("");
+  tables_.run("insert into seslog(sesId,userLogin) values('1','ann')");
   backUp();
+  // A copy that fails behind the system's: that one is restored and upgraded, the rest is as it was.
+  tables_.run("insert into idRule(idName,ymdStyle,noStyle) values('inv',0,4)");
+  const Bytes whole = platform::readFile(file("app.bak"));
+  damage("app.bak");
+  EXPECT_FALSE(restore());
+  EXPECT_EQ(manager_.errDescription().substr(manager_.errDescription().size() - 5), ":3241");
+  EXPECT_EQ(tables_.text("select count(*) from roles"), "1");
+  EXPECT_EQ(tables_.text("select idName from idRule where predefined=0"), "inv");
+  EXPECT_EQ(tables_.text("select count(*) from seslog"), "1");
+  platform::writeFile(file("app.bak"), whole);
   ASSERT_TRUE(restore()) << manager_.errDescription();
   EXPECT_EQ(tables_.text("select roleId,roleName,roleDesc,roleSpec,builtIn from roles"),
             tables_.text("select userId from users where userLogin='ann'") + "|Ann|a role|spec|1");
@@ -202,13 +248,8 @@ TEST_F(Backups, LeaveTheDatabaseToAllWhereARestoreFails) {
 
 TEST_F(Backups, DamagedOrForeignAreRefused) {
   backUp();
-  const auto damage = [&](std::size_t from) {
-    Bytes content = platform::readFile(file("sys.bak"));
-    for (std::size_t i = from; i < from + 4000 && i < content.size(); ++i) content[i] = 0x5A;
-    platform::writeFile(file("sys.bak"), content);
-  };
   addUser("ann");
-  damage(5 * 4096);
+  damage("sys.bak");
   EXPECT_FALSE(restore());
   EXPECT_EQ(manager_.errDescription().substr(manager_.errDescription().size() - 5), ":3241");
   platform::writeFile(file("sys.bak"), {});
