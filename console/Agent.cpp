@@ -1,20 +1,22 @@
 #include <algorithm>
 #include <csignal>
-#include <ctime>
 #include <iostream>
 #include <memory>
+#include <optional>
+#include <set>
 
 #include "QVSa/maintenance/BKPlans.h"
 #include "QVSa/maintenance/QVAgent.h"
 #include "console/Commands.h"
+#include "console/SystemRows.h"
 #include "console/Table.h"
 #include "console/Waiting.h"
+#include "platform/Services.h"
 
 namespace QVSa::console {
 
 namespace {
 
-constexpr Integer backupTask = 2;
 constexpr double secondsOfDay = 86'400;
 
 struct Options {
@@ -22,13 +24,7 @@ struct Options {
   double until = -1;  // seconds; none: until a signal
 };
 
-Date localTime() {
-  const std::time_t now = std::time(nullptr);
-  std::tm parts{};
-  localtime_r(&now, &parts);
-  return Date(parts.tm_year + 1900, parts.tm_mon + 1, parts.tm_mday, parts.tm_hour, parts.tm_min,
-              std::min(parts.tm_sec, 59));
-}
+Date localTime() { return platform::services().localTime(); }
 
 double secondsBetween(Date from, Date to) { return (to.days() - from.days()) * secondsOfDay; }
 
@@ -63,24 +59,18 @@ class Agent {
  public:
   explicit Agent(const Console& console) : console_(console), from_(localTime()) {}
 
-  // Runs all that is due, and gives the moment of the next run, or that of the next look.
+  // Runs all that is due, mends what is broken, and gives the moment of the next run, or that of the next look. A
+  // failure ends neither the service nor what is due: the server may be back at the next look.
   Date work(double look) {
-    mendChains();
-    for (;;) {
-      const Date now = localTime();
-      const Date later = now.addDays(look / secondsOfDay);
-      Integer type = 0;
-      Long task = 0;
-      Long run = 0;
-      Date due;
-      cSchedule schedule;
-      console_.connect(schedule);
-      const Long found = schedule.getNextSch(from_, type, task, run, due);
-      require(found >= 0, schedule);
-      if (found == 0 || due > later) return later;
-      if (due > now) return due;
-      // A task of another type is none of ours, and one that could not be run at all is not tried for ever.
-      if (type != backupTask || !runPlan(task, run)) from_ = due.addDays(1 / secondsOfDay);
+    const auto later = [&] { return localTime().addDays(look / secondsOfDay); };
+    try {
+      for (auto due = nextMoment(); due && *due <= localTime(); due = nextMoment()) runAllOf(*due);
+      mendChains();
+      const auto next = nextMoment();
+      return next ? std::min(*next, later()) : later();
+    } catch (const std::exception& failure) {
+      complain(failure.what());
+      return later();
     }
   }
 
@@ -90,26 +80,60 @@ class Agent {
   }
 
  private:
-  // A plan whose run died has no run ahead of it.
+  static void complain(const String& reason) { std::cerr << localTime().text() << " " << reason << "\n"; }
+
+  // Of a task of any type.
+  std::optional<Date> nextMoment() const {
+    Integer type = 0;
+    Long task = 0;
+    Long run = 0;
+    Date due;
+    cSchedule schedule;
+    console_.connect(schedule);
+    const Long found = schedule.getNextSch(from_, type, task, run, due);
+    require(found >= 0, schedule);
+    return found == 0 ? std::nullopt : std::optional(due);
+  }
+
+  // Several tasks may be due in one second, of which the question for the next one names one alone, and always the same
+  // where that stays pending: a task of another type, or a plan that could not be run. Each is tried once.
+  void runAllOf(Date due) {
+    const Date end = due.addDays(1 / secondsOfDay);
+    const auto rows = systemRows(console_,
+                                 "select a.taskId,b.schNo from tasks a,QVTaskSche b where a.taskId=b.taskId and "
+                                 "a.taskType=2 and b.state=0 and b.pTime>='" +
+                                     due.sqlText() + "' and b.pTime<'" + end.sqlText() + "' order by b.pTime,a.taskId");
+    from_ = end;
+    for (const auto& row : rows) runPlan(row[0].toLong(), row[1].toLong());
+  }
+
+  // A plan whose run died has no run ahead of it. One that is due still has: by now it may lie in the past.
   void mendChains() const {
+    std::set<Long> pending;
+    for (const auto& row :
+         systemRows(console_, "select taskId from QVTaskSche where state=0 and pTime>='" + from_.sqlText() + "'"))
+      pending.insert(row[0].toLong());
     BKPlans plans;
     console_.connect(plans);
     require(plans.GetAll(), plans);
-    for (const auto& plan : plans) plan->newSche();
+    const Date now = localTime();
+    for (const auto& plan : plans) {
+      // A schedule that can't be computed gives a moment long ago, which would never be run.
+      const bool hasNext = plan->schedule()->GetNextTime(now) > now;
+      if (hasNext && !pending.contains(plan->Id())) plan->newSche();
+    }
   }
 
-  bool runPlan(Long task, Long run) {
+  void runPlan(Long task, Long run) {
     BKPlan plan;
     console_.connect(plan);
-    if (!plan.GetOne(1, std::to_string(task))) return false;
-    bool done = false;
-    {
+    bool done = plan.GetOne(1, std::to_string(task));
+    if (done) {
       const Waiting waiting(localTime().text() + " " + plan.Name() + ", run " + std::to_string(run));
       done = plan.exec(run);
     }
     ++(done ? done_ : failed_);
-    if (!done) std::cerr << plan.errDescription() << "\n";
-    return done;
+    if (!done) complain(plan.errDescription());
   }
 
   const Console& console_;
@@ -123,7 +147,8 @@ Answer run(const Console& console, const Options& options) {
   Agent agent(console);
   const Date end = localTime().addDays(options.until / secondsOfDay);
   for (;;) {
-    double wait = secondsBetween(localTime(), agent.work(options.look));
+    const Date next = agent.work(options.look);
+    double wait = secondsBetween(localTime(), next);
     const double left = secondsBetween(localTime(), end);
     const bool isLast = options.until >= 0 && left <= wait;
     if (isLast) wait = left;

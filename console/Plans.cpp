@@ -1,13 +1,14 @@
 #include <algorithm>
 #include <memory>
 
-#include "QVSa/frame/ConnectionString.h"
 #include "QVSa/frame/Text.h"
 #include "QVSa/maintenance/BKPlans.h"
 #include "console/Commands.h"
 #include "console/ServerPath.h"
+#include "console/SystemRows.h"
 #include "console/Table.h"
 #include "console/Waiting.h"
+#include "platform/Services.h"
 
 namespace QVSa::console {
 
@@ -38,13 +39,6 @@ BKPlan load(const Console& console, const String& name) {
   return plan;
 }
 
-// The rows of a plan have no operation of the library.
-std::vector<std::vector<Variant>> query(const Console& console, const String& text) {
-  Connection connection;
-  connection.Open(buildConnString(console.place().server, "", false));
-  return connection.Execute(text).GetRows();
-}
-
 String maskOf(const std::vector<String>& weekdays) {
   String mask = "0000000";
   for (const String& day : weekdays) {
@@ -61,6 +55,12 @@ Date timeOf(const String& text) {
   return *time;
 }
 
+void requireWithinADay(const Options& options) {
+  constexpr int minutesOfDay = 24 * 60;
+  const int minutes = options.repeat * (options.unit == units.at("hours") ? 60 : 1);
+  if (minutes >= minutesOfDay) throw Misuse("A plan repeats within a day: every 23 hours is the most.");
+}
+
 String keptFor(BKPlan& plan) {
   if (!plan.delFiles()) return "for ever";
   for (const auto& [name, unit] : cycles)
@@ -68,9 +68,10 @@ String keptFor(BKPlan& plan) {
   return "for ever";
 }
 
-// The next pending run, or nothing.
+// The next pending run, or nothing: one that was missed stays pending for ever.
 Json nextOf(const Console& console, const BKPlan& plan) {
-  const auto rows = query(console, "select min(pTime) from QVTaskSche where state=0 and taskId=" + text(plan.Id()));
+  const auto rows = systemRows(
+      console, "select min(pTime) from QVTaskSche where state=0 and pTime>=getdate() and taskId=" + text(plan.Id()));
   return rows[0][0].isNull() ? Json() : Json(rows[0][0].toText());
 }
 
@@ -84,6 +85,7 @@ Answer show(const Console& console, const String& name) {
 }
 
 Answer add(const Console& console, const Options& options) {
+  requireWithinADay(options);
   BKPlan plan;
   console.connect(plan);
   plan.Name(options.plan);
@@ -100,6 +102,9 @@ Answer add(const Console& console, const Options& options) {
   plan.delFiles(options.keep >= 0);
   plan.delNum(std::max<Integer>(options.keep, 0));
   plan.delUnit(options.keepUnit);
+  // A save takes any schedule, also one that would never be due.
+  when.GetNextTime(platform::services().localTime());
+  require(when.errNumber() == 0, when);
   require(plan.Save(), plan);
   Answer answer = show(console, options.plan);
   answer.text = "The plan is added. `qvsa agent run` runs it.\n\n" + answer.text;
@@ -120,15 +125,16 @@ Answer list(const Console& console) {
 Answer run(const Console& console, const String& name) {
   BKPlan plan = load(console, name);
   plan.newSche();
-  const auto rows = query(console, "select max(schNo) from QVTaskSche where state=0 and taskId=" + text(plan.Id()));
+  const auto rows =
+      systemRows(console, "select max(schNo) from QVTaskSche where state=0 and taskId=" + text(plan.Id()));
   const Long number = rows[0][0].toLong();
   {
     const Waiting waiting("Backing up");
     require(plan.exec(number), plan);
   }
-  const auto folder =
-      query(console, "select msg from QVTaskSche where taskId=" + text(plan.Id()) + " and schNo=" + text(number))[0][0]
-          .toText();
+  const auto folder = systemRows(console, "select msg from QVTaskSche where taskId=" + text(plan.Id()) +
+                                              " and schNo=" + text(number))[0][0]
+                          .toText();
   return {"Run " + text(number) + " of " + plan.Name() + " is done: " + folder + "\n",
           {{"plan", plan.Name()}, {"run", number}, {"folder", folder}}};
 }
@@ -143,8 +149,8 @@ Answer history(const Console& console, const String& name) {
   const BKPlan plan = load(console, name);
   static const std::map<Long, String> states{{0, "pending"}, {1, "done"}, {2, "failed"}};
   Table table({{"Run", "run"}, {"Due", "due"}, {"State", "state"}, {"Folder", "folder"}});
-  for (const auto& row : query(console, "select schNo,pTime,state,msg from QVTaskSche where taskId=" + text(plan.Id()) +
-                                            " order by schNo")) {
+  for (const auto& row : systemRows(console, "select schNo,pTime,state,msg from QVTaskSche where taskId=" +
+                                                 text(plan.Id()) + " order by schNo")) {
     const auto state = states.find(row[2].toLong());
     table.row({row[0].toLong(), row[1].isNull() ? "" : row[1].toText(),
                state == states.end() ? row[2].toText() : state->second, row[3].isNull() ? "" : row[3].toText()});
@@ -167,7 +173,8 @@ void addAdding(Console& console, CLI::App* group, const std::shared_ptr<Options>
       ->check(CLI::Range(0, 31))
       ->capture_default_str();
   command->add_option("--at", options->at, "The time of day, or the first of a day")->capture_default_str();
-  command->add_option("--repeat", options->repeat, "Again after so many hours, until midnight");
+  command->add_option("--repeat", options->repeat, "Again after so many hours, until midnight")
+      ->check(CLI::NonNegativeNumber);
   command->add_option("--repeat-unit", options->unit, "hours (the default) or minutes")
       ->transform(CLI::CheckedTransformer(units, CLI::ignore_case));
   command->add_option("--keep", options->keep, "Remove this plan's backups that are older")
