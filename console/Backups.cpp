@@ -5,6 +5,7 @@
 #include "console/Commands.h"
 #include "console/Passwords.h"
 #include "console/ServerPath.h"
+#include "console/SystemRows.h"
 #include "console/Waiting.h"
 
 namespace QVSa::console {
@@ -27,16 +28,29 @@ Files filesIn(const Console& console, const String& folder) {
   return {below(console, place, "sys.bak"), below(console, place, "app.bak")};
 }
 
+// The lock is written to the running system, where it stays and goes into every copy; without reports none is written.
+bool isLocked(const Console& console) {
+  return !systemRows(console, "select roleId from roles where roleId=4 and roleSpec like '_%'").empty();
+}
+
 Answer backUp(const Console& console, const Options& options) {
   const Files files = filesIn(console, options.folder);
   const String lock = options.lock ? askNewPassword("Password that lifts the lock") : "";
+  if (options.lock && lock.empty()) throw Misuse("A lock needs a password.");
   DBMgr manager;
   {
     const Waiting waiting("Backing up");
     require(manager.BackUpDB(console.place().server, files.sys, files.app, "", lock), manager);
   }
-  return {"Both databases are backed up and checked:\n  " + files.sys + "\n  " + files.app + "\n",
-          {{"system", files.sys}, {"application", files.app}, {"locked", options.lock}}};
+  const bool locked = isLocked(console);
+  Answer answer{"Both databases are backed up and checked:\n  " + files.sys + "\n  " + files.app + "\n",
+                {{"system", files.sys}, {"application", files.app}, {"locked", locked}}};
+  if (locked)
+    answer.text +=
+        "The reports of the copy are locked, and so are those of the running system: `qvsa backup unlock`.\n";
+  else if (options.lock)
+    answer.text += "There is no lock: the system has no reports.\n";
+  return answer;
 }
 
 Answer restore(const Console& console, const Options& options) {

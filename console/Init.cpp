@@ -83,8 +83,9 @@ Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
 
 Answer init(const Console& console, const Options& options) {
   const auto folder = targetFolder(console, options);
-  if (folder.string().find_first_of(";|") != String::npos)
-    throw Misuse("The path of an installation must hold neither \";\" nor \"|\".");
+  // The first two end a server text, the third the name of a file in the statement of a restore.
+  if (folder.string().find_first_of(";|'") != String::npos)
+    throw Misuse("The path of an installation must hold none of ; | and '.");
   if (embedded::isInstallation(folder)) throw Refusal("There is an installation in " + folder.string() + " already.");
   const Chosen admin = choose(administrator, options.makePasswords);
   const Chosen sa = choose("sa, the log-in that restores backups", options.makePasswords);

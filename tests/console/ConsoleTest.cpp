@@ -59,8 +59,8 @@ TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   EXPECT_EQ(wrong.exitCode, 1);
   EXPECT_EQ(wrong.error(), "0x80040452");
   EXPECT_EQ(run("sign-on nobody", "x\n").error(), "0x8004044D");
-  for (const char* misuse :
-       {"", "dept show", "sign-on Admin --password x", "no-such-command", "number rule add x --reuse often"})
+  for (const char* misuse : {"", "dept show", "sign-on Admin --password x", "no-such-command",
+                             "number rule add x --reuse often", "init \"it's\""})
     EXPECT_EQ(run(misuse, "x\n").exitCode, 2) << misuse;
   EXPECT_EQ(run("sign-on Admin", "").exitCode, 2);
   name_ = "missing";

@@ -44,9 +44,12 @@ class MaintenanceCommands : public Program {
 };
 
 TEST_F(MaintenanceCommands, BackUpRestoreAndUnlock) {
+  EXPECT_EQ(run("backup now --lock " + backups(), "\n").exitCode, 2) << "a lock needs a password";
+  EXPECT_EQ(run("backup now --lock " + backups(), "x\n").document["locked"], false) << "there is nothing to lock";
   execute("insert into reports(repId,repName) select 3,'a'");
   const Outcome backup = run("backup now --lock " + backups(), "Lock-pass-1\nLock-pass-1\n");
   ASSERT_EQ(backup.exitCode, 0) << backup.said << backup.document;
+  EXPECT_EQ(backup.document["locked"], true);
   execute("delete from reports");
   EXPECT_EQ(run("backup restore " + backups(), "wrong\n").error(), "0x80040E4D");
   const Outcome restored = run("backup restore " + backups(), "Sa-first\n");
@@ -65,21 +68,21 @@ TEST_F(MaintenanceCommands, KeepPlansAndTheirHistory) {
   EXPECT_EQ(added.document["schedule"], "Occurs every [1] week(s) on [Monday, Friday], at [03:15:00]");
   EXPECT_EQ(added.document["kept"], "2 weeks");
   EXPECT_EQ(run("plan add odd " + backups() + " --weekdays noday").exitCode, 2);
-  EXPECT_EQ(run("plan list").document["plans"].size(), 1U);
-  const Outcome ran = run("plan run nightly");
-  ASSERT_EQ(ran.exitCode, 0) << ran.said << ran.document;
   for (const char* repeat : {"-1", "24", "1440 --repeat-unit minutes"})
     EXPECT_EQ(run("plan add odd " + backups() + " --repeat " + repeat).exitCode, 2) << repeat;
   EXPECT_EQ(run("plan add odd " + backups() + " --every 32767 --cycle weeks").exitCode, 1) << "it has no next run";
+  EXPECT_EQ(run("plan list").document["plans"].size(), 1U);
+  const Outcome ran = run("plan run nightly");
+  ASSERT_EQ(ran.exitCode, 0) << ran.said << ran.document;
   const Json runs = run("plan history nightly").document["runs"];
   ASSERT_EQ(runs.size(), 2U);
   EXPECT_EQ(runs[0]["state"], "done");
   EXPECT_EQ(runs[1]["state"], "pending");
+  execute("update QVTaskSche set pTime='20200101' where state=0");
+  EXPECT_TRUE(run("plan show nightly").document["next"].is_null()) << "that one was missed";
   EXPECT_EQ(run("plan remove nightly").exitCode, 0);
   EXPECT_EQ(run("plan show nightly").error(), "0x80040C1C");
 }
-  execute("update QVTaskSche set pTime='20200101' where state=0");
-  EXPECT_TRUE(run("plan show nightly").document["next"].is_null()) << "that one was missed";
 
 TEST_F(MaintenanceCommands, TheAgentRunsAllThatIsDueOnceAndMendsBrokenChains) {
   // The statement of a backup breaks at the first one's path; the second one's folder is missing.
