@@ -1,5 +1,8 @@
 #include "QVSa/frame/ConnectionString.h"
 
+#include <map>
+#include <set>
+
 #include "QVSa/frame/DeploymentSecrets.h"
 #include "QVSa/frame/Text.h"
 
@@ -35,14 +38,21 @@ std::vector<std::uint32_t> multiplied(const std::u16string& text) {
   return codes;
 }
 
-void setOption(ConnectionOptions& options, const String& keyword, const String& value) {
-  if (keyword == "provider") options.provider = value;
-  if (keyword == "data source") options.dataSource = value;
-  if (keyword == "database") options.database = value;
-  if (keyword == "uid") options.user = value;
-  if (keyword == "pwd") options.password = value;
-  if (keyword == "integrated security") options.integrated = sameText(value, "sspi");
+// Whether the keyword is known.
+bool setOption(ConnectionOptions& options, const String& keyword, const String& value) {
+  static const std::map<String, String ConnectionOptions::*> texts{{"provider", &ConnectionOptions::provider},
+                                                                   {"data source", &ConnectionOptions::dataSource},
+                                                                   {"database", &ConnectionOptions::database},
+                                                                   {"uid", &ConnectionOptions::user},
+                                                                   {"pwd", &ConnectionOptions::password}};
+  const bool isIntegrated = keyword == "integrated security";
+  if (isIntegrated) options.integrated = sameText(value, "sspi");
+  const auto text = texts.find(keyword);
+  if (text != texts.end()) options.*text->second = value;
+  return isIntegrated || text != texts.end();
 }
+
+Failure malformed() { return Failure(number::general, "Connection", "Invalid format of the initialization string."); }
 
 }  // namespace
 
@@ -87,15 +97,25 @@ String unscrambleText(const String& text) {
   return fromUtf16(result);
 }
 
+bool isFolder(const String& dataSource) { return dataSource.rfind("file:", 0) == 0; }
+
+// A path or a password with a semicolon in it must not be cut short without a word: a part without "=" is the rest of
+// one, and for a folder, whose strings are all of our own make, so is a keyword that is unknown or comes again.
 ConnectionOptions parseConnectionString(const String& connectionString) {
   ConnectionOptions options;
+  std::set<String> keywords;
+  bool ownKeywords = true;
+  bool ofFolder = false;
   for (const String& part : split(connectionString, ';')) {
+    if (trim(part).empty()) continue;
     const std::size_t mark = part.find('=');
-    // A path or a password with a semicolon in it would otherwise be cut short without a word.
-    if (mark == String::npos && !trim(part).empty())
-      throw Failure(number::general, "Connection", "Invalid format of the initialization string.");
-    if (mark != String::npos) setOption(options, lowerCase(trim(part.substr(0, mark))), part.substr(mark + 1));
+    if (mark == String::npos) throw malformed();
+    const String keyword = lowerCase(trim(part.substr(0, mark)));
+    const bool known = setOption(options, keyword, part.substr(mark + 1));
+    if (!known || !keywords.insert(keyword).second) ownKeywords = false;
+    if (isFolder(options.dataSource)) ofFolder = true;
   }
+  if (ofFolder && !ownKeywords) throw malformed();
   if (options.dataSource.empty()) throw Failure(number::general, "Connection", "Data source name not found.");
   return options;
 }

@@ -22,8 +22,12 @@ String serverOnly(const String& server);
 String scrambleText(const String& text);
 String unscrambleText(const String& text);
 
-// Takes a connection string apart. Keywords have any case and order; unknown ones are passed over.
-// Throws 0x80004005 where there is no data source.
+// Whether a data source is the folder of an embedded installation: "file:" and its path.
+bool isFolder(const String& dataSource);
+
+// Takes a connection string apart. Keywords have any case and order; unknown ones are passed over, and the last of two
+// holds. Throws 0x80004005 where there is no data source, for a part without "=", and beside a folder for any keyword
+// that is unknown or comes twice: a path must hold no semicolon.
 ConnectionOptions parseConnectionString(const String& connectionString);
 
 }  // namespace QVSa

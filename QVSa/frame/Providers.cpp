@@ -1,5 +1,6 @@
 #include "QVSa/frame/Providers.h"
 
+#include "QVSa/frame/ConnectionString.h"
 #include "providers/embedded/Provider.h"
 #include "providers/odbc/Provider.h"
 
@@ -7,13 +8,11 @@ namespace QVSa {
 
 namespace {
 
-constexpr const char* folderMark = "file:";
-
 std::unique_ptr<ProviderSession> pick(const ConnectionOptions& options) {
-  if (options.dataSource.rfind(folderMark, 0) != 0) return odbc::provider().open(options);
-  // Both marks have a meaning of their own on the way from a server text to here.
-  if (options.dataSource.find_first_of(";|") != String::npos)
-    throw Failure(number::general, "Connection", "The folder of a data source must hold neither \";\" nor \"|\".");
+  if (!isFolder(options.dataSource)) return odbc::provider().open(options);
+  // In a server text the password begins there.
+  if (options.dataSource.find('|') != String::npos)
+    throw Failure(number::general, "Connection", "The folder of a data source must not hold \"|\".");
   return embedded::provider().open(options);
 }
 

@@ -54,7 +54,8 @@ TEST(ConnectionString, KeywordsHaveAnyCaseAndValuesStandAsTheyAre) {
 TEST(ConnectionString, WithoutADataSourceOrCutShortItIsRefused) {
   for (const char* text : {"", "pwd=x;", "data source=;database=QVSys"})
     EXPECT_EQ(failureOf([&] { parseConnectionString(text); }), number::general) << text;
-  EXPECT_EQ(failureOf([] { parseConnectionString(buildConnString("file:/srv/a;b", "", false)); }), number::general);
+  for (const char* server : {"file:/srv/a;b", "file:/srv/a;b=c", "file:/srv/a;database=X", "file:/srv/a;data source=h"})
+    EXPECT_EQ(failureOf([&] { parseConnectionString(buildConnString(server, "", false)); }), number::general) << server;
 }
 
 TEST(DefaultDbPwd, IsAsciiWithoutASemicolonAndJoinedInOrder) {
