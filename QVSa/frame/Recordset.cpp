@@ -50,13 +50,12 @@ void Recordset::start(AttachedRows source, bool keep) {
   position_ = fetched_ = firstKept_ = turn_ = 0;
   exhausted_ = updatable_ = false;
   keeps_ = keep;
-  open_ = true;
   fetch();
 }
 
 void Recordset::Close() {
   requireOpen();
-  open_ = false;
+  columns_.clear();
   source_.reset();
   kept_.clear();
 }
@@ -98,6 +97,7 @@ void Recordset::MoveFirst() {
 
 void Recordset::MoveLast() {
   requireOpen();
+  Update();
   keepFromHere();
   fetchAll();
   moveTo(kept_.empty() ? fetched_ : fetched_ - 1);

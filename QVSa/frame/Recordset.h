@@ -73,9 +73,9 @@ class Recordset {
   void ActiveConnection(std::nullptr_t);
 
   bool EOF_() const;
-  // Writes the changes of the row that it leaves.
+  // Each move writes the changes of the row that it leaves. MoveFirst throws 0x800A0C93 where rows were passed that
+  // nobody kept.
   void MoveNext();
-  // Throws 0x800A0C93 where rows were passed that nobody kept.
   void MoveFirst();
   void MoveLast();
   // -1 where the rows stream.
@@ -110,7 +110,7 @@ class Recordset {
   };
 
   void start(AttachedRows source, bool keep);
-  bool isOpen() const { return open_ && (!source_ || *source_); }
+  bool isOpen() const { return !columns_.empty() && (!source_ || *source_); }
   bool isCurrent() const { return position_ < fetched_; }
   void requireOpen() const;
   void requireRow() const;
@@ -128,8 +128,8 @@ class Recordset {
   Chunks& chunksOf(std::size_t ordinal);
   void append(std::size_t ordinal, const Bytes& data);
 
-  AttachedRows source_;  // empty for a closed or detached row set
-  std::vector<Column> columns_;
+  AttachedRows source_;                                // empty for a closed or detached row set
+  std::vector<Column> columns_;                        // none: closed, or moved from
   std::vector<std::pair<String, std::size_t>> asked_;  // names of columns as they were asked for, and their ordinals
   std::size_t turn_ = 0;                               // in asked_
   std::size_t position_ = 0;                           // of the current row, counted from the first
@@ -139,7 +139,6 @@ class Recordset {
   std::size_t firstKept_ = 0;
   std::map<std::size_t, Change> changes_;
   std::map<std::size_t, Chunks> chunks_;
-  bool open_ = false;
   bool keeps_ = false;
   bool updatable_ = false;
   Long cursorType_ = 0;

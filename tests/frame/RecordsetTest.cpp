@@ -179,6 +179,19 @@ TEST_F(RecordsetTest, ChangesAreWrittenByUpdateAndByMovingOn) {
     rows.Update();
   }
   EXPECT_EQ(std::count(server.log.begin(), server.log.end(), "update"), 4);
+
+  Recordset rows = opened("pictures", 2, 3);
+  rows["id"].Value(12);
+  rows.MoveLast();
+  EXPECT_EQ(pictures->rows[0][0], Variant(12));
+}
+
+TEST_F(RecordsetTest, WhatWasMovedFromIsClosed) {
+  Recordset rows = connection.Execute("jobs");
+  const Recordset& left = rows;
+  const Recordset taken = std::move(rows);
+  EXPECT_EQ(taken.State(), 1);
+  EXPECT_EQ(left.State(), 0);
 }
 
 TEST_F(RecordsetTest, ARefusedWriteKeepsTheRowAndItsChange) {
