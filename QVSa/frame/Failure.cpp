@@ -1,5 +1,7 @@
 #include "QVSa/frame/Failure.h"
 
+#include <new>
+
 namespace QVSa {
 
 namespace {
@@ -42,5 +44,11 @@ String runtimeText(Long runtimeNumber) {
 }  // namespace
 
 Failure runtimeFailure(Long runtimeNumber) { return Failure(runtimeNumber, "QVSa", runtimeText(runtimeNumber)); }
+
+Failure asFailure(const std::exception& error) {
+  if (const auto* const failure = dynamic_cast<const Failure*>(&error)) return *failure;
+  if (dynamic_cast<const std::bad_alloc*>(&error) != nullptr) return runtimeFailure(number::memory);
+  return Failure(number::internal, "QVSa", error.what());
+}
 
 }  // namespace QVSa

@@ -69,4 +69,7 @@ constexpr Long keyExists = 457;
 // A run-time failure with its usual text: 6 "Overflow", 9 "Subscript out of range", 13 "Type mismatch" and so on.
 Failure runtimeFailure(Long runtimeNumber);
 
+// Whatever was caught, as a failure: one of ours as it is, 7 for want of memory, 51 for any other.
+Failure asFailure(const std::exception& error);
+
 }  // namespace QVSa

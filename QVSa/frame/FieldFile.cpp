@@ -22,8 +22,8 @@ Boolean reported(String& errText, Body body) {
   try {
     body();
     return true;
-  } catch (const Failure& failure) {
-    errText = failure.description();
+  } catch (const std::exception& error) {
+    errText = asFailure(error).description();
     platform::services().eventLog(errText);
     return false;
   }

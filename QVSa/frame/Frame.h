@@ -1,7 +1,6 @@
 #pragma once
 
 #include <initializer_list>
-#include <new>
 #include <utility>
 
 #include "QVSa/frame/Connection.h"
@@ -129,12 +128,8 @@ class Frame {
   void attempt(const Handler& handler, Body&& body) {
     try {
       body();
-    } catch (const Failure& failure) {
-      report(handler, failure);
-    } catch (const std::bad_alloc&) {
-      report(handler, runtimeFailure(number::memory));
     } catch (const std::exception& error) {
-      report(handler, Failure(number::internal, "QVSa", error.what()));
+      report(handler, asFailure(error));
     }
   }
   void report(const Handler& handler, const Failure& failure);

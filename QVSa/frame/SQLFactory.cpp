@@ -12,6 +12,8 @@ namespace {
 
 constexpr Long noSql = -1;
 
+String token(const String& name) { return "<" + name + ">"; }
+
 // A date goes into a statement in the one form that no server setting reads differently.
 String plainText(const Variant& value) { return value.isDate() ? value.toDate().sqlText() : value.toText(); }
 
@@ -45,12 +47,14 @@ String dateLiteral(const Variant& value, bool keepNull, bool escapeText) {
   return escapeText || value.isNull() ? "''" : "'" + plainText(value) + "'";
 }
 
-String listLiteral(const Variant& value) { return "N'" + replaceAll(sqlEscape(plainText(value)), ",", "',N'") + "'"; }
+String escaped(const String& text) { return sqlEscape(text, escapeSingle).toText(); }
+
+String listLiteral(const Variant& value) { return "N'" + replaceAll(escaped(plainText(value)), ",", "',N'") + "'"; }
 
 String textLiteral(const Variant& value, bool keepNull, bool escapeText) {
   const String text = value.isNull() ? String() : plainText(value);
   if (text.empty()) return keepNull ? "null" : "''";
-  return "N'" + (escapeText ? sqlEscape(text) : text) + "'";
+  return "N'" + (escapeText ? escaped(text) : text) + "'";
 }
 
 String literalOf(Long type, const Variant& value, bool keepNull, bool escapeText) {
@@ -87,12 +91,13 @@ Boolean SQLFactory::makeSql(String& sql, const String& nullParas) {
     if (sql.empty()) throw Failure(noSql, "SQLFactory", "have not sql of need replace.");
     for (const Parameter& parameter : parameters_) {
       const String literal = literalOf(parameter.type, parameter.value, parameter.keepNull, parameter.escapeText);
-      sql = replaceAll(sql, "<" + parameter.name + ">", literal);
+      sql = replaceAll(sql, token(parameter.name), literal);
     }
     if (nullParas.empty()) return true;
-    for (const String& name : split(nullParas, ',')) sql = replaceAll(sql, "<" + name + ">", "null");
+    for (const String& name : split(nullParas, ',')) sql = replaceAll(sql, token(name), "null");
     return true;
-  } catch (const Failure& failure) {
+  } catch (const std::exception& error) {
+    const Failure failure = asFailure(error);
     errNumber_ = failure.number();
     errDescription_ = failure.description();
     return false;
@@ -106,6 +111,12 @@ Date dayNumberToDate(double dayNumber) {
   return Date(std::max(whole, Date::empty().days()) + seconds / 86'400);
 }
 
-String sqlEscape(const String& value) { return replaceAll(trimRight(value), "'", "''"); }
+Variant sqlEscape(const Variant& value, Long mode) {
+  if (value.isNull() || value.isEmpty()) return value;
+  String text = trimRight(plainText(value));
+  if (mode != escapeDouble) text = replaceAll(text, "'", "''");
+  if (mode != escapeSingle) text = replaceAll(text, "\"", "\"\"");
+  return text;
+}
 
 }  // namespace QVSa

@@ -49,7 +49,10 @@ class SQLFactory {
 // below 2 has the date 1900-01-01.
 Date dayNumberToDate(double dayNumber);
 
-// `value` without trailing blanks, each "'" doubled.
-String sqlEscape(const String& value);
+// The quotes that sqlEscape doubles; any other code means both.
+enum EscapeMode : Long { escapeSingle = 1, escapeDouble = 2 };
+
+// The text of `value` without trailing blanks, the quotes of `mode` doubled. Null and Empty come back as they are.
+Variant sqlEscape(const Variant& value, Long mode);
 
 }  // namespace QVSa

@@ -85,6 +85,14 @@ TEST(SQLFactory, TextsAreQuotedAndTrailingBlanksCut) {
   EXPECT_EQ(literal(paraText, 0), "N'0'");
 }
 
+TEST(SQLFactory, TheQuotesOfAModeAreDoubledAndNothingStaysNothing) {
+  const String text = " a'b\"c ";
+  EXPECT_EQ(sqlEscape(text, escapeSingle), Variant(" a''b\"c"));
+  EXPECT_EQ(sqlEscape(text, escapeDouble), Variant(" a'b\"\"c"));
+  EXPECT_EQ(sqlEscape(text, 0), Variant(" a''b\"\"c"));
+  for (const Variant& nothing : {Variant(), Variant::null()}) EXPECT_EQ(sqlEscape(nothing, escapeSingle), nothing);
+}
+
 TEST(SQLFactory, DatesThatMeanNoneGoAsTheEmptyText) {
   for (const Date none : {Date(1900, 1, 1), Date(1900, 1, 2), Date(0.0)}) {
     EXPECT_EQ(literal(paraDate, none), "''");
