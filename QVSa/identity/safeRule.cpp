@@ -7,9 +7,6 @@
 namespace QVSa {
 namespace {
 
-// A bit column: any number but 0 is set.
-Boolean isSet(const Field& field) { return field.asLong() != 0; }
-
 // A flag as it goes into the statement: -1 or 0, which the column, a bit, reads as 1 or 0.
 String flag(Boolean value) { return text(value ? -1 : 0); }
 
@@ -25,10 +22,19 @@ Boolean safeRule::GetOne() {
   return operation(plain(), [&] {
     Connection connection = open();
     Recordset row = connection.Execute("select * from saferule where id=1");
-    if (!row.EOF_()) read(row);
+    if (row.EOF_()) {
+      clear();
+    } else {
+      read(row);
+    }
     loaded_ = true;
     return true;
   });
+}
+
+void safeRule::clear() {
+  minLen_ = maxDay_ = cycle_ = errTimes_ = sleepMinutes_ = 0;
+  caseMixed_ = numCharMixed_ = hasSpecialChar_ = lockExp_ = lockErr_ = awakeAuto_ = awakeManual_ = false;
 }
 
 void safeRule::read(Recordset& row) {
@@ -39,12 +45,12 @@ void safeRule::read(Recordset& row) {
   numCharMixed_ = rules[1] == '1';
   hasSpecialChar_ = rules[2] == '1';
   cycle_ = row["cycle"].asInteger();
-  lockExp_ = isSet(row["lockExp"]);
-  lockErr_ = isSet(row["lockErr"]);
+  lockExp_ = row["lockExp"].asBoolean();
+  lockErr_ = row["lockErr"].asBoolean();
   errTimes_ = row["errTimes"].asInteger();
-  awakeAuto_ = isSet(row["awa"]);
+  awakeAuto_ = row["awa"].asBoolean();
   sleepMinutes_ = row["sleepnn"].asInteger();
-  awakeManual_ = isSet(row["awm"]);
+  awakeManual_ = row["awm"].asBoolean();
 }
 
 Boolean safeRule::Save() {

@@ -44,7 +44,7 @@ class safeRule : private Frame {
   Boolean awakeManual() const { return awakeManual_; }
   void awakeManual(Boolean value) { awakeManual_ = value; }
 
-  // Loads the row. A missing one leaves the properties as they are and gives True.
+  // Loads the row. Where there is none, every property is 0 or False, and the result is True.
   Boolean GetOne();
   // Writes the row. With lockErr False it also unlocks every account that was locked.
   Boolean Save();
@@ -53,6 +53,7 @@ class safeRule : private Frame {
   Boolean checkPwd(const String& s);
 
  private:
+  void clear();
   void read(Recordset& row);
   String charSet() const;
   String missingCharacters(const String& s) const;

@@ -56,6 +56,18 @@ TEST_F(Passwords, ASaveKeepsTheHistoryToo) {
   EXPECT_EQ(tables_.text("select pwdDate from users where userId=2"), "2024-03-08 00:00:00");
 }
 
+TEST_F(Passwords, OfOneOnlyThePresentOneIsRefusedAndOfLessThanNoneEverySaveIs) {
+  savePolicy([](safeRule& rule) { rule.cycle(1); });
+  EXPECT_FALSE(change("right", "right"));
+  EXPECT_TRUE(change("right", "two"));
+  EXPECT_TRUE(change("two", "right"));
+  EXPECT_EQ(history().size(), 3U) << "no date is found behind which to cut it";
+  savePolicy([](safeRule& rule) { rule.cycle(-1); });
+  ann_.Pwd("three");
+  EXPECT_FALSE(ann_.Save());
+  EXPECT_EQ(ann_.errNumber(), number::statement);
+}
+
 TEST_F(Passwords, UnderANewNameThePasswordIsStoredAnewAndTheOldOnesReadNoMore) {
   EXPECT_TRUE(change("right", "two"));
   ann_.Name("王小明");
@@ -102,6 +114,10 @@ TEST_F(Passwords, APolicyWithoutARowIsMadeByItsFirstSave) {
   EXPECT_EQ(tables_.text("select * from saferule"), "1|6|0|001|0|0|-1|0|0|0|0");
   EXPECT_FALSE(rule.checkPwd("longer"));
   EXPECT_TRUE(rule.checkPwd("密码密码密码")) << "any other character will do";
+  tables_.run("delete from saferule");
+  EXPECT_TRUE(rule.GetOne());
+  EXPECT_EQ(rule.minLen(), 0);
+  EXPECT_FALSE(rule.lockErr() || rule.hasSpecialChar());
 }
 
 }  // namespace
