@@ -53,11 +53,11 @@ String Sessions::newSession(const String& userLogin, const String& computerName,
     Connection connection = open();
     connection.Execute(sql("insert into seslog(sesId,userLogin,computer,dbname,ip) values"
                            "(<sesId>,<userLogin>,<computer>,<dbName>,<ip>)")
-                           .text("sesId", id)
-                           .text("userLogin", userLogin)
-                           .text("computer", computerName.empty() ? platform::services().computerName() : computerName)
+                           .text("ip", ip)
                            .text("dbName", DBName)
-                           .text("ip", ip));
+                           .text("computer", computerName.empty() ? platform::services().computerName() : computerName)
+                           .text("userLogin", userLogin)
+                           .text("sesId", id));
     return id;
   });
 }

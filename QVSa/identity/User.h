@@ -112,10 +112,11 @@ class User : private Frame {
   // 0x8004046B the directory does not know him.
   Boolean GetOne(Integer keyName, const Variant& keyValue, Boolean chkPwd = false, const String& Pwd = "",
                  Boolean* wrongPwd = nullptr, Boolean authLd = false);
-  // Inserts or updates the user. Every save writes the password, restarts its validity and clears the date of a lock;
-  // the state is written as it stands here. `passPwdCheck` leaves out the policy and the history of passwords: pass
-  // True where the password is not new. 0x8004044E name or login empty, 0x80040460 the password was used before,
-  // 0x80040BB8 against the policy.
+  // Inserts or updates the user. Every save writes the password, restarts its validity and clears the date of a lock.
+  // The update of a locked user unlocks him; any other state, and that of a new user, is written as it stands here.
+  // `passPwdCheck` leaves out the policy and the history of passwords: pass True where the password is not new.
+  // 0x8004044E name or login empty, 0x80040460 the password was used before, 0x80040BB8 against the policy, 0x800A0BCD
+  // a new user's `deptId` is the number of no department.
   Boolean Save(Boolean passPwdCheck = false);
   // Deletes the user (0: this one). His jobs stay in the table.
   Boolean Delete(Long Id = 0);
@@ -176,9 +177,9 @@ class User : private Frame {
   Boolean updateUser();
   void findDepartment(Connection& connection);
   void insertRow(Connection& connection);
-  void updateRow(Connection& connection);
+  void updateRow(Connection& connection, Integer state);
   Long insertedId(Connection& connection);
-  void saveGroup(Connection& connection);
+  void saveGroup(Connection& connection, Long id);
   String storedPwd() const;
   Boolean pwdUsedBefore(Integer cycle, const String& Pwd = "");
   void pushPwdHistory(Integer cycle);

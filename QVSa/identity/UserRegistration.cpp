@@ -97,9 +97,9 @@ Boolean User::regAudit(Boolean pass, const String& desc, Long userId) {
                            .number("userId", id));
     connection.Execute(sql("update QVUserRegInfo set checkTime=<checkTime>,noPassReason=<noPassReason>"
                            " where userId=<userId>")
+                           .number("userId", id)
                            .date("checkTime", platform::services().localTime())
-                           .text("noPassReason", desc)
-                           .number("userId", id));
+                           .text("noPassReason", desc));
     connection.CommitTrans();
     Home home;
     home.connect(server(), DBName());

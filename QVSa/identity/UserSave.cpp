@@ -47,7 +47,7 @@ Boolean User::insertUser() {
   findDepartment(connection);
   connection.BeginTrans();
   insertRow(connection);
-  Id_ = insertedId(connection);
+  const Long id = insertedId(connection);
   if (!jobList_.empty()) {
     connection.Execute(sql("insert into userJob(userId,jobId)"
                            " select userId,jobId from users u,jobs j"
@@ -56,8 +56,10 @@ Boolean User::insertUser() {
                            jobList_ + ")")
                            .text("userName", Name_));
   }
-  saveGroup(connection);
+  saveGroup(connection, id);
   connection.CommitTrans();
+  // Not before: where the row is rolled back, another user may get its number.
+  Id_ = id;
   return true;
 }
 
@@ -71,12 +73,13 @@ void User::findDepartment(Connection& connection) {
   if (deptId_.empty()) deptId_ = "_root";
   if (deptInnerId_ != 0) return;
   Recordset row = connection.Execute(sql("select * from departments where deptNo=<deptNo>").text("deptNo", deptId_));
-  if (row.EOF_()) return;
   deptInnerId_ = row["deptId"].asLong();
   deptName_ = row["deptName"].asText();
   deptFullName_ = row["fullName"].asText();
 }
 
+// Numbers are filled in first, and last the texts that are never empty: a name or a log-in that looks like a token is
+// then stored as it stands, or the statement fails.
 void User::insertRow(Connection& connection) {
   connection.Execute(sql(" insert into users "
                          "( userName , userLogin , userPwd , deptId , mobilePhone , email , isAbstract , "
@@ -93,29 +96,29 @@ void User::insertRow(Connection& connection) {
                          "         <OTPTokenId> , "
                          "         <uType> , <domain> , <ldsName> , <ldDn> , <ipList> , <synLogin> "
                          ")")
-                         .text("userName", Name_)
-                         .text("userLogin", Login_)
-                         .secret("userPwd", storedPwd())
                          .number("deptId", deptInnerId_)
-                         .text("mobilePhone", MobilePhone_)
-                         .text("email", Email_)
                          .number("useSms", one(sendSms_))
                          .number("useKey", one(keyLogin_))
-                         .text("company", company_)
-                         .text("address", Address_)
-                         .text("zipcode", zipcode_)
-                         .text("Telephone", telePhone_)
                          .number("isOuter", one(isOuter_))
                          .number("accState", regState_)
                          .number("PwdNoChange", one(PwdNoChange_))
                          .number("useOTPAuth", one(useOTPAuth_))
-                         .text("OTPTokenId", OTPTokenId_)
                          .number("uType", uType_)
+                         .number("synLogin", one(synLogin_))
+                         .secret("userPwd", storedPwd())
+                         .text("mobilePhone", MobilePhone_)
+                         .text("email", Email_)
+                         .text("company", company_)
+                         .text("address", Address_)
+                         .text("zipcode", zipcode_)
+                         .text("Telephone", telePhone_)
+                         .text("OTPTokenId", OTPTokenId_)
                          .text("domain", Domain_)
                          .text("ldsName", ldsName_)
                          .text("ldDn", dn_)
                          .text("ipList", ipList_)
-                         .number("synLogin", one(synLogin_)));
+                         .text("userLogin", Login_)
+                         .text("userName", Name_));
 }
 
 Boolean User::updateUser() {
@@ -124,8 +127,8 @@ Boolean User::updateUser() {
   connection.Execute("set nocount on");
   connection.BeginTrans();
   // Saving a locked account unlocks it. One that waits for audit, or was refused there, stays what it is.
-  if (regState_ == 1) regState_ = 0;
-  updateRow(connection);
+  const Integer state = locked() ? Integer{0} : regState_;
+  updateRow(connection, state);
   if (!builtIn_) {
     connection.Execute("delete from userjob where userId=" + text(Id_));
     if (!jobList_.empty()) {
@@ -135,13 +138,14 @@ Boolean User::updateUser() {
           text(Id_) + ",jobId from jobs where jobId in (" + jobList_ + ")");
     }
   }
-  saveGroup(connection);
+  saveGroup(connection, Id_);
   connection.CommitTrans();
+  regState_ = state;
   return true;
 }
 
 // Writes the password at every save, as it is stored under the name. Leaves the account's type and domain alone.
-void User::updateRow(Connection& connection) {
+void User::updateRow(Connection& connection, Integer state) {
   connection.Execute(sql("update users set "
                          "userName=<userName>"
                          ",userLogin=<userLogin>"
@@ -164,33 +168,33 @@ void User::updateRow(Connection& connection) {
                          " , OTPTokenId = <OTPTokenId> "
                          " where userId=" +
                          text(Id_))
-                         .text("userName", Name_)
-                         .text("userLogin", Login_)
-                         .secret("userPwd", storedPwd())
                          .number("deptId", deptInnerId_)
+                         .number("isOuter", one(isOuter_))
+                         .number("accstate", state)
+                         .number("synLogin", one(synLogin_))
+                         .number("PwdNoChange", one(PwdNoChange_))
+                         .number("useOTPAuth", one(useOTPAuth_))
+                         .secret("userPwd", storedPwd())
                          .text("mobilePhone", MobilePhone_)
                          .text("email", Email_)
                          .text("company", company_)
                          .text("address", Address_)
                          .text("zipcode", zipcode_)
                          .text("Telephone", telePhone_)
-                         .number("isOuter", one(isOuter_))
-                         .number("accstate", regState_)
                          .text("ldsName", ldsName_)
                          .text("ldDn", dn_)
                          .text("ipList", ipList_)
-                         .number("synLogin", one(synLogin_))
-                         .number("PwdNoChange", one(PwdNoChange_))
-                         .number("useOTPAuth", one(useOTPAuth_))
-                         .text("OTPTokenId", OTPTokenId_));
+                         .text("OTPTokenId", OTPTokenId_)
+                         .text("userLogin", Login_)
+                         .text("userName", Name_));
 }
 
-void User::saveGroup(Connection& connection) {
-  connection.Execute("delete from grpUser where userId=" + text(Id_));
+void User::saveGroup(Connection& connection, Long id) {
+  connection.Execute("delete from grpUser where userId=" + text(id));
   if (grpName_.empty()) return;
   connection.Execute(sql("insert into grpUser(userId,gId)"
                          " select " +
-                         text(Id_) +
+                         text(id) +
                          ", gId from ItemGroups"
                          " where gName=<grpName>")
                          .text("grpName", grpName_));

@@ -62,7 +62,8 @@ std::string columnList(const std::vector<String>& names) {
 }
 
 std::string columnText(const tsql::ColumnDefinition& column, bool required) {
-  // The identity column is the row's key in the file; its numbers are never given twice.
+  // The identity column is the row's key in the file. The number of a deleted row never comes again, that of a row
+  // that was rolled back does.
   if (column.identity) return quoteName(column.name) + " integer primary key autoincrement";
   const bool unique = column.unique || column.primaryKey;
   return quoteName(column.name) + " " + storageType(typeOf(column.type)) + (required ? " not null" : "") +

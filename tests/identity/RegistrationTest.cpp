@@ -57,16 +57,16 @@ TEST_F(RegistrationTest, AnApplicantWaitsForTheAuditAndThenSignsOn) {
 
   clock_.set(Date(2024, 3, 8, 9, 30, 0));
   User loaded = this->loaded("ann");
-  ASSERT_TRUE(loaded.regAudit(false, "Not yet")) << loaded.errDescription();
+  ASSERT_TRUE(loaded.regAudit(false, "No <userId>")) << loaded.errDescription();
   EXPECT_EQ(tables_.text("select u.accstate,r.checkTime,r.noPassReason from users u,QVUserRegInfo r"
                          " where u.userId=r.UserId"),
-            "3|2024-03-08 09:30:00|Not yet");
+            "3|2024-03-08 09:30:00|No <userId>");
   EXPECT_EQ(failedSignOn(), messageNumber(1118));
 
   ASSERT_TRUE(loaded.regAudit(true));
   EXPECT_EQ(failedSignOn(), 0);
   EXPECT_EQ(tables_.rows("select emTo,emSubject,emBody from QVMailQ where emTo='ann@example.org' order by emId"),
-            (test::Lines{"ann@example.org|Your application|Sorry.\r\nNot yet",
+            (test::Lines{"ann@example.org|Your application|Sorry.\r\nNo <userId>",
                          "ann@example.org|Your application|Welcome.\r\n"}));
 }
 

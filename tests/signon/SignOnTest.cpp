@@ -1,8 +1,10 @@
 #include <fstream>
+#include <limits>
 #include <sstream>
 
 #include "platform/SecretMessage.h"
 #include "platform/Services.h"
+#include "tests/support/Failures.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
 
@@ -217,8 +219,12 @@ TEST_F(SignOn, ALockLastsUntilTheUserIsSavedOrThePolicyLocksNoMore) {
   EXPECT_EQ(annsState(), "0|1|2024-03-07 10:00:00") << "the right password takes back the count alone";
 
   User saved = loaded("ann");
+  saved.setJobs("1,");
+  EXPECT_FALSE(saved.Save(true));
   EXPECT_TRUE(saved.locked());
+  saved.setJobs("");
   EXPECT_TRUE(saved.Save(true));
+  EXPECT_FALSE(saved.locked());
   EXPECT_EQ(annsState(), "0|0|-");
   EXPECT_TRUE(signOn());
 
@@ -261,6 +267,10 @@ TEST_F(SignOn, ADigestIsComparedInEitherCaseAndNeverCounted) {
   EXPECT_EQ(user.errDescription(), "Invalid password.");
   changeAnn("accstate=1");
   EXPECT_TRUE(user.loginAuth_1("ann", digest)) << "the digest alone is asked";
+
+  addUser("wide", [](User& wide) { wide.Pwd("密"); });
+  EXPECT_EQ(test::failureOf([&] { signOn({.login = "wide", .level = 1}); }), number::overflow);
+  EXPECT_EQ(test::failureOf([&] { user.loginAuth_1("wide", digest); }), number::overflow);
 }
 
 TEST_F(SignOn, WhereTheHostVouchesOnlyThePasswordIsNotAsked) {
@@ -289,6 +299,12 @@ TEST_F(SignOn, APasswordLastsForTheDaysOfThePolicyFromItsLastChange) {
   EXPECT_TRUE(user_.chgPwd("right", "other")) << user_.errDescription();
   EXPECT_TRUE(signOn({.password = "other"}));
   EXPECT_EQ(user_.validDay(), 30);
+
+  changeAnn("pwdDate=null");
+  EXPECT_TRUE(signOn({.password = "other"}));
+  EXPECT_EQ(user_.errNumber(), messageNumber(1119));
+  EXPECT_EQ(user_.validDay(), std::numeric_limits<Integer>::min()) << "as far as the number goes";
+  EXPECT_EQ(session_, "");
 
   savePolicy([](safeRule& rule) { rule.maxDay(0); });
   EXPECT_TRUE(signOn({.password = "other"}));

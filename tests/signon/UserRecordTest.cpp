@@ -52,6 +52,16 @@ TEST_F(UserRecord, WhatASaveWroteALoadFinds) {
   EXPECT_EQ(ann.errDescription(), "User does not exist.");
 }
 
+TEST_F(UserRecord, ANameThatLooksLikeATokenIsKept) {
+  addUser("<deptId>", [](User& user) { user.Name("<ipList>"); });
+  User user = loaded("<deptId>");
+  EXPECT_EQ(user.Name(), "<ipList>");
+  user.Name("<isOuter>");
+  user.Login("<company>");
+  EXPECT_TRUE(user.Save());
+  EXPECT_EQ(loaded("<company>").Name(), "<isOuter>");
+}
+
 TEST_F(UserRecord, TheOrganisationIsTheDepartmentItselfOrTheNearestAbove) {
   for (const auto& [id, super, isOrg] : {std::tuple("A", "_root", true), {"B", "A", false}, {"C", "B", true}}) {
     auto department = connected<Department>();
@@ -97,6 +107,11 @@ TEST_F(UserRecord, ARefusedSaveWritesNothing) {
   EXPECT_FALSE(second.Save());
   EXPECT_EQ(second.errDescription(), "Incomplete input, please reenter user name and account name.");
   second.Name("Second");
+  second.Login("second");
+  second.deptId("nowhere");
+  EXPECT_FALSE(second.Save());
+  EXPECT_EQ(second.errNumber(), number::noRow) << "no department to put him in";
+  second.deptId("");
   second.Login("ANN ");
   EXPECT_FALSE(second.Save());
   EXPECT_EQ(second.errNumber(), number::integrity) << "log-ins are unique without regard to case";
@@ -106,7 +121,13 @@ TEST_F(UserRecord, ARefusedSaveWritesNothing) {
   second.setJobs("1");
   EXPECT_FALSE(second.Save());
   EXPECT_EQ(second.errNumber(), number::integrity);
+  EXPECT_EQ(second.Id(), 0);
   EXPECT_EQ(tables_.text("select count(*) from users"), "2");
+  addUser("third");
+  second.setJobs("");
+  EXPECT_TRUE(second.Save());
+  EXPECT_EQ(loaded("ann2").Id(), second.Id()) << "stored, and not in the place of the third";
+  EXPECT_EQ(loaded("third").Name(), "Third");
 
   User ann = loaded("ann");
   ann.Name("Other");
