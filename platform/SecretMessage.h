@@ -10,9 +10,11 @@ namespace QVSa::platform {
 // The text in a new message, by DES, with a fresh iv and salt. The empty text on any failure.
 String encryptText(const String& plain, const String& secret);
 
-// The text of a message of any algorithm that the form knows. The empty text for an empty message, a broken one, a
-// wrong secret (there is no check value: a wrong secret gives some other text about once in 256 times), or an algorithm
-// that this machine's OpenSSL lacks.
+// The text of a message of any algorithm that the form knows. The empty text for an empty message, a broken one, an
+// algorithm that this machine's OpenSSL lacks, or a wrong secret, as far as that shows. There is no check value: a
+// wrong secret passes a block cipher's padding about once in 256 times. RC4 has no padding, so there it gives some
+// other text wherever no surrogate breaks, which is most short ones; at 40 bits, where two keys are tried, the first
+// one then hides the second.
 String decryptText(const String& cipher, const String& secret);
 
 // MD5 of the text in the system's ANSI code page (see CodePage.h), as 32 hexadecimal digits in upper case. Throws

@@ -4,6 +4,8 @@
 
 namespace QVSa {
 
+Password::Password(String&& text) : text_(text) { platform::clearSecret(text); }
+
 Password::~Password() { platform::clearSecret(text_); }
 
 Password& Password::operator=(const Password& other) {

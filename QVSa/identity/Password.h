@@ -1,7 +1,5 @@
 #pragma once
 
-#include <utility>
-
 #include "QVSa/frame/Values.h"
 
 namespace QVSa {
@@ -10,7 +8,9 @@ namespace QVSa {
 class Password {
  public:
   Password() = default;
-  explicit Password(String text) : text_(std::move(text)) {}
+  explicit Password(const String& text) : text_(text) {}
+  // Overwrites `text`. A short one lies inside the string itself, where a plain move would leave it.
+  explicit Password(String&& text);
   ~Password();
   Password(const Password& other) = default;
   Password& operator=(const Password& other);

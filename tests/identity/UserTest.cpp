@@ -102,6 +102,15 @@ class UserTest : public ::testing::Test {
   String session_;
 };
 
+TEST_F(UserTest, APasswordClearsTheTextThatIsHandedOverToIt) {
+  String given = "secret";
+  EXPECT_EQ(Password(given).text(), "secret");
+  EXPECT_EQ(given, "secret");
+  const char* const memory = given.data();
+  EXPECT_EQ(Password(std::move(given)).text(), "secret");
+  EXPECT_EQ(String(memory, 6), String(6, '\0'));
+}
+
 TEST_F(UserTest, TheIdCanBeSetOnce) {
   User user;
   user.Id(3);
@@ -264,10 +273,14 @@ TEST_F(UserTest, AnInsertTakesTheRootForNoDepartmentAndKeepsThePasswordUnderTheN
 
   server_.answer("select * from departments where deptNo=N'_root'",
                  {{{"deptId"}, {"deptName"}, {"fullName"}}, {{Long{1}, "Group", "Group"}}});
-  answer("select scope_identity()", "", {Long{8}});
   added.Name("Ben O'Hara");
   added.Login("ben");
   added.Pwd("secret");
+  answer("select scope_identity()", "", {});
+  EXPECT_FALSE(added.Save(true));
+  EXPECT_EQ(added.errNumber(), messageNumber(1103));
+  EXPECT_FALSE(sent("commit"));
+  answer("select scope_identity()", "", {Long{8}});
   added.setJobs("1,4");
   added.grpName("one");
   server_.log.clear();
@@ -275,8 +288,8 @@ TEST_F(UserTest, AnInsertTakesTheRootForNoDepartmentAndKeepsThePasswordUnderTheN
   EXPECT_EQ(added.Id(), 8);
   EXPECT_EQ(added.deptId(), "_root");
 
-  ASSERT_EQ(server_.log.size(), 11U);
-  const String& insert = server_.log[4];
+  ASSERT_EQ(server_.log.size(), 10U);
+  const String& insert = server_.log[3];
   const String start =
       " insert into users ( userName , userLogin , userPwd , deptId , mobilePhone , email , isAbstract , "
       " isRole , useSms , useKey , company , address , zipcode , Telephone , isOuter , accState "
@@ -289,7 +302,7 @@ TEST_F(UserTest, AnInsertTakesTheRootForNoDepartmentAndKeepsThePasswordUnderTheN
             "' ,          1 , '' , '' , 0 , 0 , 0 , 0 ,          '' , '' , '' , '' , 0 , 0 ,          0 ,          0 , "
             "         '' ,          0 , '' , '' , '' , '' , 0 )");
   EXPECT_EQ(
-      Log(server_.log.begin() + 5, server_.log.end()),
+      Log(server_.log.begin() + 4, server_.log.end()),
       (Log{"select scope_identity()",
            "insert into userJob(userId,jobId) select userId,jobId from users u,jobs j"
            " where u.userName=N'Ben O''Hara' and u.isRole=0 and jobId in (1,4)",
