@@ -12,6 +12,14 @@ using test::failureOf;
 using test::FakeServer;
 using Log = std::vector<String>;
 
+// clearSessions is for the library alone; an explicit instantiation may name it all the same.
+template <auto Operation>
+struct Reach {
+  friend Boolean clearSessions(Sessions& sessions, const String& id) { return (sessions.*Operation)(id); }
+};
+Boolean clearSessions(Sessions& sessions, const String& id);
+template struct Reach<&Sessions::clearSessions>;
+
 const Failure unreachable(number::general, "server", "no server.");
 
 class SessionsTest : public ::testing::Test {
@@ -68,6 +76,17 @@ TEST_F(SessionsTest, WithoutAnApplicationDatabaseTheSessionGoesAndItsNumbersDoNo
   EXPECT_FALSE(sessions_.Terminate("s1"));
   EXPECT_EQ(sessions_.errDescription(), LoadResString(1603) + "no table.");
   EXPECT_EQ(server_.log, (Log{"open", "delete from seslog where sesId=N's1'", release, "close"}));
+}
+
+TEST_F(SessionsTest, AllCanBeEndedOrAllButOne) {
+  sessions_.connect("host");
+  server_.log.clear();
+  server_.fail("delete from seslog", unreachable);
+  EXPECT_TRUE(clearSessions(sessions_, "s1"));
+  EXPECT_FALSE(clearSessions(sessions_, ""));
+  EXPECT_EQ(sessions_.errDescription(), LoadResString(1603) + "no server.");
+  EXPECT_EQ(server_.log,
+            (Log{"open", "delete from seslog where sesId<>N's1'", "close", "open", "delete from seslog", "close"}));
 }
 
 TEST_F(SessionsTest, ActivityIsMarkedForASessionThatIsThereAndRefusedInSilenceOtherwise) {

@@ -3,8 +3,10 @@
 #include <set>
 
 #include "QVSa/frame/Failure.h"
+#include "QVSa/frame/Text.h"
 #include "QVSa/resources/MessageTable.h"
 #include "QVSa/resources/Messages.h"
+#include "platform/SecretMessage.h"
 #include "tests/support/EnvironmentLocale.h"
 
 namespace QVSa {
@@ -14,19 +16,12 @@ constexpr Language allLanguages[] = {Language::english, Language::simplifiedChin
 
 TEST(Messages, KeepTheirEnglishTextsWithAllOddities) {
   const auto english = [](Long id) { return LoadResString(id, Language::english); };
-  EXPECT_EQ(messageIds.size(), 136U);
-  EXPECT_EQ(english(47), " (First Six Months)");
   EXPECT_EQ(english(205), "The error SQL statement  is:");
-  EXPECT_EQ(english(1005), "-");
   EXPECT_EQ(english(1117), "Error in listing users");
-  EXPECT_EQ(english(1507),
-            "Sequential number @ has  @ digits, max number is @ currently, new number can not be generated. Please "
-            "reset auto number settings to expand digits.");
-  EXPECT_EQ(english(1707), "Compter");
   EXPECT_EQ(english(1800), "Parameter is incompelte, name of user group is not assigned. ");
-  EXPECT_EQ(english(3001), "The length of password is less than @ .");
-  EXPECT_EQ(english(3003), "Password should include number and letters at samee time.");
-  EXPECT_EQ(english(33302), "Error in reading operation");
+  String all;
+  for (const Long id : messageIds) all += text(id) + "=" + english(id) + "\n";
+  EXPECT_EQ(platform::md5Hex(all), "F70BBF919D577737DEEF98E107BAF0FF") << "of the texts as hosts know them";
 }
 
 TEST(Messages, HaveTheSamePlacesInEveryLanguage) {
