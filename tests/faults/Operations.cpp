@@ -176,6 +176,7 @@ void addUser(const String& server, const String& login) {
   user.Pwd("right");
   user.setJobs("1,2");
   user.grpName("two");
+  user.deptId("O");
   require(user.Save());
 }
 
