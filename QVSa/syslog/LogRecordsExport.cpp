@@ -5,7 +5,7 @@
 namespace QVSa {
 namespace {
 
-constexpr std::size_t blockSize = 64 * 1024;
+constexpr std::size_t blockSize = 65'536;
 
 String typeCondition(const Long* type) {
   return type != nullptr && *type >= 1 && *type <= 3 ? " where LogType =" + text(*type) : "";
