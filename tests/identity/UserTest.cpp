@@ -118,17 +118,6 @@ TEST_F(UserTest, TheIdCanBeSetOnce) {
   EXPECT_EQ(user.Id(), 3);
 }
 
-TEST_F(UserTest, ALoadFillsRolesGroupsAndTheOrganisation) {
-  ann_["isOrg"] = Integer{1};
-  signOn("right");
-  EXPECT_TRUE(user_.isDeptadmin());
-  EXPECT_TRUE(user_.isOwner());
-  EXPECT_FALSE(user_.isAdministrator());
-  EXPECT_EQ(user_.grpName(), "one,two");
-  EXPECT_EQ(user_.orgId(), user_.deptId());
-  EXPECT_TRUE(sent("update users set lgts=0 where userId=5"));
-}
-
 TEST_F(UserTest, ADomainAccountIsCountedAsAWrongPasswordWhereNoPackageAnswers) {
   ann_["uType"] = Integer{adUser};
   replace(&platform::Services::ntlmLogon, {});
@@ -190,33 +179,6 @@ TEST_F(UserTest, ADirectoryAccountIsBoundAndMovesNoCounter) {
   EXPECT_EQ(asked.back(), "box:636 cn=service abc cn=service");
   replace(&platform::Services::getUsersFromLD, {});
   EXPECT_FALSE(signOn("theirs")) << "no package";
-}
-
-TEST_F(UserTest, TheWrongPasswordThatReachesTheLimitIsReportedAsALock) {
-  EXPECT_FALSE(signOn("wrong"));
-  EXPECT_EQ(user_.errNumber(), messageNumber(1106));
-  answerPolicy(0, true);
-  EXPECT_FALSE(signOn("wrong"));
-  EXPECT_EQ(user_.errNumber(), messageNumber(1118));
-  EXPECT_TRUE(user_.locked());
-
-  ann_["accstate"] = Integer{2};
-  EXPECT_FALSE(signOn("right")) << "waiting for audit";
-  EXPECT_EQ(user_.errNumber(), messageNumber(1118));
-}
-
-TEST_F(UserTest, AnExpiredPasswordSignsOnWithoutASession) {
-  answerPolicy(6, false);
-  session_ = "left over";
-  EXPECT_TRUE(signOn("right"));
-  EXPECT_EQ(user_.errNumber(), messageNumber(1119));
-  EXPECT_EQ(user_.validDay(), 0);
-  EXPECT_EQ(session_, "");
-
-  answerPolicy(7, false);
-  signOn("right");
-  EXPECT_EQ(user_.validDay(), 1);
-  EXPECT_NE(user_.errNumber(), messageNumber(1119)) << "one day is left";
 }
 
 TEST_F(UserTest, AChangedPasswordJoinsTheHistoryBehindTheOldestThatIsKept) {

@@ -8,13 +8,6 @@ namespace {
 
 constexpr Long againstPolicy = messageNumber(3000);
 
-TEST(SafeRule, WithoutAnyRuleEveryTextPasses) {
-  safeRule rule;
-  EXPECT_TRUE(rule.checkPwd(""));
-  EXPECT_TRUE(rule.checkPwd("abc"));
-  EXPECT_EQ(rule.errDescription(), "");
-}
-
 TEST(SafeRule, TheLengthCountsCharactersAndNotBytes) {
   safeRule rule;
   rule.minLen(6);
