@@ -78,8 +78,8 @@ void User::findDepartment(Connection& connection) {
   deptFullName_ = row["fullName"].asText();
 }
 
-// Numbers are filled in first, and last the texts that are never empty: a name or a log-in that looks like a token is
-// then stored as it stands, or the statement fails.
+// Numbers and the password are filled in first, and last the texts that are never empty: a name or a log-in that looks
+// like a token is then stored as it stands, or the statement fails.
 void User::insertRow(Connection& connection) {
   connection.Execute(sql(" insert into users "
                          "( userName , userLogin , userPwd , deptId , mobilePhone , email , isAbstract , "

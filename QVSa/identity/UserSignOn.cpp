@@ -139,7 +139,7 @@ void User::writePwd(const String& newPwd) {
                          "userPwd=<pwd>,pwddate=getdate() "
                          " where userId=" +
                          text(Id_))
-                         .text("pwd", platform::encryptText(newPwd, Name_)));
+                         .secret("pwd", platform::encryptText(newPwd, Name_)));
 }
 
 Boolean User::chkRegPwd(const String&) { return true; }

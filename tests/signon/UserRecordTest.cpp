@@ -56,10 +56,10 @@ TEST_F(UserRecord, ANameThatLooksLikeATokenIsKept) {
   addUser("<deptId>", [](User& user) { user.Name("<ipList>"); });
   User user = loaded("<deptId>");
   EXPECT_EQ(user.Name(), "<ipList>");
-  user.Name("<isOuter>");
-  user.Login("<company>");
-  EXPECT_TRUE(user.Save());
-  EXPECT_EQ(loaded("<company>").Name(), "<isOuter>");
+  user.Name("<userPwd>");
+  user.Login("<isOuter>");
+  EXPECT_TRUE(user.Save()) << user.errDescription();
+  EXPECT_EQ(loaded("<isOuter>").Name(), "<userPwd>") << "nor does the stored password come into a text";
 }
 
 TEST_F(UserRecord, TheOrganisationIsTheDepartmentItselfOrTheNearestAbove) {
