@@ -105,8 +105,11 @@ TEST(Login, ThePasswordHasToBeRightEachTime) {
     }
   }
   // A password that was right is not right any more once it was changed.
-  handle->execute(
-      "update master.logins set digest=(select digest from master.logins where name='QVUser') where name='sa'");
+  {
+    const CatalogueChange change(handle->mark());
+    handle->execute(
+        "update master.logins set digest=(select digest from master.logins where name='QVUser') where name='sa'");
+  }
   EXPECT_EQ(failureOf([&] { checkLogin(*handle, "sa", "sa-password"); }).native(), 18456);
 }
 

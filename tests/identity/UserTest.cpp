@@ -216,7 +216,8 @@ TEST_F(UserTest, AnApplicantWithoutHisRowOfExtraDataIsDeletedAgain) {
   applicant.connect("host");
   applicant.Name("Ben");
   applicant.Login("ben");
-  server_.answer("select * from departments where deptNo=N'_root'", {{{"deptId"}}, {}});
+  server_.answer("select * from departments where deptNo=N'_root'",
+                 {{{"deptId"}, {"deptName"}, {"fullName"}}, {{Long{1}, "Us", "Us"}}});
   answer("select scope_identity()", "", {Long{8}});
   answer("select * from QVUserRegInfo where userId=8", "UserId", {});
   EXPECT_FALSE(applicant.Reg());
