@@ -4,34 +4,13 @@
 #include <fcntl.h>
 #include <unistd.h>
 
-#include "QVSa/frame/Failure.h"
 #include "platform/Files.h"
-#include "platform/Folders.h"
+#include "platform/SystemFailure.h"
 
 namespace QVSa::platform {
 
-namespace {
-
-[[noreturn]] void fail(const String& path) {
-  switch (errno) {
-    case ENOENT: {
-      const auto folder = localPath(path).parent_path();
-      throw runtimeFailure(folder.empty() || folderExists(folder.string()) ? number::noFile : number::noPath);
-    }
-    case ENOTDIR:
-      throw runtimeFailure(number::noPath);
-    case EACCES:
-    case EPERM:
-      throw runtimeFailure(number::accessDenied);
-    default:
-      throw runtimeFailure(number::pathAccess);
-  }
-}
-
-}  // namespace
-
 FileReader::FileReader(const String& path) : handle_(::open(localPath(path).c_str(), O_RDONLY | O_CLOEXEC)) {
-  if (handle_ < 0) fail(path);
+  if (handle_ < 0) throw fileFailure(errno, localPath(path));
 }
 
 FileReader::~FileReader() { ::close(handle_); }

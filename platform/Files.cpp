@@ -9,7 +9,7 @@
 #include <unistd.h>
 #include <utility>
 
-#include "QVSa/frame/Failure.h"
+#include "platform/SystemFailure.h"
 
 namespace QVSa::platform {
 
@@ -31,25 +31,7 @@ class Descriptor {
   int handle_;
 };
 
-bool folderExists(const std::filesystem::path& file) {
-  std::error_code ignored;
-  return !file.has_parent_path() || std::filesystem::is_directory(file.parent_path(), ignored);
-}
-
-[[noreturn]] void fail(const std::filesystem::path& path) {
-  switch (errno) {
-    case ENOENT:
-      throw runtimeFailure(folderExists(path) ? number::noFile : number::noPath);
-    case ENOTDIR:
-      throw runtimeFailure(number::noPath);
-    case EACCES:
-    case EPERM:
-    case EROFS:
-      throw runtimeFailure(number::accessDenied);
-    default:
-      throw runtimeFailure(number::pathAccess);
-  }
-}
+[[noreturn]] void fail(const std::filesystem::path& file) { throw fileFailure(errno, file); }
 
 std::filesystem::path nameBeside(const std::filesystem::path& target) {
   std::random_device random;

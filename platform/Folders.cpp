@@ -6,8 +6,8 @@
 #include <sys/stat.h>
 #include <system_error>
 
-#include "QVSa/frame/Failure.h"
 #include "platform/Files.h"
+#include "platform/SystemFailure.h"
 
 namespace QVSa::platform {
 
@@ -15,28 +15,11 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr Long fileExistsAlready = 58;
 // Backups hold what the database holds: no access for others.
 constexpr mode_t folderMode = S_IRWXU | S_IRWXG;
 
-[[noreturn]] void fail(int code) {
-  switch (code) {
-    case EEXIST:
-      throw runtimeFailure(fileExistsAlready);
-    case ENOENT:
-    case ENOTDIR:
-      throw runtimeFailure(number::noPath);
-    case EACCES:
-    case EPERM:
-    case EROFS:
-      throw runtimeFailure(number::accessDenied);
-    default:
-      throw runtimeFailure(number::pathAccess);
-  }
-}
-
 void require(const std::error_code& error) {
-  if (error) fail(error.value());
+  if (error) throw folderFailure(error.value());
 }
 
 std::vector<String> namesIn(const String& path, fs::file_type type) {
@@ -64,7 +47,7 @@ bool folderExists(const String& path) {
 }
 
 void makeFolder(const String& path) {
-  if (::mkdir(localPath(path).c_str(), folderMode) != 0) fail(errno);
+  if (::mkdir(localPath(path).c_str(), folderMode) != 0) throw folderFailure(errno);
 }
 
 std::vector<String> foldersIn(const String& path) { return namesIn(path, fs::file_type::directory); }
