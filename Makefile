@@ -31,14 +31,14 @@ demo: packages  ## Make an installation, fill it with an organisation, walk the 
 test: build  ## Build and run all tests, then the quick ones once more under the sanitizers
 	$(say) 'Testing'
 	@ctest --preset release
-	@$(MAKE) sanitize
+	@$(MAKE) sanitize BUILD='--target quick_tests' TESTS='-LE slow'
 
-sanitize: packages  ## Run the quick tests under the address and undefined behaviour sanitizers (build/sanitize)
+sanitize: packages  ## Run all tests under the address and undefined behaviour sanitizers (build/sanitize)
 	$(say) 'Building with the sanitizers (build/sanitize)'
 	@cmake --preset sanitize --log-level=NOTICE
-	@cmake --build --preset sanitize -j $(JOBS)
+	@cmake --build --preset sanitize -j $(JOBS) $(BUILD)
 	$(say) 'Testing with the sanitizers'
-	@ctest --preset sanitize -LE slow
+	@ctest --preset sanitize $(TESTS)
 
 bench: packages  ## Run the benchmarks, each operation beside its floor (build/bench)
 	$(say) 'Building the benchmarks (build/bench)'
