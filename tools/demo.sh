@@ -50,6 +50,12 @@ echo "== The system log and the report classes =="
 "$programs/examples/log_and_classes" "$QVSA_SERVER" "$PWD/$folder/log.txt"
 
 echo
+echo "== A backup, and a plan for those to come =="
+mkdir "$folder/backups"
+"$programs/console/qvsa" backup now "$PWD/$folder/backups"
+"$programs/console/qvsa" plan add Nightly "$PWD/$folder/backups" --at 02:00 --keep 14
+
+echo
 echo "== What the console sees now =="
 "$programs/console/qvsa" role list
 echo
