@@ -52,6 +52,7 @@ Answer add(const Console& console, const Options& options) {
 
 String innerIds(const Console& console, const std::vector<String>& numbers) {
   std::vector<String> ids;
+  ids.reserve(numbers.size());
   for (const String& number : numbers) ids.push_back(text(departmentOf(console, number).InnerId()));
   return join(ids, ",");
 }
