@@ -20,7 +20,7 @@ struct Report {
   bool silent = false;
   Long number = 0;      // in place of the failure's
   bool goesOn = false;  // the operation does all the rest, and so writes
-  String suffix = "";
+  String suffix{};
 };
 
 struct Operation {

@@ -26,7 +26,7 @@ class Backups : public Scene {
   Boolean restore(const String& where) { return manager_.RestoreDB(where, file("sys.bak"), file("app.bak"), password); }
   void damage(const String& name) const {
     Bytes content = platform::readFile(file(name));
-    std::fill_n(content.begin() + 5 * 4096, 4000, std::uint8_t{0x5A});
+    std::fill_n(content.begin() + std::ptrdiff_t{5} * 4096, 4000, std::uint8_t{0x5A});
     platform::writeFile(file(name), content);
   }
   void addReports() { tables_.run("insert into reports(repId,repName) select 3,'a' union all select 5,'b'"); }
