@@ -1,0 +1,58 @@
+#include "platform/OpenSsl.h"
+
+#include <cerrno>
+#include <memory>
+#include <openssl/crypto.h>
+#include <openssl/evp.h>
+#include <openssl/provider.h>
+
+#include "QVSa/frame/Failure.h"
+
+namespace QVSa::platform {
+
+namespace {
+
+template <auto release>
+struct Free {
+  template <typename Object>
+  void operator()(Object* object) const {
+    release(object);
+  }
+};
+using Context = std::unique_ptr<OSSL_LIB_CTX, Free<OSSL_LIB_CTX_free>>;
+using Cipher = std::unique_ptr<EVP_CIPHER, Free<EVP_CIPHER_free>>;
+using Digest = std::unique_ptr<EVP_MD, Free<EVP_MD_free>>;
+using Mac = std::unique_ptr<EVP_MAC, Free<EVP_MAC_free>>;
+
+// DES lives without it; the other old ciphers do not. Want of memory may read as want of the module.
+bool loadLegacy(OSSL_LIB_CTX* library) {
+  errno = 0;
+  if (OSSL_PROVIDER_load(library, "legacy") != nullptr) return true;
+  return errno != ENOMEM && ERR_GET_REASON(ERR_peek_last_error()) != ERR_R_MALLOC_FAILURE;
+}
+
+// The first fetch of each kind reads lists that go with OpenSSL's own end.
+bool fetchEachKind(OSSL_LIB_CTX* library) {
+  return Cipher(EVP_CIPHER_fetch(library, "DES-EDE3-CBC", nullptr)) &&
+         Digest(EVP_MD_fetch(library, "SHA2-256", nullptr)) && Mac(EVP_MAC_fetch(library, "HMAC", nullptr));
+}
+
+OSSL_LIB_CTX* makeLibrary() {
+  const OpenSslErrorsKept kept;
+  if (OPENSSL_init_crypto(0, nullptr) != 1)
+    throw Failure(number::internal, "QVSa", "OpenSSL could not start, or has ended with the program.");
+  Context library(OSSL_LIB_CTX_new());
+  const bool made = library && OSSL_PROVIDER_load(library.get(), "default") != nullptr && loadLegacy(library.get()) &&
+                    fetchEachKind(library.get());
+  if (!made) throw runtimeFailure(number::memory);
+  return library.release();
+}
+
+}  // namespace
+
+OSSL_LIB_CTX* openSslLibrary() {
+  static OSSL_LIB_CTX* const library = makeLibrary();
+  return library;
+}
+
+}  // namespace QVSa::platform
