@@ -1,17 +1,23 @@
 #include "QVSa/frame/Frame.h"
 
+#include <algorithm>
+
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/resources/Messages.h"
 
 namespace QVSa {
 namespace {
 
-// What is quoted of a secret may be its beginning only, as far as a parser read it as one word.
+// A server quotes any piece of a statement, cut at either end: the text ends before the first piece of a secret in it.
 String withoutSecrets(String description, const std::vector<String>& secrets) {
-  constexpr std::size_t telling = 4;
+  constexpr std::size_t telling = 6;
   for (const String& secret : secrets) {
-    const std::size_t at = secret.empty() ? String::npos : description.find(secret.substr(0, telling));
-    if (at != String::npos) description = description.substr(0, at) + "***";
+    const std::size_t length = std::min(telling, secret.size());
+    for (std::size_t at = 0; length > 0 && at + length <= description.size(); ++at) {
+      if (secret.find(description.substr(at, length)) == String::npos) continue;
+      description = description.substr(0, at) + "***";
+      break;
+    }
   }
   return description;
 }
@@ -51,7 +57,6 @@ Handler silent() {
 Statement::Statement(SQLFactory& factory, std::vector<String>& secrets, String text)
     : factory_(factory), secrets_(secrets), text_(std::move(text)) {
   factory_.Clear();
-  secrets_.clear();
 }
 
 Statement& Statement::number(const String& name, const Variant& value) {
@@ -79,11 +84,12 @@ Statement& Statement::list(const String& name, const String& value) {
   return *this;
 }
 
-// A failed replacement is not reported here: the statement goes as it stands and fails in the database.
-Statement::operator String() {
-  factory_.makeSql(text_, "");
-  return text_;
+Statement& Statement::raw(const String& name, const String& value) {
+  factory_.AddPara(name, paraVerbatim, value, false, true);
+  return *this;
 }
+
+Statement::operator String() const { return factory_.fill(text_); }
 
 Boolean Frame::connect(const String& server, const String& DBName) {
   server_ = server;

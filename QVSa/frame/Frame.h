@@ -30,19 +30,21 @@ Handler prefixedBlank(Long messageId, const std::vector<Variant>& fill = {});
 // Nothing is reported; the result alone tells.
 Handler silent();
 
-// A statement text whose tokens are filled by the object's factory, with the usual flags: an empty text goes as an
-// empty text and not as NULL, trailing blanks are cut.
+// A statement text whose tokens are filled by the object's factory, in one pass and with the usual flags: an empty text
+// goes as an empty text and not as NULL, trailing blanks are cut. Throws Failure for a value that has no literal.
 class Statement {
  public:
   Statement(SQLFactory& factory, std::vector<String>& secrets, String text);
   Statement& number(const String& name, const Variant& value);
   Statement& text(const String& name, const Variant& value);
-  // A password as it is stored. A server may quote a piece of the statement: the object's error text then ends before
-  // the password.
+  // A password as it is stored. A server may quote a piece of it, now or in a later statement of the operation: the
+  // object's error text then ends before that piece.
   Statement& secret(const String& name, const String& value);
   Statement& date(const String& name, const Variant& value);
   Statement& list(const String& name, const String& value);
-  operator String();
+  // SQL of the caller's own: a list of ids, a part of a condition. It goes into the statement as it is.
+  Statement& raw(const String& name, const String& value);
+  operator String() const;
 
  private:
   SQLFactory& factory_;
@@ -126,11 +128,14 @@ class Frame {
  private:
   template <class Body>
   void attempt(const Handler& handler, Body&& body) {
+    // One operation may call another one of its object.
+    std::vector<String> callersSecrets = std::exchange(secrets_, {});
     try {
       body();
     } catch (const std::exception& error) {
       report(handler, asFailure(error));
     }
+    secrets_ = std::move(callersSecrets);
   }
   void report(const Handler& handler, const Failure& failure);
 
@@ -138,7 +143,7 @@ class Frame {
   String DBName_;
   String connectionString_;
   SQLFactory factory_;
-  std::vector<String> secrets_;  // of the last statement
+  std::vector<String> secrets_;  // that the running operation has sent
   Long errNumber_ = 0;
   String errDescription_;
 };

@@ -57,7 +57,15 @@ String textLiteral(const Variant& value, bool keepNull, bool escapeText) {
   return "N'" + (escapeText ? escaped(text) : text) + "'";
 }
 
-String literalOf(Long type, const Variant& value, bool keepNull, bool escapeText) {
+}  // namespace
+
+// Whether the token stands behind the "<" at `at`.
+bool SQLFactory::Parameter::tokenAt(const String& text, std::size_t at) const {
+  const std::size_t end = at + 1 + name.size();
+  return end < text.size() && text[end] == '>' && text.compare(at + 1, name.size(), name) == 0;
+}
+
+String SQLFactory::Parameter::literal() const {
   switch (type) {
     case paraList:
       return listLiteral(value);
@@ -71,8 +79,6 @@ String literalOf(Long type, const Variant& value, bool keepNull, bool escapeText
       return textLiteral(value, keepNull, escapeText);
   }
 }
-
-}  // namespace
 
 void SQLFactory::AddPara(const String& paraName, Long paraType, const Variant& paraValue, Boolean keepNull,
                          Boolean escapeText) {
@@ -89,10 +95,7 @@ Boolean SQLFactory::makeSql(String& sql, const String& nullParas) {
   try {
     if (sql.empty()) sql = sql_;
     if (sql.empty()) throw Failure(noSql, "SQLFactory", "have not sql of need replace.");
-    for (const Parameter& parameter : parameters_) {
-      const String literal = literalOf(parameter.type, parameter.value, parameter.keepNull, parameter.escapeText);
-      sql = replaceAll(sql, token(parameter.name), literal);
-    }
+    for (const Parameter& parameter : parameters_) sql = replaceAll(sql, token(parameter.name), parameter.literal());
     if (nullParas.empty()) return true;
     for (const String& name : split(nullParas, ',')) sql = replaceAll(sql, token(name), "null");
     return true;
@@ -102,6 +105,20 @@ Boolean SQLFactory::makeSql(String& sql, const String& nullParas) {
     errDescription_ = failure.description();
     return false;
   }
+}
+
+String SQLFactory::fill(const String& text) const {
+  String filled;
+  std::size_t done = 0;
+  for (std::size_t at = text.find('<'); at != String::npos; at = text.find('<', at + 1)) {
+    const auto parameter =
+        std::ranges::find_if(parameters_, [&](const Parameter& candidate) { return candidate.tokenAt(text, at); });
+    if (parameter == parameters_.end()) continue;
+    filled.append(text, done, at - done).append(parameter->literal());
+    at += parameter->name.size() + 1;
+    done = at + 1;
+  }
+  return filled.append(text, done);
 }
 
 Date dayNumberToDate(double dayNumber) {

@@ -14,7 +14,6 @@ enum ParaType : Long { paraList = -1, paraVerbatim = 0, paraNumber = 1, paraText
 //   factory.AddPara("deptNo", paraText, "S'1", false, true);
 //   String text = "select * from departments where deptNo=<deptNo>";
 //   factory.makeSql(text, "");                                  // ... where deptNo=N'S''1'
-// Replacement is plain text work: a value that holds a later token's text is replaced as well.
 class SQLFactory {
  public:
   // The text that makeSql takes when its own is empty. Survives Clear.
@@ -26,9 +25,13 @@ class SQLFactory {
   // A name added twice: the first one wins, since its token is gone when the second is processed.
   void AddPara(const String& paraName, Long paraType, const Variant& paraValue, Boolean keepNull, Boolean escapeText);
   void Clear();
-  // Replaces the tokens of `sql` in place, then those named in the comma-separated `nullParas` by null. False with
+  // Replaces the tokens of `sql` in place, one parameter after the other, then those named in the comma-separated
+  // `nullParas` by null. Plain text work: a value that holds a later token's text is replaced as well. False with
   // errNumber -1 where there is no text at all; `sql` then keeps what it had become.
   Boolean makeSql(String& sql, const String& nullParas);
+  // `text` with each token replaced by its literal in one pass. What a literal brings is not looked at again, so that
+  // every value is stored as it is. A token without a parameter stays. Throws Failure for a value without a literal.
+  String fill(const String& text) const;
 
  private:
   struct Parameter {
@@ -37,6 +40,9 @@ class SQLFactory {
     Variant value;
     Boolean keepNull;
     Boolean escapeText;
+
+    bool tokenAt(const String& text, std::size_t at) const;
+    String literal() const;
   };
 
   String sql_;

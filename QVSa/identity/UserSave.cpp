@@ -52,9 +52,9 @@ Boolean User::insertUser() {
     connection.Execute(sql("insert into userJob(userId,jobId)"
                            " select userId,jobId from users u,jobs j"
                            " where u.userName=<userName> and u.isRole=0"
-                           " and jobId in (" +
-                           jobList_ + ")")
-                           .text("userName", Name_));
+                           " and jobId in (<jobList>)")
+                           .text("userName", Name_)
+                           .raw("jobList", jobList_));
   }
   saveGroup(connection, id);
   connection.CommitTrans();
@@ -78,8 +78,6 @@ void User::findDepartment(Connection& connection) {
   deptFullName_ = row["fullName"].asText();
 }
 
-// Numbers and the password are filled in first, and last the texts that are never empty: a name or a log-in that looks
-// like a token is then stored as it stands, or the statement fails.
 void User::insertRow(Connection& connection) {
   connection.Execute(sql(" insert into users "
                          "( userName , userLogin , userPwd , deptId , mobilePhone , email , isAbstract , "

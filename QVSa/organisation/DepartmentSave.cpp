@@ -50,7 +50,6 @@ Boolean Department::insertDept() {
     place = {trim(superior->path.value_or("")), superior->fullNameBelow};
   }
 
-  // Numbers first, here and below: one filled in behind a text would be stored in place of its own token in that text.
   connection.Execute(sql("insert into departments(deptNo,deptName,superDept,fullName,isOrg,isOuter) "
                          " values(<deptNo>,<deptName>,<superDept>,<fullName>,<isOrg>,<isOuter>)")
                          .number("superDept", superInnerId_)

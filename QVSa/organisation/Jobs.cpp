@@ -14,11 +14,7 @@ Boolean Jobs::GetAll(const String& deptId, const String& roleName, Long userId) 
     if (!roleName.empty()) statement += " and r.roleName=<roleName>";
     if (userId != 0) statement += " and jobId in (select jobId from userJob where userId=" + text(userId) + ")";
     statement += " order by j.deptId";
-    Statement filled = sql(statement);
-    // The empty text of a filter that is not given would stand in place of its token inside the other one.
-    if (!deptId.empty()) filled.text("deptNo", deptId);
-    if (!roleName.empty()) filled.text("roleName", roleName);
-    addRows(connection.Execute(filled));
+    addRows(connection.Execute(sql(statement).text("deptNo", deptId).text("roleName", roleName)));
     return true;
   });
 }

@@ -88,18 +88,17 @@ Boolean Role::updateRole() {
   });
 }
 
-// The name comes last: what is filled in behind a text replaces its own token in that text as well.
 Statement Role::filled(const String& statement) {
   return sql(statement)
-      .number("CreUId", creUserId_)
-      .number("UpdUId", updUserId_)
-      .number("OtherCanUpd", otherCanDesign_)
-      .date("CreateTime", createTime_)
-      .date("UpdTime", updTime_)
-      .text("CreUName", creUserName_)
-      .text("UpdUName", upduserName_)
+      .text("roleName", Name_)
       .text("roleDesc", description_)
-      .text("roleName", Name_);
+      .number("CreUId", creUserId_)
+      .text("CreUName", creUserName_)
+      .date("CreateTime", createTime_)
+      .number("UpdUId", updUserId_)
+      .text("UpdUName", upduserName_)
+      .date("UpdTime", updTime_)
+      .number("OtherCanUpd", otherCanDesign_);
 }
 
 Boolean Role::Delete(Long Id) {

@@ -96,6 +96,8 @@ Boolean LogRecords::GetLogByQuery(std::vector<Variant>& arrList, Long LogType, c
                         .date("startDate", arrList[startDate])
                         .date("endDate", arrList[endDate].toDate().addDays(1))
                         .text("OpComputer", anywhere(arrList[computerPart]))
+                        .raw("userCondition", userCondition(arrList[userParts].toText()))
+                        .raw("templateCondition", templateCondition(arrList[templateParts].toText()))
                         .text("desc", anywhere(arrList[descriptionPart]))
                         .text("app0", "")
                         .text("app1", "")
@@ -107,8 +109,8 @@ Boolean LogRecords::GetLogByQuery(std::vector<Variant>& arrList, Long LogType, c
 String LogRecords::queryConditions(const std::vector<Variant>& arrList) {
   String conditions = dateCondition(arrList[startDate].toDate(), arrList[endDate].toDate());
   if (isSet(arrList[computerPart])) conditions += " and Computer like <OpComputer>";
-  if (isSet(arrList[userParts])) conditions += userCondition(arrList[userParts].toText());
-  if (isSet(arrList[templateParts])) conditions += templateCondition(arrList[templateParts].toText());
+  if (isSet(arrList[userParts])) conditions += "<userCondition>";
+  if (isSet(arrList[templateParts])) conditions += "<templateCondition>";
   if (isSet(arrList[descriptionPart])) conditions += " and opDesc like <desc>";
   return conditions;
 }

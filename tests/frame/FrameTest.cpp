@@ -66,6 +66,15 @@ class Record : private Frame {
   }
   void noteName(const String& name) { note(1400, {name}); }
 
+  Boolean store(const String& secret) {
+    return operation(plain(), [&] {
+      Connection connection = open();
+      connection.Execute(sql("update users set pwd=<pwd>").secret("pwd", secret));
+      connection.Execute(statement);
+      return true;
+    });
+  }
+
   String filled() {
     return sql("<n> <t> <d> <l> <x>").number("n", "").text("t", "a ").date("d", Date::empty()).list("l", "a,b");
   }
@@ -154,6 +163,23 @@ TEST_F(FrameTest, OtherExceptionsStayInsideToo) {
   EXPECT_EQ(record.errNumber(), number::memory);
   EXPECT_FALSE(record.perform([]() -> Boolean { throw std::out_of_range("index"); }));
   EXPECT_EQ(record.errNumber(), number::internal);
+}
+
+TEST_F(FrameTest, AnErrorTextEndsBeforeAnyPieceOfASecret) {
+  const String secret = "MGkGCSsGAQQBgjdYA6BcMFoGCisGAQQBgjdYAwGgTDBKAgMCAAECAmYBAgFABAgA";
+  const auto quoting = [&](std::size_t from, std::size_t length) {
+    return Failure(number::range, "Provider", "Truncated value: '" + secret.substr(from, length) + "'.");
+  };
+  for (const auto& [from, length] : {std::pair(0, 64), {0, 6}, {20, 40}, {58, 6}}) {
+    server.fail(statement, quoting(from, length));
+    EXPECT_FALSE(record.store(secret)) << "a later statement of the operation";
+    EXPECT_EQ(record.errDescription(), "Truncated value: '***");
+  }
+  server.fail("update users set pwd=N'" + secret + "'", quoting(0, 40));
+  EXPECT_FALSE(record.store(secret));
+  EXPECT_EQ(record.errDescription(), "Truncated value: '***");
+  EXPECT_FALSE(record.store("other"));
+  EXPECT_NE(record.errDescription(), "Truncated value: '***");
 }
 
 TEST_F(FrameTest, RefusalsReportTheirMessage) {

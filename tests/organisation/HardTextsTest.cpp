@@ -47,35 +47,6 @@ TEST_F(HardTextsTest, ARoleAGroupAndADepartmentAreFoundByThemAgain) {
   EXPECT_TRUE(groups.GetAll()) << groups.errDescription();
 }
 
-TEST_F(HardTextsTest, ATokenOfItsOwnStatementsIsKeptByADepartmentOrRefused) {
-  const String works = idOf("W");
-  int kept = 0;
-  const auto save = [&](Department subject, bool isNumber, const String& token) {
-    const test::Lines before = tree();
-    isNumber ? subject.Id(token) : subject.Name(token);
-    if (!subject.Save()) {
-      EXPECT_EQ(tree(), before) << token;
-      return;
-    }
-    ++kept;
-    EXPECT_EQ(tables_.text("select deptNo,deptName,fullName from departments where deptId=" + text(subject.InnerId())),
-              subject.Id() + "|" + subject.Name() + "|" + subject.Name());
-    EXPECT_TRUE(connected<Department>().GetOne(isNumber ? 1 : 2, token)) << token;
-  };
-  for (const char* token : {"<superDept>", "<isOrg>", "<isOuter>", "<oldId>", "<fullName>"}) {
-    for (const bool isNumber : {false, true}) {
-      auto added = connected<Department>(), changed = connected<Department>();
-      added.Id("N");
-      added.Name("North");
-      added.Super("_root");
-      save(added, isNumber, token);
-      ASSERT_TRUE(changed.GetOne(3, works));
-      save(changed, isNumber, token);
-    }
-  }
-  EXPECT_EQ(kept, 16) << "all but the token that is filled in last";
-}
-
 TEST_F(HardTextsTest, AnXmlKeepsThem) {
   const Long hub = job(manager_, "H");
   test::Lines ids, pairs;

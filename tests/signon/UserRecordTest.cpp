@@ -52,16 +52,6 @@ TEST_F(UserRecord, WhatASaveWroteALoadFinds) {
   EXPECT_EQ(ann.errDescription(), "User does not exist.");
 }
 
-TEST_F(UserRecord, ANameThatLooksLikeATokenIsKept) {
-  addUser("<deptId>", [](User& user) { user.Name("<ipList>"); });
-  User user = loaded("<deptId>");
-  EXPECT_EQ(user.Name(), "<ipList>");
-  user.Name("<userPwd>");
-  user.Login("<isOuter>");
-  EXPECT_TRUE(user.Save()) << user.errDescription();
-  EXPECT_EQ(loaded("<isOuter>").Name(), "<userPwd>") << "nor does the stored password come into a text";
-}
-
 TEST_F(UserRecord, TheOrganisationIsTheDepartmentItselfOrTheNearestAbove) {
   for (const auto& [id, super, isOrg] : {std::tuple("A", "_root", true), {"B", "A", false}, {"C", "B", true}}) {
     auto department = connected<Department>();
