@@ -246,6 +246,9 @@ String search(LDAP* handle, const String& text) {
 
 String getUsersFromLD(const DirectoryQuery& query, const String& password, Integer& status) {
   try {
+    // The client library's texts end there.
+    for (const String* text : {&query.host, &query.bindDn, &query.searchText})
+      if (text->find('\0') != String::npos) throw Ended{directoryRefused};
     SilenceLimit silence(query.seconds);
     const Handle handle = connected(query, silence);
     bind(handle.get(), query.bindDn, password);

@@ -72,7 +72,7 @@ Bytes taken(gss_buffer_desc& token) {
 }
 
 bool acquireClient(Side& side, const NtlmIdentity& identity) {
-  const Name user(identity.domain.empty() ? identity.user : identity.domain + "\\" + identity.user, GSS_C_NT_USER_NAME);
+  const Name user(identity.domain + "\\" + identity.user, GSS_C_NT_USER_NAME);
   gss_buffer_desc password = lend(identity.password);
   OM_uint32 minor = 0;
   return user.get() != GSS_C_NO_NAME &&
@@ -120,8 +120,10 @@ bool ntlmServerStep(Side& side, const Bytes& inToken, Bytes& outToken, bool& mor
 }  // namespace
 
 Boolean ntlmLogon(const String& user, const String& domain, const String& password) {
-  // Without a user or a password the client side would offer an anonymous exchange.
-  if (user.empty() || password.empty()) return false;
+  // Without a user or a password the client side would offer an anonymous exchange, without a domain the mechanism
+  // takes the user of any, and its texts end at a NUL byte.
+  const auto isUsable = [](const String& text) { return !text.empty() && text.find('\0') == String::npos; };
+  if (!isUsable(user) || !isUsable(domain) || !isUsable(password)) return false;
   const NtlmIdentity identity{user, domain, password};
   Side client;
   Side server;

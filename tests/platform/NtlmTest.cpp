@@ -29,10 +29,14 @@ TEST(NtlmTest, OnlyTheRightPasswordOfAKnownUserAndDomainPasses) {
   EXPECT_FALSE(ntlmLogon("bert", "CORP", "Secret-1")) << "another user's";
 }
 
-TEST(NtlmTest, NoUserOrPasswordIsNoAnonymousSuccess) {
+TEST(NtlmTest, ATextThatIsMissingOrGoesOnBehindANulByteIsRefused) {
   EXPECT_FALSE(ntlmLogon("ann", "CORP", ""));
   EXPECT_FALSE(ntlmLogon("", "CORP", "Secret-1"));
-  EXPECT_FALSE(ntlmLogon("", "", ""));
+  EXPECT_FALSE(ntlmLogon("ann", "", "Secret-1")) << "of whatever domain";
+  const String behind("\0x", 2);
+  EXPECT_FALSE(ntlmLogon("ann" + behind, "CORP", "Secret-1"));
+  EXPECT_FALSE(ntlmLogon("ann", "CORP" + behind, "Secret-1"));
+  EXPECT_FALSE(ntlmLogon("ann", "CORP", "Secret-1" + behind));
 }
 
 TEST(NtlmTest, WithoutTheMechanismOrItsUsersEveryAnswerIsFalse) {
