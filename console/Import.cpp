@@ -145,12 +145,6 @@ void Import::addUser(const UserRow& row, User& user) {
 }
 
 void Import::changeUser(const UserRow& row, User& user) {
-  const String loss = lossOfSave(console_, user);
-  if (!loss.empty()) {
-    ++users_.left;
-    left_.push_back(row.login + " is different here and was not changed: the user " + loss + ".");
-    return;
-  }
   ++users_.changed;
   if (dryRun_) return;
   Department department;

@@ -38,20 +38,7 @@ std::vector<Membership> membershipsOf(const Console& console, const User& user) 
   return result;
 }
 
-// A stored password that can't be decrypted here reads as an empty one.
-bool hasReadablePassword(const Console& console, const String& login) {
-  constexpr const char* digestOfNothing = "D41D8CD98F00B204E9800998ECF8427E";
-  User user;
-  console.connect(user);
-  return !user.loginAuth_1(login, digestOfNothing);
-}
-
 }  // namespace
-
-String lossOfSave(const Console& console, const User& user) {
-  if (!hasReadablePassword(console, user.Login())) return "has no password that can be read here; it would be lost";
-  return "";
-}
 
 void saveKept(const Console& console, User& user) {
   user.setJobs(jobsOf(console, user.Id()));

@@ -97,8 +97,6 @@ Answer add(const Console& console, const Options& options) {
 Answer unlock(const Console& console, const String& login) {
   User user = userOf(console, login);
   if (!user.locked()) throw Refusal(login + " is not locked; the state of the account is: " + stateOf(user) + ".");
-  const String loss = lossOfSave(console, user);
-  if (!loss.empty()) throw Refusal(login + " can't be unlocked here: the user " + loss + ".");
   user.regState(0);
   saveKept(console, user);
   return {login + " is unlocked; the validity of the password begins anew.\n", {{"login", login}, {"unlocked", true}}};

@@ -3,10 +3,9 @@
 #include <cerrno>
 #include <memory>
 #include <openssl/crypto.h>
+#include <openssl/err.h>
 #include <openssl/evp.h>
 #include <openssl/provider.h>
-
-#include "QVSa/frame/Failure.h"
 
 namespace QVSa::platform {
 
@@ -53,6 +52,36 @@ OSSL_LIB_CTX* makeLibrary() {
 OSSL_LIB_CTX* openSslLibrary() {
   static OSSL_LIB_CTX* const library = makeLibrary();
   return library;
+}
+
+OpenSslErrorsKept::OpenSslErrorsKept() {
+  Error error{};
+  const char* file = nullptr;
+  const char* function = nullptr;
+  const char* data = nullptr;
+  int flags = 0;
+  while ((error.code = ERR_get_error_all(&file, &error.line, &function, &data, &flags)) != 0) {
+    error.file = file;
+    error.function = function;
+    error.data = (flags & ERR_TXT_STRING) != 0 ? data : "";
+    hosts_.push_back(error);
+  }
+}
+
+OpenSslErrorsKept::~OpenSslErrorsKept() {
+  ERR_clear_error();
+  for (const Error& error : hosts_) {
+    ERR_new();
+    ERR_set_debug(error.file.c_str(), error.line, error.function.c_str());
+    ERR_set_error(ERR_GET_LIB(error.code), ERR_GET_REASON(error.code), "%s", error.data.c_str());
+  }
+}
+
+Failure openSslFailure() {
+  Long reason = number::internal;
+  while (const unsigned long code = ERR_get_error())
+    if (ERR_GET_REASON(code) == ERR_R_MALLOC_FAILURE) reason = number::memory;
+  return runtimeFailure(reason);
 }
 
 }  // namespace QVSa::platform

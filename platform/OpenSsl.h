@@ -1,7 +1,9 @@
 #pragma once
 
-#include <openssl/err.h>
 #include <openssl/types.h>
+#include <vector>
+
+#include "QVSa/frame/Failure.h"
 
 namespace QVSa::platform {
 
@@ -12,13 +14,27 @@ namespace QVSa::platform {
 // tries again.
 OSSL_LIB_CTX* openSslLibrary();
 
-// Keeps our failures out of the thread's queue of OpenSSL errors, which a host reads for its own calls.
+// Keeps our failures out of the thread's queue of OpenSSL errors, which a host reads for its own calls: while this
+// lives the queue holds only ours, afterwards what it held before.
 class OpenSslErrorsKept {
  public:
-  OpenSslErrorsKept() { ERR_set_mark(); }
+  OpenSslErrorsKept();
   OpenSslErrorsKept(const OpenSslErrorsKept&) = delete;
   OpenSslErrorsKept& operator=(const OpenSslErrorsKept&) = delete;
-  ~OpenSslErrorsKept() { ERR_pop_to_mark(); }
+  ~OpenSslErrorsKept();
+
+ private:
+  struct Error {
+    unsigned long code;
+    String file;
+    int line;
+    String function;
+    String data;
+  };
+  std::vector<Error> hosts_;
 };
+
+// Why OpenSSL refused, by the errors in the thread's queue, which it empties: 7 for want of memory, else 51.
+Failure openSslFailure();
 
 }  // namespace QVSa::platform

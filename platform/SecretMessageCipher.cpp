@@ -6,6 +6,8 @@
 #include <openssl/provider.h>
 #include <openssl/rand.h>
 
+#include "platform/OpenSsl.h"
+
 namespace QVSa::platform {
 
 namespace {
@@ -13,19 +15,6 @@ namespace {
 constexpr std::size_t desKeySize = 8;
 constexpr std::size_t fullKeySize = 16;
 constexpr std::size_t hashBlockSize = 64;
-
-// A library context of our own: a host's providers and settings are neither used nor changed. It is never let go, since
-// OpenSSL may have ended before our own statics do.
-OSSL_LIB_CTX* library() {
-  static OSSL_LIB_CTX* const context = [] {
-    OSSL_LIB_CTX* made = OSSL_LIB_CTX_new();
-    OSSL_PROVIDER_load(made, "default");
-    // DES lives without it; the other old ciphers do not.
-    OSSL_PROVIDER_load(made, "legacy");
-    return made;
-  }();
-  return context;
-}
 
 struct FreeCipher {
   void operator()(EVP_CIPHER* cipher) const { EVP_CIPHER_free(cipher); }
@@ -63,8 +52,7 @@ SecretBytes extended(const SecretBytes& hash) {
 }
 
 SecretBytes firstBytes(const SecretBytes& bytes, std::size_t count) {
-  return count <= bytes.size() ? SecretBytes(bytes.begin(), bytes.begin() + static_cast<std::ptrdiff_t>(count))
-                               : SecretBytes();
+  return {bytes.begin(), bytes.begin() + static_cast<std::ptrdiff_t>(count)};
 }
 
 // DES as triple DES with three equal keys, which needs no old provider.
@@ -77,7 +65,8 @@ CipherKey desKey(const SecretBytes& hash) {
 
 // The keys of RC2 and RC4. At 40 bits some writers fill the key up with zeros and some do not: two keys to try.
 std::vector<CipherKey> variableKeys(const char* cipher, const SecretBytes& hash, Long bits) {
-  if (bits != 40 && bits != 56 && bits != 128) return {};
+  const bool known = bits == 40 || bits == 56 || bits == 128;
+  if (!known || OSSL_PROVIDER_available(openSslLibrary(), "legacy") != 1) return {};
   std::vector<CipherKey> keys{{cipher, firstBytes(hash, static_cast<std::size_t>(bits / 8)), bits}};
   if (bits == 40) {
     keys.push_back(keys.front());
@@ -108,34 +97,37 @@ std::vector<CipherKey> keysOf(const SealedText& sealed, const String& secret) {
   }
 }
 
+void require(bool done) {
+  if (!done) throw openSslFailure();
+}
+
+// Nothing for an iv of another length than the cipher's.
 CipherContext startCipher(const CipherKey& key, const Bytes& iv, bool encrypt) {
-  const Cipher cipher(EVP_CIPHER_fetch(library(), key.cipher, nullptr));
+  const Cipher cipher(EVP_CIPHER_fetch(openSslLibrary(), key.cipher, nullptr));
   CipherContext context(EVP_CIPHER_CTX_new());
-  if (!cipher || !context || key.key.empty()) return nullptr;
+  require(cipher && context);
   if (static_cast<std::size_t>(EVP_CIPHER_get_iv_length(cipher.get())) != iv.size()) return nullptr;
   const int direction = encrypt ? 1 : 0;
-  if (EVP_CipherInit_ex2(context.get(), cipher.get(), nullptr, nullptr, direction, nullptr) != 1) return nullptr;
-  if (EVP_CIPHER_CTX_set_key_length(context.get(), static_cast<int>(key.key.size())) != 1) return nullptr;
-  if (key.effectiveBits != 0 && EVP_CIPHER_is_a(cipher.get(), "RC2-CBC") == 1 &&
-      EVP_CIPHER_CTX_ctrl(context.get(), EVP_CTRL_SET_RC2_KEY_BITS, key.effectiveBits, nullptr) <= 0) {
-    return nullptr;
-  }
+  require(EVP_CipherInit_ex2(context.get(), cipher.get(), nullptr, nullptr, direction, nullptr) == 1);
+  require(EVP_CIPHER_CTX_set_key_length(context.get(), static_cast<int>(key.key.size())) == 1);
+  if (key.effectiveBits != 0 && EVP_CIPHER_is_a(cipher.get(), "RC2-CBC") == 1)
+    require(EVP_CIPHER_CTX_ctrl(context.get(), EVP_CTRL_SET_RC2_KEY_BITS, key.effectiveBits, nullptr) > 0);
   const unsigned char* ivData = iv.empty() ? nullptr : iv.data();
-  if (EVP_CipherInit_ex2(context.get(), nullptr, key.key.data(), ivData, direction, nullptr) != 1) return nullptr;
+  require(EVP_CipherInit_ex2(context.get(), nullptr, key.key.data(), ivData, direction, nullptr) == 1);
   return context;
 }
 
-// All of the input through the cipher; nothing where the padding does not read.
+// All of the input through the cipher; nothing where the iv or the padding does not read.
 template <typename Input>
 std::optional<SecretBytes> runCipher(const CipherKey& key, const Bytes& iv, const Input& input, bool encrypt) {
+  if (input.size() > std::numeric_limits<int>::max() - EVP_MAX_BLOCK_LENGTH) throw runtimeFailure(number::overflow);
   const CipherContext context = startCipher(key, iv, encrypt);
-  if (!context || input.size() > std::numeric_limits<int>::max() - EVP_MAX_BLOCK_LENGTH) return std::nullopt;
+  if (!context) return std::nullopt;
   SecretBytes output(input.size() + EVP_MAX_BLOCK_LENGTH);
   int length = 0;
   int restLength = 0;
-  if (EVP_CipherUpdate(context.get(), output.data(), &length, input.data(), static_cast<int>(input.size())) != 1) {
-    return std::nullopt;
-  }
+  require(EVP_CipherUpdate(context.get(), output.data(), &length, input.data(), static_cast<int>(input.size())) == 1);
+  // The last step asks for no memory: what it refuses is the padding.
   if (EVP_CipherFinal_ex(context.get(), output.data() + length, &restLength) != 1) return std::nullopt;
   output.resize(static_cast<std::size_t>(length) + static_cast<std::size_t>(restLength));
   return output;
@@ -146,30 +138,31 @@ std::optional<SecretBytes> runCipher(const CipherKey& key, const Bytes& iv, cons
 SecretBytes digest(const char* name, const SecretBytes& data) {
   SecretBytes result(EVP_MAX_MD_SIZE);
   std::size_t size = 0;
-  if (EVP_Q_digest(library(), name, nullptr, data.data(), data.size(), result.data(), &size) != 1) size = 0;
+  require(EVP_Q_digest(openSslLibrary(), name, nullptr, data.data(), data.size(), result.data(), &size) == 1);
   result.resize(size);
   return result;
 }
 
-std::optional<SealedText> sealText(const String& plain, const String& secret, const Bytes& iv, const Bytes& salt) {
+SealedText sealText(const String& plain, const String& secret, const Bytes& iv, const Bytes& salt) {
   const CipherKey key = desKey(secretHash(secret, salt));
   const std::optional<SecretBytes> cipherText = runCipher(key, iv, toUtf16Bytes(plain), true);
-  if (!cipherText) return std::nullopt;
+  require(cipherText.has_value());
   return SealedText{algorithm::des, 64, iv, salt, Bytes(cipherText->begin(), cipherText->end())};
 }
 
-String openSealedText(const SealedText& sealed, const String& secret) {
+std::optional<String> openSealedText(const SealedText& sealed, const String& secret) {
   for (const CipherKey& key : keysOf(sealed, secret)) {
     const std::optional<SecretBytes> bytes = runCipher(key, sealed.iv, sealed.cipherText, false);
     if (!bytes) continue;
-    if (std::optional<String> text = fromUtf16Bytes(*bytes)) return *std::move(text);
+    if (std::optional<String> text = fromUtf16Bytes(*bytes)) return text;
   }
-  return {};
+  return std::nullopt;
 }
 
 Bytes randomBytes(std::size_t count) {
   Bytes bytes(count);
-  return RAND_bytes_ex(library(), bytes.data(), count, 0) == 1 ? bytes : Bytes();
+  require(RAND_bytes_ex(openSslLibrary(), bytes.data(), count, 0) == 1);
+  return bytes;
 }
 
 }  // namespace QVSa::platform

@@ -6,16 +6,17 @@
 
 namespace QVSa::platform {
 
-// The text enciphered by DES under a key made of the secret and the salt. The iv has 8 bytes. Nothing on failure.
-std::optional<SealedText> sealText(const String& plain, const String& secret, const Bytes& iv, const Bytes& salt);
+// All of these throw Failure where OpenSSL can't run: 7 for want of memory, else 51.
 
-// The text of a message of any known algorithm; empty where it does not read.
-String openSealedText(const SealedText& sealed, const String& secret);
+// The text enciphered by DES under a key made of the secret and the salt. The iv has 8 bytes.
+SealedText sealText(const String& plain, const String& secret, const Bytes& iv, const Bytes& salt);
 
-// A digest by OpenSSL's name for it, as "SHA1"; empty on failure.
+// The text of a message of any known algorithm; nothing where it does not decrypt.
+std::optional<String> openSealedText(const SealedText& sealed, const String& secret);
+
+// A digest by OpenSSL's name for it, as "SHA1".
 SecretBytes digest(const char* name, const SecretBytes& data);
 
-// So many bytes that nobody can foretell; empty on failure.
 Bytes randomBytes(std::size_t count);
 
 }  // namespace QVSa::platform

@@ -6,6 +6,8 @@
 #include <openssl/evp.h>
 #include <openssl/objects.h>
 
+#include "platform/OpenSsl.h"
+
 namespace QVSa::platform {
 
 namespace {
@@ -84,7 +86,7 @@ Bytes bytesOf(const ASN1_OCTET_STRING* text) {
 
 EnvelopePointer makeEnvelope(const SealedText& sealed) {
   EnvelopePointer envelope(reinterpret_cast<Envelope*>(ASN1_item_new(ASN1_ITEM_rptr(Envelope))));
-  if (!envelope) return nullptr;
+  if (!envelope) throw openSslFailure();
   Typed& content = *envelope->content;
   Sealed& target = *content.sealed;
   envelope->type = OBJ_txt2obj(envelopeType, 1);
@@ -94,16 +96,17 @@ EnvelopePointer makeEnvelope(const SealedText& sealed) {
   const bool filled = envelope->type != nullptr && content.type != nullptr &&
                       ASN1_INTEGER_set(target.version, messageVersion) == 1 && setBytes(target.iv, sealed.iv) &&
                       setBytes(target.salt, sealed.salt) && setBytes(target.cipherText, sealed.cipherText);
-  return filled ? std::move(envelope) : nullptr;
+  if (!filled) throw openSslFailure();
+  return envelope;
 }
 
 Bytes toDer(const Envelope& envelope) {
   const auto* value = reinterpret_cast<const ASN1_VALUE*>(&envelope);
   const int size = ASN1_item_i2d(value, nullptr, ASN1_ITEM_rptr(Envelope));
-  if (size <= 0) return {};
+  if (size <= 0) throw openSslFailure();
   Bytes der(static_cast<std::size_t>(size));
   unsigned char* end = der.data();
-  ASN1_item_i2d(value, &end, ASN1_ITEM_rptr(Envelope));
+  if (ASN1_item_i2d(value, &end, ASN1_ITEM_rptr(Envelope)) != size) throw openSslFailure();
   return der;
 }
 
@@ -119,7 +122,8 @@ String toBase64Lines(const Bytes& der) {
 
 Bytes fromBase64(const String& message) {
   const std::unique_ptr<EVP_ENCODE_CTX, FreeDecoder> decoder(EVP_ENCODE_CTX_new());
-  if (!decoder || message.size() > std::numeric_limits<int>::max()) return {};
+  if (!decoder) throw openSslFailure();
+  if (message.size() > std::numeric_limits<int>::max()) return {};
   EVP_DecodeInit(decoder.get());
   Bytes der(message.size() + 3);
   int length = 0;
@@ -133,18 +137,20 @@ Bytes fromBase64(const String& message) {
 
 }  // namespace
 
-String writeSealedText(const SealedText& sealed) {
-  const EnvelopePointer envelope = makeEnvelope(sealed);
-  return envelope ? toBase64Lines(toDer(*envelope)) : String();
-}
+String writeSealedText(const SealedText& sealed) { return toBase64Lines(toDer(*makeEnvelope(sealed))); }
 
 std::optional<SealedText> readSealedText(const String& message) {
   const Bytes der = fromBase64(message);
   const unsigned char* start = der.data();
   const EnvelopePointer envelope(reinterpret_cast<Envelope*>(
       ASN1_item_d2i(nullptr, &start, static_cast<long>(der.size()), ASN1_ITEM_rptr(Envelope))));
-  if (!envelope || !isType(envelope->type, envelopeType)) return std::nullopt;
-  if (!isType(envelope->content->type, contentType)) return std::nullopt;
+  if (!envelope) {
+    // The decoder refuses a text of another form and a lack of memory in the same way.
+    const Failure failure = openSslFailure();
+    if (failure.number() == number::memory) throw failure;
+    return std::nullopt;
+  }
+  if (!isType(envelope->type, envelopeType) || !isType(envelope->content->type, contentType)) return std::nullopt;
   const Sealed& sealed = *envelope->content->sealed;
   return SealedText{sealed.algorithm, sealed.keyLength, bytesOf(sealed.iv), bytesOf(sealed.salt),
                     bytesOf(sealed.cipherText)};

@@ -26,7 +26,9 @@ struct SealedText {
   Bytes cipherText;
 };
 
-// The message in Base64, its lines ended by CR LF. Empty on failure.
+// Both throw Failure where OpenSSL can't run: 7 for want of memory, else 51.
+
+// The message in Base64, its lines ended by CR LF.
 String writeSealedText(const SealedText& sealed);
 // White space anywhere in the message is passed over. Nothing for a message of any other form.
 std::optional<SealedText> readSealedText(const String& message);

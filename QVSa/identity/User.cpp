@@ -1,7 +1,6 @@
 #include "QVSa/identity/User.h"
 
 #include "QVSa/organisation/Department.h"
-#include "platform/SecretMessage.h"
 
 namespace QVSa {
 namespace {
@@ -34,8 +33,8 @@ void User::Id(Long value) {
 }
 
 void User::Pwd(const String& value) {
-  pwdChanged_ = value != Pwd_.text();
-  Pwd_ = Password(value);
+  pwdChanged_ = !Pwd_.is(value);
+  Pwd_ = StoredPassword(value);
 }
 
 Boolean User::setJobs(const String& jobList) {
@@ -84,7 +83,7 @@ Boolean User::GetOne(Integer keyName, const Variant& keyValue, Boolean chkPwd, c
     if (chkPwd && !testPassword(connection, Pwd, wrongPwd, authLd)) return false;
     readRoles(connection);
     readGroups(connection);
-    isUser_ = true;
+    isUser_ = isStored_ = true;
     return true;
   });
 }
@@ -94,7 +93,8 @@ void User::clearRecord() {
                         &orgName_, &orgFullName_, &Domain_}) {
     value->clear();
   }
-  Pwd_ = Password();
+  Pwd_ = StoredPassword();
+  isStored_ = false;
   clearRoles();
   validDay_ = -1;
 }
@@ -107,7 +107,8 @@ void User::read(Recordset& row) {
   Id_ = row["userId"].asLong();
   Name_ = row["userName"].asText();
   Login_ = row["userLogin"].asText();
-  Pwd_ = Password(platform::decryptText(row["userPwd"].asText(), Name_));
+  storedName_ = Name_;
+  Pwd_ = StoredPassword::read(row["userPwd"].asText(), storedName_);
   MobilePhone_ = row["mobilePhone"].asText();
   Email_ = row["email"].asText();
   builtIn_ = row["isAbstract"].isOne();

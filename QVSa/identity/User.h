@@ -1,7 +1,7 @@
 #pragma once
 
 #include "QVSa/frame/Frame.h"
-#include "QVSa/identity/Password.h"
+#include "QVSa/frame/Password.h"
 #include "QVSa/identity/UserTypes.h"
 
 namespace QVSa {
@@ -135,8 +135,9 @@ class User : private Frame {
                     const String& ipAddr = "", const String& hostName = "", const Integer* userVerifyLevel = nullptr);
   // Whether `pwdMd5` is the md5Hex of the user's password: no counter, no lock, no session. Throws as loginAuth does.
   Boolean loginAuth_1(const String& loginName, const String& pwdMd5);
-  // Changes the password of the loaded user under the policy. 0x80040461 `oldPwd` is not his, 0x80040460 used before,
-  // 0x80040BB8 against the policy.
+  // Changes the password of the user that this object loaded or saved, under the policy. 0x80040461 `oldPwd` is not
+  // his, or there is no such user here: none was loaded, or his sign-on was refused. 0x80040460 used before, 0x80040BB8
+  // against the policy.
   Boolean chgPwd(const String& oldPwd, const String& newPwd);
   // Sets the user's supervisor: whoever holds job `jobId` (`flag` 1), or user `userId` (2). Any other flag: none; both
   // ids are stored all the same. 0x80040458 flag 1 without a job, 0x80040459 flag 2 without a user.
@@ -182,6 +183,7 @@ class User : private Frame {
   void saveGroup(Connection& connection, Long id);
   String storedPwd() const;
   Boolean pwdUsedBefore(Integer cycle, const String& Pwd = "");
+  void noteStored();
   void pushPwdHistory(Integer cycle);
 
   Boolean testPassword(Connection& connection, const String& Pwd, Boolean* wrongPwd, Boolean authLd);
@@ -204,7 +206,9 @@ class User : private Frame {
   Boolean idGiven_ = false;
   String Name_;
   String Login_;
-  Password Pwd_;
+  StoredPassword Pwd_;
+  String storedName_;         // the column userName, under which the stored password was encrypted
+  Boolean isStored_ = false;  // what this object holds is a row of the table, read or written by it
   Boolean pwdChanged_ = false;
   String MobilePhone_;
   String Email_;

@@ -2,7 +2,6 @@
 
 #include "QVSa/identity/User.h"
 #include "QVSa/identity/safeRule.h"
-#include "platform/SecretMessage.h"
 
 namespace QVSa {
 namespace {
@@ -38,7 +37,13 @@ Boolean User::passesPolicy(const String& password, Integer& cycle) {
   return true;
 }
 
-String User::storedPwd() const { return platform::encryptText(Pwd_.text(), Name_); }
+// The name is stored without its trailing blanks, and a password is read under the name as it is stored.
+String User::storedPwd() const { return Pwd_.encrypted(trimRight(Name_)); }
+
+void User::noteStored() {
+  storedName_ = trimRight(Name_);
+  isStored_ = true;
+}
 
 Boolean User::insertUser() {
   if (Name_.empty() || Login_.empty()) return refuse(1102);
@@ -60,6 +65,7 @@ Boolean User::insertUser() {
   connection.CommitTrans();
   // Not before: where the row is rolled back, another user may get its number.
   Id_ = id;
+  noteStored();
   return true;
 }
 
@@ -139,6 +145,7 @@ Boolean User::updateUser() {
   saveGroup(connection, Id_);
   connection.CommitTrans();
   regState_ = state;
+  noteStored();
   return true;
 }
 
@@ -199,7 +206,9 @@ void User::saveGroup(Connection& connection, Long id) {
 }
 
 Boolean User::pwdUsedBefore(Integer cycle, const String& Pwd) {
-  const String& password = Pwd.empty() ? Pwd_.text() : Pwd;
+  const StoredPassword password = Pwd.empty() ? Pwd_ : StoredPassword(Pwd);
+  // The present name is that of the row, or the one that a save is about to store.
+  const String name = Name_ == storedName_ ? storedName_ : trimRight(Name_);
   Connection connection = open();
   Recordset row = connection.Execute("select top " + text(cycle) +
                                      " isnull(pwd,''),creDate from userPwdHis"
@@ -207,8 +216,8 @@ Boolean User::pwdUsedBefore(Integer cycle, const String& Pwd) {
                                      text(Id_) + " order by creDate desc");
   for (; !row.EOF_(); row.MoveNext()) {
     // Kept under the name of its time: after a change of name it no longer reads, and so no longer counts.
-    const Password earlier(platform::decryptText(row[0].asText(), Name_));
-    if (earlier.text() == password) return true;
+    const auto earlier = StoredPassword::read(row[0].asText(), name);
+    if (earlier.isReadable() && password.is(earlier.text())) return true;
   }
   return false;
 }

@@ -17,7 +17,7 @@ Boolean User::testPassword(Connection& connection, const String& Pwd, Boolean* w
     if (!isInDirectory(connection, Pwd, authLd)) return refuse(1131);
     return true;
   }
-  const Boolean right = uType_ == adUser ? isWindowsUser(Pwd) : Pwd == Pwd_.text();
+  const Boolean right = uType_ == adUser ? isWindowsUser(Pwd) : Pwd_.is(Pwd);
   if (right) {
     lgts_ = 0;
     connection.Execute("update users set lgts=0 where userId=" + text(Id_));
@@ -109,7 +109,7 @@ Boolean User::isExpired(Integer maxDay) {
 }
 
 Boolean User::digestMatches(const String& digest) const {
-  return upperCase(digest) == upperCase(platform::md5Hex(Pwd_.text()));
+  return Pwd_.isReadable() && upperCase(digest) == upperCase(platform::md5Hex(Pwd_.text()));
 }
 
 Boolean User::loginAuth_1(const String& loginName, const String& pwdMd5) {
@@ -120,13 +120,13 @@ Boolean User::loginAuth_1(const String& loginName, const String& pwdMd5) {
 
 Boolean User::chgPwd(const String& oldPwd, const String& newPwd) {
   return operation(plain(), [&]() -> Boolean {
-    if (oldPwd != Pwd_.text()) return refuse(1121);
+    if (!isStored_ || !Pwd_.is(oldPwd)) return refuse(1121);
     Integer cycle = 0;
     if (!passesPolicy(newPwd, cycle)) return false;
     if (pwdUsedBefore(cycle, newPwd)) return refuse(1120, {cycle});
 
     writePwd(newPwd);
-    Pwd_ = Password(newPwd);
+    Pwd_ = StoredPassword(newPwd);
     if (cycle > 0) pushPwdHistory(cycle);
     return true;
   });
@@ -139,7 +139,7 @@ void User::writePwd(const String& newPwd) {
                          "userPwd=<pwd>,pwddate=getdate() "
                          " where userId=" +
                          text(Id_))
-                         .secret("pwd", platform::encryptText(newPwd, Name_)));
+                         .secret("pwd", platform::encryptText(newPwd, storedName_)));
 }
 
 Boolean User::chkRegPwd(const String&) { return true; }

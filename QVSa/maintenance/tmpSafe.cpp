@@ -2,7 +2,6 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "platform/SecretMessage.h"
 
 namespace QVSa {
 
@@ -14,7 +13,7 @@ Boolean tmpSafe::connect(const String& ServerName, const String& DBName) {
     Connection connection = open();
     Recordset row = connection.Execute("select top 1 * from QVTmpSafe");
     if (row.EOF_()) return true;
-    protectPwd_ = Password(platform::decryptText(row["protectPwd"].asText(), secrets::templatePwdKey));
+    protectPwd_ = StoredPassword::read(row["protectPwd"].asText(), secrets::templatePwdKey);
     loadedPwd_ = protectPwd_;
     return true;
   });
@@ -23,11 +22,11 @@ Boolean tmpSafe::connect(const String& ServerName, const String& DBName) {
 Boolean tmpSafe::Save(Boolean changeAll) {
   return operation(plain(), [&] {
     Connection connection = open();
-    connection.Execute(sql(" update QVTmpSafe set protectPwd = <Pwd>")
-                           .text("Pwd", platform::encryptText(protectPwd_.text(), secrets::templatePwdKey)));
+    connection.Execute(
+        sql(" update QVTmpSafe set protectPwd = <Pwd>").secret("Pwd", protectPwd_.encrypted(secrets::templatePwdKey)));
     if (changeAll) {
       connection.Execute("update repTmps set rtpwd=''");
-    } else if (loadedPwd_.text().empty()) {
+    } else if (loadedPwd_.is("")) {
       dropDefaultPasswords(connection);
     }
     return true;
@@ -38,8 +37,8 @@ void tmpSafe::dropDefaultPasswords(Connection& connection) {
   Recordset row;
   row.Open("select rtUid,rtPwd from repTmps where rtPwd is not null and rtPwd<>''", connection, 1, 3);
   for (; !row.EOF_(); row.MoveNext()) {
-    const Password own(platform::decryptText(row["rtPwd"].asText(), secrets::templatePwdKey));
-    if (own.text() == secrets::defaultTemplatePwd) row["rtPwd"].Value("");
+    const auto own = StoredPassword::read(row["rtPwd"].asText(), secrets::templatePwdKey);
+    if (own.is(secrets::defaultTemplatePwd)) row["rtPwd"].Value("");
   }
 }
 
@@ -48,10 +47,10 @@ Boolean tmpSafe::getPwd(const String& SessionId, String& x) {
     Connection connection;
     connection.Open(buildConnString(server(), "", false));
     Recordset row = connection.Execute(sql(" select sesid from sesLog where sesId = <SesID>").text("SesID", SessionId));
-    if (row.EOF_()) {
-      x.clear();
-      fail("tmpSafe", 33301);
-    }
+    x.clear();
+    if (row.EOF_()) fail("tmpSafe", 33301);
+    // A host would take the empty text for a template without protection.
+    if (!protectPwd_.isReadable()) fail("tmpSafe", 33302);
     x = protectPwd_.text();
     return true;
   });

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "QVSa/frame/Frame.h"
-#include "QVSa/identity/Password.h"
+#include "QVSa/frame/Password.h"
 
 namespace QVSa {
 
@@ -10,7 +10,7 @@ namespace QVSa {
 class tmpSafe : private Frame {
  public:
   // Takes effect with Save.
-  void protectPwd(const String& value) { protectPwd_ = Password(value); }
+  void protectPwd(const String& value) { protectPwd_ = StoredPassword(value); }
   using Frame::errNumber;
   String errDesc() const { return errDescription(); }
 
@@ -20,14 +20,15 @@ class tmpSafe : private Frame {
   // the time of `connect`, the templates that still have the default one do. Not one transaction: a failure behind the
   // first step leaves the new password in place.
   Boolean Save(Boolean changeAll = false);
-  // Gives the password to the holder of session `SessionId`. 0x80048215 and an empty `x` for no such session.
+  // Gives the password to the holder of session `SessionId`. An empty `x` and 0x80048215 for no such session,
+  // 0x80048216 where the stored password does not decrypt.
   Boolean getPwd(const String& SessionId, String& x);
 
  private:
   void dropDefaultPasswords(Connection& connection);
 
-  Password protectPwd_;
-  Password loadedPwd_;  // as it stood after connect
+  StoredPassword protectPwd_;
+  StoredPassword loadedPwd_;  // as it stood after connect
 };
 
 }  // namespace QVSa

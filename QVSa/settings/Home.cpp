@@ -2,7 +2,6 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/settings/MachineSettings.h"
-#include "platform/SecretMessage.h"
 #include "platform/Services.h"
 
 namespace QVSa {
@@ -52,7 +51,7 @@ void Home::clearRecord() {
                         &emailRContent_, &LoginNewsUrl_, &loginTitle_,   &LoginImageFile_, &customFormIcon_}) {
     value->clear();
   }
-  emailPassword_ = Password();
+  emailPassword_ = StoredPassword();
   AcctDay_ = acctTime_ = 1;
   timeOut_ = 0;
   SMIsOpen_ = false;
@@ -101,7 +100,7 @@ void Home::readMail(Recordset& row) {
   emailContent_ = row["emailContent"].asText();
   emailPContent_ = row["emailPContent"].asText();
   emailRContent_ = row["emailRContent"].asText();
-  emailPassword_ = Password(platform::decryptText(row["emailPassword"].asText(), smtpServer_));
+  emailPassword_ = StoredPassword::read(row["emailPassword"].asText(), smtpServer_);
   smtpState_ = row["smtpState"].asLong();
   smtpAuth_ = row["smtpAuth"].asInteger();
   smtpUseSSL_ = row["smtpUseSSL"].isOne();

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "QVSa/frame/Frame.h"
-#include "QVSa/identity/Password.h"
+#include "QVSa/frame/Password.h"
 
 namespace QVSa {
 
@@ -89,7 +89,7 @@ class Home : private Frame {
   // Mail: the server, the sender, and the letters of self-registration (emailPContent for those accepted,
   // emailRContent for those refused). The password is stored under the server's name.
   String emailPassword() const { return emailPassword_.text(); }
-  void emailPassword(const String& value) { emailPassword_ = Password(value); }
+  void emailPassword(const String& value) { emailPassword_ = StoredPassword(value); }
   Boolean allowSMTP() const { return smtpState_ == 1; }
   void allowSMTP(Boolean value) { smtpState_ = value ? 1 : 0; }
   String emailRContent() const { return emailRContent_; }
@@ -199,7 +199,7 @@ class Home : private Frame {
   String emailContent_;
   String emailPContent_;
   String emailRContent_;
-  Password emailPassword_;
+  StoredPassword emailPassword_;
   Long smtpState_ = 0;
   Integer smtpAuth_ = 0;
   Boolean smtpUseSSL_ = false;

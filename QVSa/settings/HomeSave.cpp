@@ -1,6 +1,5 @@
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/settings/Home.h"
-#include "platform/SecretMessage.h"
 
 namespace QVSa {
 namespace {
@@ -134,7 +133,7 @@ Statement Home::filled(const String& statement) {
       .text("emailContent", emailContent_)
       .text("emailPContent", emailPContent_)
       .text("emailRContent", emailRContent_)
-      .secret("emailPassword", platform::encryptText(emailPassword_.text(), smtpServer_))
+      .secret("emailPassword", emailPassword_.encrypted(trimRight(smtpServer_)))
       .text("ldsName", ldServerName_)
       .text("ldHost", ldHost_)
       .text("ldBaseDN", ldBaseDN_)

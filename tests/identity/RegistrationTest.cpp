@@ -60,7 +60,11 @@ TEST_F(RegistrationTest, AnApplicantWaitsForTheAuditAndThenSignsOn) {
   EXPECT_EQ(tables_.text("select u.accstate,r.checkTime,r.noPassReason from users u,QVUserRegInfo r"
                          " where u.userId=r.UserId"),
             "3|2024-03-08 09:30:00|No <userId>");
-  EXPECT_EQ(failedSignOn(), messageNumber(1118));
+  for (const Long state : {3, 2}) {
+    tables_.run("update users set accstate=" + text(state) + " where userLogin='ann'");
+    EXPECT_TRUE(this->loaded("ann").Save(true));
+    EXPECT_EQ(failedSignOn(), messageNumber(1118)) << "a save is no audit";
+  }
 
   ASSERT_TRUE(loaded.regAudit(true));
   EXPECT_EQ(failedSignOn(), 0);

@@ -103,6 +103,16 @@ TEST_F(TemplateSafe, AnObjectThatIsNotConnectedFails) {
   EXPECT_FALSE(safe_.Save());
 }
 
+TEST_F(TemplateSafe, APasswordOfAnotherKeyIsGivenToNobodyAndKept) {
+  db_.run("update QVTmpSafe set protectPwd='of another key'");
+  String password = "before";
+  EXPECT_TRUE(safe_.connect(installation_.server()) && safe_.Save());
+  EXPECT_FALSE(safe_.getPwd("s1", password));
+  EXPECT_EQ(password, "");
+  EXPECT_EQ(locked(), "default\nown\nsmall\nx-broken") << "it is not the first one";
+  EXPECT_EQ(db_.text("select protectPwd from QVTmpSafe"), "of another key");
+}
+
 TEST_F(TemplateSafe, AFailureBehindTheFirstStepKeepsTheNewPassword) {
   safe_.connect(installation_.server());
   db_.run("drop table QVSys..repTmps");

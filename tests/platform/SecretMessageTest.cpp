@@ -161,7 +161,7 @@ TEST(SecretMessage, IsReadWithWhiteSpaceAnywhere) {
 
 TEST(SecretMessage, ThatIsBrokenGivesAnEmptyTextAndLeavesNoErrorBehind) {
   ERR_clear_error();
-  const String message = writeSealedText(*sealText(greeting, secret, shortIv, salt));
+  const String message = writeSealedText(sealText(greeting, secret, shortIv, salt));
   const std::size_t end = message.find('=');
   for (std::size_t length = 0; length < end; ++length) EXPECT_EQ(decryptText(message.substr(0, length), secret), "");
   for (const char* text : {"\r\n", "plain", "MA==", "MIAAAA==", "MIT/////", "MGkGCSsG=AQQB"}) {
@@ -178,7 +178,7 @@ TEST(SecretMessage, ThatIsBrokenGivesAnEmptyTextAndLeavesNoErrorBehind) {
 }
 
 TEST(SecretMessage, WithAnyByteOfItsStructureChangedIsRefusedOrRead) {
-  const String message = writeSealedText(*sealText(greeting, secret, shortIv, salt));
+  const String message = writeSealedText(sealText(greeting, secret, shortIv, salt));
   Bytes der(message.size());
   EVP_ENCODE_CTX* decoder = EVP_ENCODE_CTX_new();
   int length = 0;

@@ -1,3 +1,4 @@
+#include "platform/SecretMessage.h"
 #include "tests/support/Scene.h"
 
 namespace QVSa {
@@ -75,6 +76,75 @@ TEST_F(Passwords, UnderANewNameThePasswordIsStoredAnewAndTheOldOnesReadNoMore) {
   ann_ = loaded("ann");
   EXPECT_EQ(ann_.Name(), "王小明");
   EXPECT_TRUE(change("two", "right")) << ann_.errDescription();
+}
+
+TEST_F(Passwords, ABlankBehindTheNameShutsNobodyOutAndLetsNobodyIn) {
+  const auto opens = [&](const String& login, const String& password) {
+    return connected<User>().loginAuth(login, password);
+  };
+  auto ben = connected<User>();
+  ben.Name("Ben  ");
+  ben.Login("ben");
+  ben.Pwd("one");
+  ASSERT_TRUE(ben.Save());
+  EXPECT_TRUE(opens("ben", "one"));
+  EXPECT_FALSE(opens("ben", ""));
+  EXPECT_TRUE(ben.chgPwd("one", "two")) << "on the object just saved";
+  EXPECT_TRUE(opens("ben", "two"));
+  EXPECT_FALSE(ben.chgPwd("two", "one")) << "the history is read under the same name";
+  EXPECT_EQ(ben.errNumber(), messageNumber(1120));
+  ann_.Name("Anna ");
+  ASSERT_TRUE(ann_.Save(true));
+  EXPECT_TRUE(opens("ann", "right"));
+  // Another program's row, with the blank.
+  tables_.run("update users set userName='Anna   ',userPwd='" + platform::encryptText("right", "Anna   ") +
+              "' where userLogin='ann'");
+  EXPECT_TRUE(opens("ann", "right"));
+  EXPECT_TRUE(loaded("ann").chgPwd("right", "new"));
+  EXPECT_TRUE(opens("ann", "new"));
+  auto guest = connected<User>();
+  guest.Name("Guest ");
+  guest.Login("guest");
+  guest.Pwd("one");
+  ASSERT_TRUE(guest.Reg("Sales")) << guest.errDescription();
+  ASSERT_TRUE(guest.regAudit(true));
+  EXPECT_TRUE(opens("guest", "one"));
+}
+
+TEST_F(Passwords, ThatDoNotDecryptOpenNothingAndAreKept) {
+  const String foreign = platform::encryptText("right", "of another key");
+  const auto stored = [&] { return tables_.text("select userPwd from users where userLogin='ann'"); };
+  for (const String& text : {foreign, String("no message")}) {
+    tables_.run("update users set userPwd='" + text + "' where userLogin='ann'");
+    auto user = connected<User>();
+    for (const char* guess : {"", "right"}) {
+      EXPECT_FALSE(user.loginAuth("ann", guess)) << guess;
+      EXPECT_FALSE(user.loginAuth_1("ann", platform::md5Hex(guess))) << guess;
+      EXPECT_FALSE(loaded("ann").chgPwd(guess, "mine")) << guess;
+    }
+    user = loaded("ann");
+    user.Name("Anna");
+    EXPECT_TRUE(user.Save(true));
+    EXPECT_EQ(stored(), text);
+  }
+  auto user = loaded("ann");
+  user.Pwd("");
+  EXPECT_TRUE(user.Save(true));
+  EXPECT_TRUE(user.loginAuth("ann", "")) << "set, and so the empty one";
+}
+
+TEST_F(Passwords, AreChangedOnTheObjectOfAUserAlone) {
+  auto user = connected<User>();
+  EXPECT_FALSE(user.chgPwd("", "mine"));
+  EXPECT_EQ(user.errNumber(), messageNumber(1121)) << "nobody was loaded";
+  EXPECT_FALSE(user.loginAuth("ann", "wrong"));
+  EXPECT_FALSE(user.chgPwd("", "mine")) << "refused at his sign-on";
+  EXPECT_EQ(user.errNumber(), messageNumber(1121));
+  auto users = connected<Users>();
+  ASSERT_TRUE(users.GetAll());
+  EXPECT_FALSE(users.Item("Ann")->chgPwd("", "mine")) << "a list has no passwords";
+  EXPECT_TRUE(user.loginAuth("ann", "right")) << user.errDescription();
+  EXPECT_TRUE(user.chgPwd("right", "mine"));
 }
 
 TEST_F(Passwords, ThePolicyHoldsForEveryChangeButForTheSaveOfForeignAccounts) {
