@@ -95,22 +95,17 @@ Answer list(const Console& console, const Options& options) {
   return page(log, options);
 }
 
-// The library puts the parts of users and templates into its statement as they stand.
-String withoutQuotes(const String& parts) {
-  if (parts.find('\'') != String::npos) throw Misuse("Users and templates can't hold a quote here.");
+// The library puts the parts of users and templates into its statement as they are.
+String quoted(const String& parts) {
   if (parts.rfind(',', 0) == 0) throw Misuse("A list can't begin with a comma.");
-  return parts;
+  return replaceAll(parts, "'", "''");
 }
 
 Answer query(const Console& console, const Options& options) {
   LogRecords log;
   console.connect(log);
-  std::vector<Variant> values{day(options.from),
-                              day(options.to),
-                              options.computer,
-                              withoutQuotes(options.user),
-                              withoutQuotes(options.templates),
-                              options.words};
+  std::vector<Variant> values{day(options.from),    day(options.to),           options.computer,
+                              quoted(options.user), quoted(options.templates), options.words};
   require(log.GetLogByQuery(values, options.type), log);
   return page(log, options);
 }

@@ -65,7 +65,8 @@ class Frame {
   Long errNumber() const { return errNumber_; }
   String errDescription() const { return errDescription_; }
 
-  // Keeps both names and builds the connection string; opens nothing. An empty DBName means QVSys.
+  // Keeps both names and builds the connection string; opens nothing. An empty DBName means QVSys. Both go into the
+  // string as they are and must hold no semicolon.
   Boolean connect(const String& server, const String& DBName = "");
 
   const String& server() const { return server_; }

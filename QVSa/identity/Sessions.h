@@ -15,7 +15,8 @@ class Sessions : private Frame {
   using Frame::errNumber;
 
   // Keeps both names and reads the list. True also where the list could not be read: errNumber then tells, and the
-  // list is empty. `DBName` is the application database whose numbers Terminate gives back.
+  // list is empty. `DBName` is the application database whose numbers Terminate gives back; there it goes into
+  // a statement as it is.
   Boolean connect(const String& server, const String& DBName = "");
 
   // Throws 6 for more than 32,767.

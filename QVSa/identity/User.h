@@ -120,7 +120,7 @@ class User : private Frame {
   Boolean Save(Boolean passPwdCheck = false);
   // Deletes the user (0: this one). His jobs stay in the table.
   Boolean Delete(Long Id = 0);
-  // The job ids for the next save, comma-separated.
+  // The job ids for the next save, comma-separated: SQL of the caller's own, which goes into the statement as it is.
   Boolean setJobs(const String& jobList);
   Boolean setDept(const Department& dept);
 
@@ -130,7 +130,9 @@ class User : private Frame {
   // 0x8004046C address not permitted, 0x8004046D signed on elsewhere, 0x8004045E locked or in another state than 0,
   // 0x80040452 wrong password, 0x80040463 wrong domain password. True with 0x8004045F and an empty `sI`: the password
   // has expired, only its change is allowed. errNumber is not cleared by a success: look at the result, then at `sI`.
-  // Throws Failure 6 on level 1 where the stored password has a character that does not fit one byte.
+  // Attempts at one account that run at the same moment each count for themselves and may all be answered before the
+  // lock is written: a limit of 3 let 8 guesses at once through. A host that faces people makes them one after the
+  // other. Throws Failure 6 on level 1 where the stored password has a character that does not fit one byte.
   Boolean loginAuth(const String& loginName, const String& Pwd, String* sI = nullptr, Boolean authLd = false,
                     const String& ipAddr = "", const String& hostName = "", const Integer* userVerifyLevel = nullptr);
   // Whether `pwdMd5` is the md5Hex of the user's password: no counter, no lock, no session. Throws as loginAuth does.

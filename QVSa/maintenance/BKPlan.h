@@ -22,7 +22,8 @@ class BKPlan : private Frame {
   void Name(String value) { Name_ = std::move(value); }
   // 0 for a plan not yet saved.
   Long Id() const { return Id_; }
-  // A folder that exists, as the database server sees it.
+  // A folder that exists, as the database server sees it. It goes into the statements of a backup as it is and must
+  // hold no quote.
   String bkPath() const { return bkPath_; }
   void bkPath(String value) { bkPath_ = std::move(value); }
   // Made at its first use.

@@ -21,10 +21,11 @@ class DBMgr : private Frame {
   Boolean BackUpDB(const String& ServerName, const String& sysFile, const String& appFile, const String& regPwd = "",
                    const String& tpPwd = "");
 
-  // Replaces QVSys, then QVApp, with the login `saUid`; waits without limit until everybody else has left each of them.
-  // An older system database is brought up to the present tables, sessions and check-outs are cleared. `flag` plays no
-  // part. Each database is restored whole or not at all, the two not together: the system database stays restored where
-  // the application database fails. 0x80040B57 or 0x80040B58 a file is missing, as seen from here.
+  // Replaces QVSys, then QVApp, with the login `saUid`, whose name and password must hold no semicolon; waits without
+  // limit until everybody else has left each of them. An older system database is brought up to the present tables,
+  // sessions and check-outs are cleared. `flag` plays no part. Each database is restored whole or not at all, the two
+  // not together: the system database stays restored where the application database fails. 0x80040B57 or 0x80040B58 a
+  // file is missing, as seen from here.
   Boolean RestoreDB(const String& ServerName, const String& sysFile, const String& appFile, const String& saPwd,
                     Boolean flag = false, const String& saUid = "sa");
 

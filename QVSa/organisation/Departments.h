@@ -18,9 +18,9 @@ class Departments : public Collection<Department> {
   std::shared_ptr<Department> Add(const String& Id, const String& Name, const String& Super = "", Boolean isOrg = false,
                                   String* InnerId = nullptr, String* fullName = nullptr);
 
-  // The tree, each department behind those above it, or the subtrees of `deptIds`: inner ids, comma-separated, which
-  // go into the statement as they are. `outer`: 0 inside departments, 1 outside ones, -1 both, the inside ones first;
-  // any other: all, in no order. A number that occurs twice ends the list with 457.
+  // The tree, each department behind those above it, or the subtrees of `deptIds`: inner ids, comma-separated, SQL of
+  // the caller's own, which goes into the statement as it is. `outer`: 0 inside departments, 1 outside ones, -1 both,
+  // the inside ones first; any other: all, in no order. A number that occurs twice ends the list with 457.
   Boolean GetAll(Integer outer = -1, const String& deptIds = "");
   // The tree level by level, by number within a level. `outer` as for GetAll.
   Boolean GetAllWithLevel(Integer outer = -1);

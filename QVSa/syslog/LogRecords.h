@@ -52,7 +52,8 @@ class LogRecords : private Frame {
   // As GetAll, by six values: start and end date, a part of the computer's name, of the user's name or login, of the
   // template's full name, of the description. The dates 1900-01-01 and empty texts set no limit; users and templates
   // may be lists with "," between. An end before the start is set to 1900-01-01 in the caller's list. Of fewer values:
-  // False without a report. The parts of users and templates go into the statement as they stand.
+  // False without a report. The parts of users and templates are SQL of the caller's own, inside '%...%': they go into
+  // the statement as they are, so double their quotes.
   Boolean GetLogByQuery(std::vector<Variant>& arrList, Long LogType = 0, const String& ordByFld = "", Integer ordBy = 0,
                         Integer app = 0);
 
