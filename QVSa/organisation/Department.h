@@ -49,8 +49,10 @@ class Department : private Frame {
   Boolean GetOne(Integer keyName, const String& keyValue);
   // Inserts the department, or updates it where `InnerId` is not 0; a change of place or name rewrites the paths and
   // full names of all below it, in the same transaction. A place inside its own subtree is not refused. 0x800403EA
-  // number or name empty, 0x800403EB no such superior. An insert is not one transaction: where its last step fails, the
-  // row stays without a path, with `InnerId` set; delete it before trying again.
+  // number or name empty, 0x800403EB no such superior, 0x80040E57 too deep: a path has room for 850 characters, 121
+  // levels where the inner ids have six digits, and a full name for 4,000.
+  // An insert is not one transaction: where it fails behind its first statement, the row is there without a path. With
+  // `InnerId` set, another Save gives it one and changes no other row; with 0, delete it by its number first.
   Boolean Save();
   // Deletes the department numbered `Id` (empty: this one) and its jobs. 0x800403E9 there is none, 0x800403EC it has
   // sub departments, 0x800403EE it has users. Not one transaction: the jobs stay removed where the last step fails.
@@ -76,6 +78,7 @@ class Department : private Frame {
   void findOrganisation(Connection& connection, const String& myPath);
 
   Boolean insertDept();
+  void requireRoomBelow(const String& path) const;
   Boolean updateDept();
   std::optional<Superior> findSuper(Connection& connection);
   Stored readStored(Connection& connection);

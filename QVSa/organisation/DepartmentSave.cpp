@@ -5,6 +5,7 @@ namespace QVSa {
 namespace {
 
 const char* const root = "_root";
+constexpr std::size_t longestPath = 850;  // of the column
 
 String joinNames(const String& superior, const String& name) { return superior + LoadResString(1005) + trim(name); }
 
@@ -16,10 +17,10 @@ struct Department::Place {
   String fullName;
 };
 
-// The superior as a department below it sees it.
+// The superior as a department below it sees it; empty where its own column is NULL.
 struct Department::Superior {
-  std::optional<String> path;  // nothing for NULL
-  String fullNameBelow;        // empty where the superior's is NULL
+  String path;
+  String fullNameBelow;
 };
 
 // What the row held before the update.
@@ -47,8 +48,9 @@ Boolean Department::insertDept() {
   } else {
     const auto superior = findSuper(connection);
     if (!superior) return refuse(1003);
-    place = {trim(superior->path.value_or("")), superior->fullNameBelow};
+    place = {trim(superior->path), superior->fullNameBelow};
   }
+  requireRoomBelow(place.path);
 
   connection.Execute(sql("insert into departments(deptNo,deptName,superDept,fullName,isOrg,isOuter) "
                          " values(<deptNo>,<deptName>,<superDept>,<fullName>,<isOrg>,<isOuter>)")
@@ -73,6 +75,15 @@ Boolean Department::insertDept() {
   return true;
 }
 
+// The last statement of the insert must not find that the path is too long. The new id is not known before, but it has
+// no fewer digits than the superior's, which was given out earlier.
+void Department::requireRoomBelow(const String& path) const {
+  if (path.size() + text(superInnerId_).size() + 1 <= longestPath) return;
+  throw Failure(number::range, "Department",
+                "The department lies too deep in the tree: its path would be longer than " +
+                    text(static_cast<Long>(longestPath)) + " characters.");
+}
+
 Boolean Department::updateDept() {
   Connection connection = open();
   connection.Execute("set nocount on");
@@ -82,7 +93,9 @@ Boolean Department::updateDept() {
 
   connection.BeginTrans();
   updateRow(connection, *place);
-  if (place->path != stored.path || Name_ != stored.deptName) rewriteSubtree(connection, stored, *place);
+  const bool hasChanged = place->path != stored.path || Name_ != stored.deptName;
+  // The pattern of no path would be that of every department.
+  if (hasChanged && !stored.path.empty()) rewriteSubtree(connection, stored, *place);
   connection.CommitTrans();
   fullName_ = place->fullName;
   return true;
@@ -95,7 +108,7 @@ std::optional<Department::Superior> Department::findSuper(Connection& connection
   if (row.EOF_()) return std::nullopt;
   superInnerId_ = row["deptId"].asLong();
   Superior superior;
-  if (!row["path"].isNull()) superior.path = row["path"].asText();
+  superior.path = row["path"].asText();
   if (row["fullName"].isNull()) return superior;
   superior.fullNameBelow = row["deptNo"].asText() == root ? Name_ : joinNames(trim(row["fullName"].asText()), Name_);
   return superior;
@@ -117,12 +130,13 @@ std::optional<Department::Place> Department::locate(Connection& connection, cons
     superInnerId_ = 0;
     return Place{"." + own, trim(Name_)};
   }
-  if (Super_ == stored.superNo) {
+  // A row without a path, as an insert leaves it that lost its last statement, gets one from the superior.
+  if (Super_ == stored.superNo && !stored.path.empty()) {
     return Place{stored.path, Super_ == root ? trim(Name_) : joinNames(stored.superFullName, Name_)};
   }
   const auto superior = findSuper(connection);
   if (!superior) return std::nullopt;
-  return Place{superior->path ? *superior->path + own : "", superior->fullNameBelow};
+  return Place{superior->path + own, superior->fullNameBelow};
 }
 
 void Department::updateRow(Connection& connection, const Place& place) {

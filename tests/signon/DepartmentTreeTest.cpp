@@ -1,3 +1,4 @@
+#include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
 
 namespace QVSa {
@@ -123,6 +124,46 @@ TEST_F(DepartmentTree, NullsInTheColumnsOfTheTree) {
   tables_.run("update departments set fullName=null where deptNo='E'");
   add("M", "More", "E");
   EXPECT_EQ(tree().back(), "M|8.|");
+}
+
+TEST_F(DepartmentTree, ADepartmentWithoutAPathIsSavedAloneAndGetsItsPath) {
+  auto added = connected<Department>();
+  added.Id("N");
+  added.Name("New");
+  added.Super("E");
+  {
+    test::RecordingProvider recorder;
+    recorder.failAt(6, Failure(number::timeout, "server", "late."));
+    ASSERT_FALSE(added.Save());
+    EXPECT_EQ(recorder.log().back(), "close");
+  }
+  EXPECT_EQ(tree().back(), "N|-|Sales-East-New");
+  Lines expected = tree();
+  added.Name("Newer");
+  ASSERT_TRUE(added.Save()) << added.errDescription();
+  expected.back() = "N|.1.3.4.7.|Sales-East-Newer";
+  EXPECT_EQ(tree(), expected);
+
+  // Below one without a path it can be no better off, but it can be moved away again with all that it has below it.
+  tables_.run("update departments set path=null where deptNo='O'");
+  move("E", "O");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|4.|Overseas-East", "H|4.5.|Overseas-East-Hub", "O|-|Overseas",
+                           "N|4.7.|Overseas-East-Newer"}));
+  move("E", "S");
+  expected[3] = "O|-|Overseas";
+  EXPECT_EQ(tree(), expected);
+}
+
+TEST_F(DepartmentTree, ADepartmentTooDeepForItsPathIsNotInserted) {
+  tables_.run("update departments set path=replicate('.1',424)+'.' where deptNo='H'");
+  auto deep = connected<Department>();
+  deep.Id("D");
+  deep.Name("Deep");
+  deep.Super("H");
+  EXPECT_FALSE(deep.Save());
+  EXPECT_EQ(deep.errNumber(), number::range);
+  EXPECT_EQ(deep.InnerId(), 0);
+  EXPECT_EQ(tree().size(), 4U);
 }
 
 TEST_F(DepartmentTree, AnUnknownNumberLeavesTheRootAsOrganisation) {
