@@ -22,12 +22,11 @@ Boolean safeRule::GetOne() {
   return operation(plain(), [&] {
     Connection connection = open();
     Recordset row = connection.Execute("select * from saferule where id=1");
-    if (row.EOF_()) {
-      clear();
-    } else {
-      read(row);
-    }
-    loaded_ = true;
+    // Taken over when it was read to its end: nothing is to be judged by half a policy.
+    safeRule whole = *this;
+    row.EOF_() ? whole.clear() : whole.read(row);
+    whole.loaded_ = true;
+    *this = whole;
     return true;
   });
 }

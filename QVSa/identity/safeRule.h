@@ -44,12 +44,14 @@ class safeRule : private Frame {
   Boolean awakeManual() const { return awakeManual_; }
   void awakeManual(Boolean value) { awakeManual_ = value; }
 
-  // Loads the row. Where there is none, every property is 0 or False, and the result is True.
+  // Loads the row. Where there is none, every property is 0 or False, and the result is True; a failure changes none.
   Boolean GetOne();
-  // Writes the row. With lockErr False it also unlocks every account that was locked.
+  // Writes the row. With lockErr False it also unlocks every account that was locked; the counters of failed sign-ons
+  // stay, and count once lockErr is True again.
   Boolean Save();
   // Whether `s` may be a password. Otherwise errNumber is 0x80040BB8 and errDescription holds what is missing, one
-  // sentence directly behind the other; it is empty after a success. Where the policy can't be read, every text passes.
+  // sentence directly behind the other; it is empty after a success. Where the policy can't be read, the properties
+  // judge as they stand: those of a fresh object let every text pass.
   Boolean checkPwd(const String& s);
 
  private:

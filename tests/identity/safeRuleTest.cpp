@@ -2,6 +2,7 @@
 
 #include "QVSa/identity/safeRule.h"
 #include "QVSa/resources/Messages.h"
+#include "tests/support/FakeSession.h"
 
 namespace QVSa {
 namespace {
@@ -41,6 +42,17 @@ TEST(SafeRule, AnyCharacterBesidesLettersAndDigitsIsASpecialOne) {
   EXPECT_FALSE(rule.checkPwd(""));
   EXPECT_TRUE(rule.checkPwd("aB 1"));
   EXPECT_TRUE(rule.checkPwd("密"));
+}
+
+TEST(SafeRule, APolicyReadHalfWayIsNotJudgedBy) {
+  test::FakeServer server;
+  server.answer("select * from saferule where id=1",
+                {{{"minLen"}, {"maxDay"}, {"charSet"}}, {{Integer{6}, Integer{30}, "111"}}});
+  safeRule rule;
+  rule.connect("host");
+  EXPECT_FALSE(rule.GetOne());
+  EXPECT_TRUE(rule.checkPwd("")) << rule.errDescription();
+  EXPECT_EQ(rule.maxDay(), 0);
 }
 
 }  // namespace
