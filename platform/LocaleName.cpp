@@ -2,6 +2,8 @@
 
 #include <cstdlib>
 
+#include "QVSa/frame/Text.h"
+
 namespace QVSa::platform {
 
 namespace {
@@ -26,7 +28,8 @@ String cutAt(String& text, char separator) {
 }  // namespace
 
 bool LocaleName::isTraditionalChinese() const {
-  return language == "zh" && (territory == "TW" || territory == "HK" || territory == "MO");
+  if (language != "zh") return false;
+  return script.empty() ? territory == "TW" || territory == "HK" || territory == "MO" : script == "Hant";
 }
 
 LocaleName localeName(const char* category) {
@@ -34,8 +37,11 @@ LocaleName localeName(const char* category) {
   cutAt(rest, '@');
   LocaleName locale;
   locale.encoding = cutAt(rest, '.');
-  locale.territory = cutAt(rest, '_');
-  locale.language = rest;
+  const std::vector<String> parts = split(rest, '_');
+  locale.language = parts.front();
+  constexpr std::size_t scriptLength = 4;
+  for (std::size_t i = 1; i < parts.size(); ++i)
+    (parts[i].size() == scriptLength ? locale.script : locale.territory) = parts[i];
   return locale;
 }
 

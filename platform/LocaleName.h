@@ -4,14 +4,15 @@
 
 namespace QVSa::platform {
 
-// A locale's name taken apart: "zh_TW.BIG5@stroke" has the language "zh", the territory "TW" and the encoding "BIG5".
-// What the name does not have is empty.
+// A locale's name taken apart: "zh_Hant_TW.BIG5@stroke" has the language "zh", the script "Hant", the territory "TW"
+// and the encoding "BIG5". What the name does not have is empty.
 struct LocaleName {
   String language;
+  String script;
   String territory;
   String encoding;
 
-  // The Chinese of Taiwan, Hong Kong and Macao.
+  // By the script where there is one; else the Chinese of Taiwan, Hong Kong and Macao.
   bool isTraditionalChinese() const;
 };
 

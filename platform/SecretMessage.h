@@ -22,8 +22,8 @@ std::optional<String> decrypt(const String& cipher, const String& secret);
 // The same with the empty text for nothing.
 String decryptText(const String& cipher, const String& secret);
 
-// MD5 of the text in the system's ANSI code page (see CodePage.h), as 32 hexadecimal digits in upper case. Throws
-// Failure 6 for a character that does not fit one byte.
+// MD5 of the text in the system's ANSI code page (see CodePage.h), as 32 hexadecimal digits in upper case. What the
+// code page lacks counts as "?"; throws Failure 6 for a character that takes two bytes there.
 String md5Hex(const String& text);
 
 // Overwrites the text's memory, then empties it.

@@ -61,7 +61,8 @@ TEST(Messages, FollowTheEnvironmentsLocaleAtEachCall) {
   EXPECT_EQ(locked({{"LC_CTYPE", "zh_CN.UTF-8"}}), "Locked");
   EXPECT_EQ(locked({{"LANG", "zh"}}), "已锁定");
   EXPECT_EQ(locked({{"LC_ALL", ""}, {"LC_MESSAGES", "zh_SG.UTF-8"}, {"LANG", "zh_TW"}}), "已锁定");
-  for (const char* name : {"zh_TW.UTF-8", "zh_HK", "zh_MO@x"}) EXPECT_EQ(locked({{"LANG", name}}), "已鎖定") << name;
+  for (const char* name : {"zh_TW.UTF-8", "zh_HK", "zh_MO@x", "zh_Hant", "zh_Hant_CN.UTF-8"})
+    EXPECT_EQ(locked({{"LANG", name}}), "已鎖定") << name;
 }
 
 TEST(Messages, WithoutATextAreRefused) {

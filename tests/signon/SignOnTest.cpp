@@ -4,6 +4,7 @@
 
 #include "platform/SecretMessage.h"
 #include "platform/Services.h"
+#include "tests/support/EnvironmentLocale.h"
 #include "tests/support/Failures.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
@@ -269,6 +270,11 @@ TEST_F(SignOn, ADigestIsComparedInEitherCaseAndNeverCounted) {
   EXPECT_TRUE(user.loginAuth_1("ann", digest)) << "the digest alone is asked";
 
   addUser("wide", [](User& wide) { wide.Pwd("密"); });
+  {
+    const test::EnvironmentLocale western("en_US.UTF-8");
+    EXPECT_TRUE(user.loginAuth_1("wide", platform::md5Hex("?"))) << "its code page lacks the character";
+  }
+  const test::EnvironmentLocale chinese("zh_CN.UTF-8");
   EXPECT_EQ(test::failureOf([&] { signOn({.login = "wide", .level = 1}); }), number::overflow);
   EXPECT_EQ(test::failureOf([&] { user.loginAuth_1("wide", digest); }), number::overflow);
 }
