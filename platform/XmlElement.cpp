@@ -1,8 +1,23 @@
 #include "platform/XmlElement.h"
 
+#include <algorithm>
 #include <pugixml.hpp>
 
+#include "QVSa/frame/Text.h"
+
 namespace QVSa::platform {
+
+namespace {
+
+// The document ends a text at a zero, so these have to be gone before.
+String allowed(const String& text) {
+  if (std::ranges::all_of(text, [](char c) { return c >= ' ' && c < 0x7F; })) return text;
+  std::u16string units = toUtf16(text);
+  std::erase_if(units, [](char16_t c) { return (c < 0x20 && c != '\t' && c != '\n' && c != '\r') || c >= 0xFFFE; });
+  return fromUtf16(units);
+}
+
+}  // namespace
 
 struct XmlWriter : pugi::xml_writer {
   String output;
@@ -11,8 +26,8 @@ struct XmlWriter : pugi::xml_writer {
 
   static void build(pugi::xml_node parent, const XmlElement& element) {
     pugi::xml_node node = parent.append_child(element.name_.c_str());
-    for (const auto& [name, value] : element.attributes_) node.append_attribute(name.c_str()) = value.c_str();
-    if (!element.content_.empty()) node.text() = element.content_.c_str();
+    for (const auto& [name, value] : element.attributes_) node.append_attribute(name.c_str()) = allowed(value).c_str();
+    if (!element.content_.empty()) node.text() = allowed(element.content_).c_str();
     for (const XmlElement& child : element.children_) build(node, child);
   }
 };

@@ -17,7 +17,8 @@ class XmlElement {
   void append(XmlElement child) { children_.push_back(std::move(child)); }
 
   // The element as one line without a declaration: <ns><n ymd="...">AB001</n></ns>, an empty one <ns/>. Line breaks in
-  // attributes are written as character references.
+  // attributes are written as character references; characters that XML 1.0 forbids are left out, and bytes that are no
+  // UTF-8 are written as U+FFFD.
   String text() const;
 
  private:

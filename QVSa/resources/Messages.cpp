@@ -42,7 +42,7 @@ String fillMsg(const String& text, const std::vector<Variant>& values) {
   for (const Variant& value : values) {
     const std::size_t place = filled.find('@');
     if (place == String::npos) break;
-    filled.replace(place, 1, "[" + value.toText() + "]");
+    filled.replace(place, 1, "[" + (value.isNull() ? "" : value.toText()) + "]");
   }
   return filled;
 }

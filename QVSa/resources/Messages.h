@@ -15,7 +15,8 @@ Language systemLanguage();
 String LoadResString(Long id);
 String LoadResString(Long id, Language language);
 
-// Fills the "@" places of `text` in order, each with "[" value "]". Surplus values are dropped, surplus places stay.
+// Fills the "@" places of `text` in order, each with "[" value "]", Null as the empty text. Surplus values are dropped,
+// surplus places stay.
 String fillMsg(const String& text, const std::vector<Variant>& values);
 
 }  // namespace QVSa

@@ -6,9 +6,14 @@ namespace {
 
 enum QueryValue : std::size_t { startDate, endDate, computerPart, userParts, templateParts, descriptionPart };
 
-bool isSet(const Variant& value) { return !value.toText().empty(); }
+// Null is not set, and compares with nothing.
+Date dateOf(const Variant& value) { return value.isNull() ? Date::empty() : value.toDate(); }
+String textOf(const Variant& value) { return value.isNull() ? String() : value.toText(); }
+bool isAfter(const Variant& start, const Variant& end) {
+  return !start.isNull() && !end.isNull() && start.toDate() > end.toDate();
+}
 
-String anywhere(const Variant& value) { return "%" + value.toText() + "%"; }
+String anywhere(const String& text) { return "%" + text + "%"; }
 
 // The parts stand in the statement as the caller wrote them, quotes and all.
 String userIs(const String& part) { return "UserName like '%" + part + "%' or UserLogin like  '%" + part + "%'"; }
@@ -87,18 +92,18 @@ Boolean LogRecords::GetLogByQuery(std::vector<Variant>& arrList, Long LogType, c
   return operation(prefixed(1702), [&] {
     startQuery();
     if (arrList.size() <= descriptionPart) return false;
-    if (arrList[startDate].toDate() > arrList[endDate].toDate()) arrList[endDate] = Date::empty();
+    if (isAfter(arrList[startDate], arrList[endDate])) arrList[endDate] = Date::empty();
     const String statement = head() + " from sysLog l left outer join repTmps rt on l.rtId=rt.rtUid" +
                              " where logType=" + text(LogType) + " " + queryConditions(arrList) +
                              " order by logTime desc";
     // The applications of the library's own hosts have no names here.
     return showRows(sql(statement)
                         .date("startDate", arrList[startDate])
-                        .date("endDate", arrList[endDate].toDate().addDays(1))
-                        .text("OpComputer", anywhere(arrList[computerPart]))
-                        .raw("userCondition", userCondition(arrList[userParts].toText()))
-                        .raw("templateCondition", templateCondition(arrList[templateParts].toText()))
-                        .text("desc", anywhere(arrList[descriptionPart]))
+                        .date("endDate", dateOf(arrList[endDate]).addDays(1))
+                        .text("OpComputer", anywhere(textOf(arrList[computerPart])))
+                        .raw("userCondition", userCondition(textOf(arrList[userParts])))
+                        .raw("templateCondition", templateCondition(textOf(arrList[templateParts])))
+                        .text("desc", anywhere(textOf(arrList[descriptionPart])))
                         .text("app0", "")
                         .text("app1", "")
                         .text("app2", ""),
@@ -107,11 +112,12 @@ Boolean LogRecords::GetLogByQuery(std::vector<Variant>& arrList, Long LogType, c
 }
 
 String LogRecords::queryConditions(const std::vector<Variant>& arrList) {
-  String conditions = dateCondition(arrList[startDate].toDate(), arrList[endDate].toDate());
-  if (isSet(arrList[computerPart])) conditions += " and Computer like <OpComputer>";
-  if (isSet(arrList[userParts])) conditions += "<userCondition>";
-  if (isSet(arrList[templateParts])) conditions += "<templateCondition>";
-  if (isSet(arrList[descriptionPart])) conditions += " and opDesc like <desc>";
+  const auto isSet = [&](QueryValue place) { return !textOf(arrList[place]).empty(); };
+  String conditions = dateCondition(dateOf(arrList[startDate]), dateOf(arrList[endDate]));
+  if (isSet(computerPart)) conditions += " and Computer like <OpComputer>";
+  if (isSet(userParts)) conditions += "<userCondition>";
+  if (isSet(templateParts)) conditions += "<templateCondition>";
+  if (isSet(descriptionPart)) conditions += " and opDesc like <desc>";
   return conditions;
 }
 

@@ -11,7 +11,8 @@ const String hardTexts[] = {"O'Brien''s",
                             "-- ; drop table roles",
                             "\xF0\x9F\x98\x80 smiles",
                             "\xE9\x94\x80\xE5\x94\xAE\xE9\x83\xA8",
-                            "a|b\"c\\d\te"};
+                            "a|b\"c\\d\te",
+                            "bell\x07 and \xEF\xBF\xBF"};
 
 class HardTextsTest : public test::Company {
  protected:
@@ -59,7 +60,12 @@ TEST_F(HardTextsTest, AnXmlKeepsThem) {
   ASSERT_TRUE(manager_.GetUsers2(holders));
   const String members = addGroup("All", join(ids, ",")).GetUsers();
   for (String name : hardTexts) {
-    for (const auto& [sign, written] : {std::pair("&", "&amp;"), {"<", "&lt;"}, {"\"", "&quot;"}, {"\t", "&#09;"}})
+    for (const auto& [sign, written] : {std::pair("&", "&amp;"),
+                                        {"<", "&lt;"},
+                                        {"\"", "&quot;"},
+                                        {"\t", "&#09;"},
+                                        {"\x07", ""},
+                                        {"\xEF\xBF\xBF", ""}})
       name = replaceAll(name, sign, written);
     for (const String& xml : {holders, members}) EXPECT_NE(xml.find(" name=\"" + name + "\" "), String::npos) << xml;
   }

@@ -83,6 +83,7 @@ TEST(FillMsg, PutsValuesInBracketsIntoThePlacesFromTheLeft) {
   EXPECT_EQ(fillMsg("@", {"a", "b"}), "[a]");
   EXPECT_EQ(fillMsg("none", {"a", "b"}), "none");
   EXPECT_EQ(fillMsg("@ @", {}), "@ @");
+  EXPECT_EQ(fillMsg("@ @", {Variant::null(), Variant()}), "[] []");
 }
 
 TEST(FillMsg, FindsAPlaceThatAValueBroughtIn) { EXPECT_EQ(fillMsg("@ on @", {"a@b", "c"}), "[a[c]b] on @"); }

@@ -115,6 +115,8 @@ TEST_F(LogQueries, AllAsksByTypeDaysUserTemplateAndDescription) {
   EXPECT_EQ(all(never, never, 0, "", "BETA"), "b a");
   EXPECT_TRUE(log_.GetAll(3));
   EXPECT_EQ(found(), "d");
+  EXPECT_FALSE(log_.GetAll(0, never, Date(9999, 12, 31)));
+  EXPECT_EQ(log_.errNumber(), number::overflow);
 }
 
 TEST_F(LogQueries, TheWebPageAloneGetsItems) {
@@ -171,6 +173,19 @@ TEST_F(LogQueries, TheListsDaysCountInWholeAndOneDayTakesTheNextMidnightAsWell) 
   ASSERT_TRUE(log_.GetLogByQuery(turned));
   EXPECT_EQ(found(), "e d c");
   EXPECT_EQ(turned[1], Variant(never));
+  std::vector<Variant> endless = query(never, Date(9999, 12, 31));
+  EXPECT_FALSE(log_.GetLogByQuery(endless));
+  EXPECT_EQ(log_.errNumber(), number::overflow) << "no day is behind it";
+}
+
+TEST_F(LogQueries, ANullInTheListIsNotSet) {
+  write("a", "20240305");
+  std::vector<Variant> nulls(6, Variant::null());
+  EXPECT_EQ(foundBy(nulls), "a");
+  nulls[0] = Date(2024, 3, 6);
+  ASSERT_TRUE(log_.GetLogByQuery(nulls));
+  EXPECT_EQ(found(), "");
+  EXPECT_TRUE(nulls[1].isNull()) << "no end that the start could be behind";
 }
 
 TEST_F(LogQueries, TheListsPartsAreFoundAnywhere) {
