@@ -9,6 +9,26 @@
 #include "platform/Services.h"
 
 namespace QVSa {
+namespace {
+
+// What a sign-on gives its caller, at its end and not before: the text may be the one of another argument.
+class SessionId {
+ public:
+  explicit SessionId(String* given) : given_(given) {}
+  ~SessionId() {
+    if (given_ != nullptr) *given_ = std::move(value_);
+  }
+  SessionId(const SessionId&) = delete;
+  SessionId& operator=(const SessionId&) = delete;
+
+  void set(const String& value) { value_ = value; }
+
+ private:
+  String* given_;
+  String value_;
+};
+
+}  // namespace
 
 // The password stage of the load; False ends the load. A wrong password does not: it is counted here, so that the
 // counter moves in one place, and loginAuth decides later what to say.
@@ -47,7 +67,7 @@ void User::countFailure(Connection& connection) {
 
 Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, Boolean authLd, const String& ipAddr,
                         const String& hostName, const Integer* userVerifyLevel) {
-  if (sI != nullptr) sI->clear();
+  SessionId given(sI);
   const Integer level = userVerifyLevel == nullptr ? Integer{0} : *userVerifyLevel;
   Boolean wrongPwd = false;
   if (!GetOne(3, loginName, level <= 0, Pwd, &wrongPwd, authLd)) return false;
@@ -58,8 +78,9 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
   if (!hostName.empty() && !synLogin_) {
     sessions.connect(server(), "");
     for (const auto& session : sessions) {
-      const Boolean elsewhere =
-          session->DBName() == DBName() && session->UserLogin() == loginName && session->Computer() != hostName;
+      // The row has its texts without trailing blanks.
+      const Boolean elsewhere = session->DBName() == DBName() && session->UserLogin() == trimRight(loginName) &&
+                                session->Computer() != trimRight(hostName);
       if (elsewhere) return refuse(1133, {session->Computer()});
     }
   }
@@ -78,7 +99,7 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
   sessions.connect(server(), "");
   const String id = sessions.newSession(loginName, hostName, DBName(), split(ipAddr, '|').front());
   if (id.empty()) return refuseAs(sessions);
-  if (sI != nullptr) *sI = id;
+  given.set(id);
   return true;
 }
 

@@ -248,8 +248,10 @@ TEST_F(SignOn, AnotherSessionCountsForANamedComputerTheSameDatabaseAndTheSameSpe
   openSession("ann", "pc2", "QVSys");
   openSession("ben", "pc2", "QVApp");
   EXPECT_TRUE(signOn()) << user_.errDescription();
+  EXPECT_TRUE(signOn({.login = "ann ", .hostName = "pc1 "})) << "stored without the blank";
   openSession("ann", "PC1", "QVApp");
   expectRefused({}, 1133);
+  expectRefused({.login = "ann "}, 1133);
   EXPECT_TRUE(signOn({.hostName = ""}));
   changeAnn("synLogin=1");
   EXPECT_TRUE(signOn());
@@ -277,6 +279,13 @@ TEST_F(SignOn, ADigestIsComparedInEitherCaseAndNeverCounted) {
   const test::EnvironmentLocale chinese("zh_CN.UTF-8");
   EXPECT_EQ(test::failureOf([&] { signOn({.login = "wide", .level = 1}); }), number::overflow);
   EXPECT_EQ(test::failureOf([&] { user.loginAuth_1("wide", digest); }), number::overflow);
+}
+
+TEST_F(SignOn, TheSessionMayComeInTheTextOfAnArgument) {
+  auto user = connected<User>();
+  String login = "ann";
+  EXPECT_TRUE(user.loginAuth(login, "right", &login)) << user.errDescription();
+  EXPECT_EQ(login, tables_.text("select sesId from seslog"));
 }
 
 TEST_F(SignOn, WhereTheHostVouchesOnlyThePasswordIsNotAsked) {
