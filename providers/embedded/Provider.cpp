@@ -27,7 +27,11 @@ class EmbeddedProvider : public QVSa::Provider {
                                        "failed.");
     const bool isAdministrator = options.integrated || sameName(options.user, administrator);
     try {
-      return std::make_unique<EmbeddedSession>(std::move(handle), *database, isAdministrator);
+      Handle& opened = *handle;
+      auto session = std::make_unique<EmbeddedSession>(std::move(handle), *database, isAdministrator);
+      // The log-in is over, and its limit with it.
+      opened.deadline(std::nullopt);
+      return session;
     } catch (const Failure& failure) {
       if (failure.native() != inSingleUserMode) throw;
       throw tsql::sqlFailure(

@@ -54,7 +54,7 @@ std::shared_ptr<const ValueList> listValue(const Parameter& parameter, const tsq
   return values;
 }
 
-// The time that one run may take. Fetching rows afterwards, and ending a transaction, have no limit.
+// The time that one run may take; 0: any. Fetching rows afterwards, and ending a transaction, have no limit.
 class TimeLimit {
  public:
   TimeLimit(Handle& handle, std::chrono::seconds limit) : handle_(handle) {

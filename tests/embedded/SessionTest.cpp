@@ -119,6 +119,15 @@ TEST_F(Sessions, ALimitEndsARunningStatementAndNotAFetch) {
   for (int i = 0; i < 10000; ++i) ASSERT_TRUE(result.rows->next());
 }
 
+TEST_F(Sessions, TheLogInsLimitIsNoneOfTheStatementsBehindIt) {
+  ConnectionOptions options = parseConnectionString(buildConnString(installation_.server(), "QVSys", false));
+  options.loginTimeout = std::chrono::seconds(1);
+  const auto session = embedded::provider().open(options);
+  std::this_thread::sleep_for(std::chrono::milliseconds(1100));
+  const auto result = session->run({"select count(*) from t a,t b,t c,t d,t e,t f,t g,t h", false, {}});
+  EXPECT_EQ(rest(*result.rows), "6561");
+}
+
 // b and c stand on each other: who asks for the way up from a must not be sent round there.
 TEST_F(Sessions, AConditionOnWhatARecursionHandsOnIsAskedAtItsBeginning) {
   first_->run({"create table step (id int primary key, up int null)"});
