@@ -83,9 +83,10 @@ Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
 
 Answer init(const Console& console, const Options& options) {
   const auto folder = targetFolder(console, options);
-  // The first two end a server text, the third the name of a file in the statement of a restore.
-  if (folder.string().find_first_of(";|'") != String::npos)
-    throw Misuse("The path of an installation must hold none of ; | and '.");
+  // The first two end a server text, the third the name of a file in the statement of a restore, and the last one parts
+  // folders in the paths of backups.
+  if (folder.string().find_first_of(";|'\\") != String::npos)
+    throw Misuse("The path of an installation must hold none of ; | ' and \\.");
   if (embedded::isInstallation(folder)) throw Refusal("There is an installation in " + folder.string() + " already.");
   const Chosen admin = choose(administrator, options.makePasswords);
   const Chosen sa = choose("sa, the log-in that restores backups", options.makePasswords);

@@ -104,6 +104,7 @@ void Handle::open() {
   struct stat file {};
   if (::stat(master_.c_str(), &file) != 0 && (errno == ENOENT || errno == ENOTDIR))
     throw sqlFailure(17, "SQL Server does not exist or access denied.");
+  if (const std::string problem = lengthProblem(folder_); !problem.empty()) throw cannotOpen(databaseNames[0], problem);
   masterDevice_ = file.st_dev;
   masterNumber_ = file.st_ino;
   const int flags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX | SQLITE_OPEN_PRIVATECACHE | SQLITE_OPEN_EXRESCODE;

@@ -30,7 +30,7 @@ Failure usedAfterFork();
 class Handle {
  public:
   // Opens the files of an installation that exists. Throws 17 for a folder that is missing or no installation, 4060 for
-  // a file that is no database, is damaged, cannot be read or written, or has a newer layout.
+  // a file that is no database, is damaged, cannot be read or written, has too long a path or a newer layout.
   explicit Handle(const std::filesystem::path& folder);
   ~Handle();
   Handle(const Handle&) = delete;

@@ -60,12 +60,16 @@ void refuseNetworkFileSystem(const fs::path& folder) {
     throw Failure(number::general, "SQL Server", "A database cannot lie on a network file system.");
 }
 
+// The name is finished when the folder is made.
+std::string placeBeside(const fs::path& target) {
+  return target.parent_path() / ("." + target.filename().string() + ".XXXXXX");
+}
+
 // The folder that is being built beside its place. It goes again unless it was moved there.
 class BuildingSite {
  public:
   explicit BuildingSite(const fs::path& target) : target_(target) {
-    std::string path = target.parent_path() / ".";
-    path.append(target.filename().string()).append(".XXXXXX");
+    std::string path = placeBeside(target);
     require(::mkdtemp(path.data()) != nullptr);
     path_ = path;
     struct stat existing {};
@@ -176,6 +180,9 @@ void createInstallation(const InstallationPlan& plan) {
   if (!target.has_filename()) target = target.parent_path();
   std::error_code error;
   if (fs::exists(target, error) && !fs::is_empty(target, error)) throw runtimeFailure(fileExists);
+  const std::size_t spare = placeBeside(target).size() - target.native().size();
+  if (const std::string problem = lengthProblem(target, spare); !problem.empty())
+    throw Failure(number::pathAccess, "SQL Server", "The installation cannot be made: " + problem + ".");
   makeParent(target.parent_path());
   refuseNetworkFileSystem(target.parent_path());
   BuildingSite site(target);

@@ -1,6 +1,17 @@
 #include "providers/embedded/Layout.h"
 
+#include <algorithm>
+#include <sqlite3.h>
+#include <string_view>
+
 namespace QVSa::embedded {
+
+namespace {
+
+// The library adds this to the name of a database for a file of its own, and counts it in.
+constexpr std::string_view longestSuffix = "-journal";
+
+}  // namespace
 
 std::filesystem::path databaseFile(const std::filesystem::path& folder, const std::string& database) {
   return folder / (database + ".db");
@@ -9,6 +20,18 @@ std::filesystem::path databaseFile(const std::filesystem::path& folder, const st
 std::array<NamedFile, 2> filesOf(const std::filesystem::path& folder, const std::string& database) {
   const std::string data = databaseFile(folder, database).string();
   return {{{database, data}, {database + "_log", data + "-wal"}}};
+}
+
+std::string lengthProblem(const std::filesystem::path& folder, std::size_t spare) {
+  std::size_t longestName = 0;
+  for (const char* database : databaseNames)
+    longestName = std::max(longestName, databaseFile("/", database).native().size());
+  const std::size_t most =
+      static_cast<std::size_t>(sqlite3_vfs_find(nullptr)->mxPathname) - longestSuffix.size() - longestName - spare;
+  const std::size_t length = folder.native().size();
+  if (length <= most) return {};
+  return "the path of its folder has " + std::to_string(length) + " bytes, and " + std::to_string(most) +
+         " are the most";
 }
 
 std::filesystem::path lockFile(const std::filesystem::path& folder, const std::string& database) {

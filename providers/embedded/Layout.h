@@ -25,6 +25,10 @@ struct NamedFile {
 };
 std::array<NamedFile, 2> filesOf(const std::filesystem::path& folder, const std::string& database);
 
+// What is wrong with a folder whose absolute path, and `spare` bytes more, is too long for the storage library; empty
+// where it is not.
+std::string lengthProblem(const std::filesystem::path& folder, std::size_t spare = 0);
+
 std::filesystem::path lockFile(const std::filesystem::path& folder, const std::string& database);
 
 }  // namespace QVSa::embedded

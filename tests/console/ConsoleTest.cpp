@@ -60,7 +60,7 @@ TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   EXPECT_EQ(wrong.error(), "0x80040452");
   EXPECT_EQ(run("sign-on nobody", "x\n").error(), "0x8004044D");
   for (const char* misuse : {"", "dept show", "sign-on Admin --password x", "no-such-command",
-                             "number rule add x --reuse often", "init \"it's\""})
+                             "number rule add x --reuse often", "init \"it's\"", "init 'a\\b'"})
     EXPECT_EQ(run(misuse, "x\n").exitCode, 2) << misuse;
   EXPECT_EQ(run("sign-on Admin", "").exitCode, 2);
   name_ = "missing";

@@ -6,6 +6,7 @@
 #include "providers/embedded/Installation.h"
 #include "providers/embedded/Layout.h"
 #include "tests/embedded/InstallationFolder.h"
+#include "tests/support/Failures.h"
 
 namespace QVSa::embedded {
 namespace {
@@ -38,12 +39,7 @@ TEST(Installation, AFolderWithSomethingInItIsLeftAlone) {
   std::filesystem::create_directory(folder.data());
   std::ofstream(folder.data() / "letter.txt") << "kept";
   EXPECT_FALSE(isInstallation(folder.data()));
-  try {
-    createInstallation(folder.plan());
-    FAIL();
-  } catch (const Failure& failure) {
-    EXPECT_EQ(failure.number(), 58);
-  }
+  EXPECT_EQ(test::failureOf([&] { createInstallation(folder.plan()); }), 58);
   std::filesystem::remove(folder.data() / "letter.txt");
   createInstallation(folder.plan());
   EXPECT_TRUE(isInstallation(folder.data()));
@@ -55,6 +51,28 @@ TEST(Installation, AScriptThatFailsLeavesNothingBehind) {
   plan.scripts = {{"QVSys", "create table a(x int)"}, {"QVApp", "create nonsense"}};
   EXPECT_THROW(createInstallation(plan), Failure);
   EXPECT_TRUE(isEmpty(folder.root()));
+}
+
+TEST(Installation, APathThatIsTooLongIsRefusedByItsLength) {
+  InstallationFolder folder;
+  const auto below = [&](std::size_t length) {
+    std::filesystem::path path = folder.root();
+    while (path.native().size() + 200 < length) path /= String(100, 'x');
+    std::filesystem::create_directories(path);
+    return path / String(length - path.native().size() - 1, 'y');
+  };
+  InstallationPlan plan = folder.plan();
+  plan.folder = below(485);
+  const Failure notMade = test::thrownBy([&] { createInstallation(plan); });
+  EXPECT_EQ(notMade.number(), number::pathAccess);
+  EXPECT_NE(notMade.description().find("485 bytes"), String::npos) << notMade.description();
+  plan.folder = below(484);
+  createInstallation(plan);
+
+  std::filesystem::rename(plan.folder, below(493));
+  const Failure notOpened = test::thrownBy([&] { acquireHandle(below(493)); });
+  EXPECT_EQ(notOpened.native(), 4060);
+  EXPECT_NE(notOpened.description().find("493 bytes"), String::npos) << notOpened.description();
 }
 
 }  // namespace
