@@ -55,7 +55,8 @@ class Directory : private Frame {
   // Inserts the node as the last of its siblings, or updates the one that was loaded or saved here. An update rewrites
   // what lies below, in one transaction, and makes the node the last of its siblings, whatever has changed; call
   // updateSubOrder to put it elsewhere. 0x80040578 a new node's superior, or the node to be renamed or moved, is not
-  // there; 0x80040E2F the name is taken; 5 there are 999 siblings already.
+  // there; 0x80040E2F the name is taken; 5 there are 999 siblings already; 0x80040E57 too deep: a path has room for 850
+  // characters, a full name for 4,000, an ordPath for 400, which is 100 levels.
   Boolean Save();
   // Deletes the node `Class` (empty: this one). What lies below stays, cut off from what was above. 0x80040578 there is
   // no such node.

@@ -103,7 +103,8 @@ class User : private Frame {
   Boolean isOwner() const { return isOwner_; }
   // True after a full load.
   Boolean isUser() const { return isUser_; }
-  // Days that the password has left, as loginAuth found it; -1 where it did not look.
+  // Days that the password has left, as loginAuth found it; -1 where it did not look. It ends at -32,768 and 32,767,
+  // whatever lies beyond.
   Integer validDay() const { return validDay_; }
 
   // Loads by id (`keyName` 1), name (2) or login (3); any other finds nobody. 0x8004044D where there is no such user.
@@ -113,7 +114,9 @@ class User : private Frame {
   Boolean GetOne(Integer keyName, const Variant& keyValue, Boolean chkPwd = false, const String& Pwd = "",
                  Boolean* wrongPwd = nullptr, Boolean authLd = false);
   // Inserts or updates the user. Every save writes the password, restarts its validity and clears the date of a lock.
-  // The update of a locked user unlocks him; any other state, and that of a new user, is written as it stands here.
+  // The update of a locked user unlocks him; any other state, and that of a new user, is written as it stands here. His
+  // counter of failed sign-ons stays: the next wrong password locks him again, and until a right one in clear sets the
+  // counter to 0, he reads as locked where none is asked in clear (levels 1 and above of loginAuth).
   // `passPwdCheck` leaves out the policy and the history of passwords: pass True where the password is not new.
   // 0x8004044E name or login empty, 0x80040460 the password was used before, 0x80040BB8 against the policy, 0x800A0BCD
   // a new user's `deptId` is the number of no department.
@@ -128,8 +131,9 @@ class User : private Frame {
   // addresses, "|" between; `hostName`: its name, empty for no test of other sessions. `userVerifyLevel`: 0 or below,
   // `Pwd` is the password; 1, its md5Hex; above, the host vouches for the user.
   // 0x8004046C address not permitted, 0x8004046D signed on elsewhere, 0x8004045E locked or in another state than 0,
-  // 0x80040452 wrong password, 0x80040463 wrong domain password. True with 0x8004045F and an empty `sI`: the password
-  // has expired, only its change is allowed. errNumber is not cleared by a success: look at the result, then at `sI`.
+  // 0x80040452 wrong password, 0x80040463 wrong domain password, 0x80040E2F somebody else took the number of a session
+  // at this moment (trying again is safe). True with 0x8004045F and an empty `sI`: the password has expired, only its
+  // change is allowed. errNumber is not cleared by a success: look at the result, then at `sI`.
   // Attempts at one account that run at the same moment each count for themselves and may all be answered before the
   // lock is written: a limit of 3 let 8 guesses at once through. A host that faces people makes them one after the
   // other. Throws Failure 6 on level 1 where the stored password has a character of two bytes in the system's code page.

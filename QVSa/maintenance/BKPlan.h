@@ -49,7 +49,8 @@ class BKPlan : private Frame {
   Boolean Delete(Long Id = 0);
   // Runs the due row `schNo`: makes the backup, records it, queues the next run, removes old backups and writes the
   // log. False with the backup's number where that failed; all the rest is done then, too. Any other failure ends the
-  // run where it stands. The folder is made on this machine, by its clock.
+  // run where it stands: 0x80040E2F, somebody else took a number of the log at this moment, and all but the entry in
+  // the log is done. The folder is made on this machine, by its clock.
   Boolean exec(Long schNo);
 
  private:

@@ -16,7 +16,9 @@ class IdMgr : private Frame {
   // The text before the date part. Blanks at its ends count in GetSample only.
   String preFix() const { return preFix_; }
   void preFix(String value) { preFix_ = std::move(value); }
-  // A qvIdDatePart.
+  // A qvIdDatePart. Change it before the first number of a period. From days, or from none, to months or years the row
+  // of another day than the new period's first can stay behind: newId reads it and never updates it, and gives one
+  // number again and again until the period is over.
   Integer DateFormat() const { return DateFormat_; }
   void DateFormat(Integer value) { DateFormat_ = value; }
   // Digits of the sequence, 0 to 14. Can only grow once a number was issued.
@@ -41,7 +43,7 @@ class IdMgr : private Frame {
   String newId(const String& idName, const String& vConnstring = "", Long startNo = -1, const String& rcId = "",
                const String& sesId = "");
   // Makes the next number of the current period `startNo`. 0 does nothing and is a success; a negative number issues an
-  // ordinary number, which is then used up.
+  // ordinary number, which is then used up. Fails as newId does.
   Boolean setStartNo(Long startNo);
 
   // Loads a rule; 0x800405DE where there is none.

@@ -47,7 +47,9 @@ class Role : private Frame {
   // For a new one: 0x800404B2 name empty, 0x800404B9 name taken. An update tests neither.
   Boolean Save();
   // Deletes the role `Id` (0: this one), its jobs and all that hangs on them; built-in ones too, and unknown ones give
-  // True. Groups keep their rows for it.
+  // True. Groups keep their rows for it. What hangs on the jobs goes table by table: rights to fields, tasks,
+  // holders, rights to reports, supervisors. Where one of these can't be emptied, as for a lock of another session, it
+  // and those behind it keep their rows, for jobs that are gone: the role and its jobs go all the same, with True.
   Boolean Delete(Long Id = 0);
 
   // The holders, directly or through a group; `deptId`: only those of the department of that number. `noBuiltIn`:
