@@ -9,6 +9,7 @@
 #include <random>
 #include <set>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -23,6 +24,8 @@ constexpr int userCount = 1509;
 constexpr std::size_t holdingCount = 6281;
 constexpr int deepest = 5;
 constexpr std::size_t organisationCount = 9;
+// Of these names about one in fifteen comes again somewhere else in the tree.
+constexpr std::size_t namesOfAKind = 750;
 
 const char* const kinds[] = {"Admins", "Docs", "Maintainers", "Release", "Reviewers", "Security", "Support", "Tests"};
 
@@ -63,13 +66,13 @@ class Generator {
   }
 
  private:
-  // The branches come first, directly below the root; names repeat under different superiors, as they do in life.
+  // The branches come first, directly below the root.
   void writeDepartment(std::ofstream& file) {
     const std::size_t count = departments_.size();
     const bool isBranch = count <= organisationCount;
     const Department superior = isBranch ? departments_[0] : superiorOfTeam();
     const std::string number = "d" + std::to_string(count);
-    const std::string name = isBranch ? "Branch " + std::to_string(count) : kinds[below(std::size(kinds))];
+    const std::string name = isBranch ? "Branch " + std::to_string(count) : nameBelow(superior);
     file << number << "," << name << "," << superior.number << "," << (isBranch ? 1 : 0) << "\n";
     departments_.push_back({number, superior.level + 1});
   }
@@ -78,6 +81,15 @@ class Generator {
     while (true) {
       const Department& candidate = departments_[1 + below(departments_.size() - 1)];
       if (candidate.level < deepest) return candidate;
+    }
+  }
+
+  // Names repeat under different superiors, as they do in life, and never under one, or full names would repeat.
+  std::string nameBelow(const Department& superior) {
+    while (true) {
+      const std::string kind = kinds[below(std::size(kinds))];
+      const std::string name = kind + " " + std::to_string(1 + below(namesOfAKind));
+      if (siblings_.insert({superior.number, name}).second) return name;
     }
   }
 
@@ -94,6 +106,7 @@ class Generator {
 
   std::filesystem::path folder_;
   std::vector<Department> departments_;
+  std::set<std::pair<std::string, std::string>> siblings_;  // superior and name
   std::mt19937 engine_{20240229};
 };
 

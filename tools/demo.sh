@@ -1,24 +1,25 @@
 #!/bin/sh
 # A fresh embedded installation, an organisation in it, and the road of a sign-on through it. Run by `make demo`.
-# QVSA_ORGANISATION names the folder of an organisation's files; else one beside the project is taken, else one made up.
+# QVSA_ORGANISATION names the folder of an organisation's files; set to nothing, one is made up. Where it is not set, one
+# beside the project is taken, else one made up.
 set -eu
 cd "$(dirname "$0")/.."
 
 programs=build/release
 folder=build/demo
-organisation=${QVSA_ORGANISATION:-../shared/organisation}
+organisation=${QVSA_ORGANISATION-../shared/organisation}
 
 rm -rf "$folder"
 mkdir -p "$folder"
 
-if [ ! -f "$organisation/departments.csv" ]; then
+if [ -z "$organisation" ] || [ ! -f "$organisation/departments.csv" ]; then
   if [ -n "${QVSA_ORGANISATION:-}" ]; then
     echo "There is no departments.csv in QVSA_ORGANISATION ($QVSA_ORGANISATION)." >&2
     exit 1
   fi
   organisation="$folder/organisation"
   "$programs/examples/made_up_organisation" "$organisation"
-  echo "No organisation at hand: one of a real one's shape and size is made up."
+  echo "An organisation of a real one's shape and size is made up."
 fi
 
 export QVSA_SERVER="file:$PWD/$folder/installation"

@@ -8,7 +8,8 @@ namespace QVSa {
 // Departments in lists: the whole tree, subtrees, the ways up from jobs.
 //   Departments tree;  tree.connect(server);
 //   if (tree.GetAll()) for (const auto& department : tree) show(department->fullName());
-// The key is the department number, but for GetRoot (the inner id) and for the ways up. All lists leave `Org` empty.
+// The key is the department number, but for GetRoot (the inner id) and for the ways up. A key that comes again
+// ends a list with 457; the departments before it stay. All lists leave `Org` empty.
 class Departments : public Collection<Department> {
  public:
   using Collection::Remove;
@@ -32,7 +33,8 @@ class Departments : public Collection<Department> {
   // only the jobs in that one count. `x` 0: the jobs' own departments alone; 1: those above alone; -1: both. The key is
   // the name: the second department of one name ends the list with 457.
   Boolean getAllSuper(const String& jobIds, Integer isSameOrg = 0, const String& orgNo = "", Integer x = -1);
-  // The same by level, the top first. The key is the full name.
+  // The same by level, the top first. The key is the full name, which two departments share where siblings have one
+  // name, or where a name holds a "-": "A-B" below "C", and "B" below "A" below "C".
   Boolean getAllSuperWithLevel(const String& jobIds, Integer isSameOrg = 0, const String& orgNo = "", Integer x = -1);
 
  private:
