@@ -30,8 +30,9 @@ demo: packages  ## Make an installation, fill it with an organisation, walk the 
 
 test: build  ## Build and run all tests, then the quick ones once more under the sanitizers
 	$(say) 'Testing'
-	@ctest --preset release
-	@$(MAKE) sanitize BUILD='--target quick_tests' TESTS='-LE slow'
+	@red=0; ctest --preset release || red=1; \
+	  $(MAKE) sanitize BUILD='--target quick_tests' TESTS='-LE slow' || red=1; \
+	  exit $$red
 
 sanitize: packages  ## Run all tests under the address and undefined behaviour sanitizers (build/sanitize)
 	$(say) 'Building with the sanitizers (build/sanitize)'
