@@ -119,9 +119,11 @@ Answer exported(const Console& console, const Options& options) {
   LogRecords log;
   console.connect(log);
   exportTo(log, options);
-  const auto bytes = std::filesystem::file_size(platform::localPath(options.file));
-  return {"The log is in " + options.file + ", " + std::to_string(bytes) + " bytes.\n",
-          {{"file", options.file}, {"bytes", bytes}}};
+  // A device or a pipe has no size.
+  std::error_code hasNone;
+  const auto bytes = std::filesystem::file_size(platform::localPath(options.file), hasNone);
+  return {"The log is in " + options.file + (hasNone ? "" : ", " + std::to_string(bytes) + " bytes") + ".\n",
+          {{"file", options.file}, {"bytes", hasNone ? Json() : Json(bytes)}}};
 }
 
 // Exported by itself first: the library would delete the entries whatever came of the export.

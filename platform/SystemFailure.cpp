@@ -14,22 +14,22 @@ Failure fileFailure(int systemError, const std::filesystem::path& file) {
   std::error_code ignored;
   const bool fileIsMissing =
       systemError == ENOENT && (!file.has_parent_path() || std::filesystem::is_directory(file.parent_path(), ignored));
-  return fileIsMissing ? runtimeFailure(number::noFile) : folderFailure(systemError);
+  return fileIsMissing ? runtimeFailure(number::noFile, systemError) : folderFailure(systemError);
 }
 
 Failure folderFailure(int systemError) {
   switch (systemError) {
     case EEXIST:
-      return runtimeFailure(existsAlready);
+      return runtimeFailure(existsAlready, systemError);
     case ENOENT:
     case ENOTDIR:
-      return runtimeFailure(number::noPath);
+      return runtimeFailure(number::noPath, systemError);
     case EACCES:
     case EPERM:
     case EROFS:
-      return runtimeFailure(number::accessDenied);
+      return runtimeFailure(number::accessDenied, systemError);
     default:
-      return runtimeFailure(number::pathAccess);
+      return runtimeFailure(number::pathAccess, systemError);
   }
 }
 

@@ -43,7 +43,9 @@ String runtimeText(Long runtimeNumber) {
 
 }  // namespace
 
-Failure runtimeFailure(Long runtimeNumber) { return Failure(runtimeNumber, "QVSa", runtimeText(runtimeNumber)); }
+Failure runtimeFailure(Long runtimeNumber, Long native) {
+  return Failure(runtimeNumber, "QVSa", runtimeText(runtimeNumber), native);
+}
 
 Failure asFailure(const std::exception& error) {
   if (const auto* const failure = dynamic_cast<const Failure*>(&error)) return *failure;

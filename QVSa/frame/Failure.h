@@ -8,8 +8,8 @@
 namespace QVSa {
 
 // The one kind of exception of the library: a failure number that callers test, the name of who raised it, a text for a
-// person, and the database server's own number (0 where there is none). No text holds a password or a connection
-// string.
+// person, and the own number of the database server or the operating system (0 where there is none). No text holds a
+// password or a connection string.
 class Failure : public std::runtime_error {
  public:
   Failure(Long number, const String& source, const String& description, Long native = 0)
@@ -67,7 +67,7 @@ constexpr Long keyExists = 457;
 }  // namespace number
 
 // A run-time failure with its usual text: 6 "Overflow", 9 "Subscript out of range", 13 "Type mismatch" and so on.
-Failure runtimeFailure(Long runtimeNumber);
+Failure runtimeFailure(Long runtimeNumber, Long native = 0);
 
 // Whatever was caught, as a failure: one of ours as it is, 7 for want of memory, 51 for any other.
 Failure asFailure(const std::exception& error);

@@ -43,7 +43,8 @@ class LogRecords : private Frame {
                  Integer app = 0);
   // Writes the entries of a type (1 to 3; any other: all) to a text file in the system's code page ("?" for what that
   // lacks), with no heading: a line break before each entry, tabs between its values. The file is complete or as it was
-  // before.
+  // before; it keeps its owner and mode, a link leads to it, a terminal, a pipe or a device is written as it is. 70,
+  // 75 or 76 where it can't be written; 70 also for a file of an installation and a link that a stranger may have laid.
   Boolean saveLog(const String& vBakFile, const Long* vLogType = nullptr);
   // Deletes the entries of a type (1 to 3; any other: all), with `vSaveBackup` after an export to `vBakFile`. A failed
   // export does not keep the entries, and neither do entries that came after it.

@@ -1,6 +1,6 @@
 #include "QVSa/syslog/LogRecords.h"
 #include "platform/CodePage.h"
-#include "platform/Files.h"
+#include "platform/NewFile.h"
 
 namespace QVSa {
 namespace {

@@ -5,10 +5,12 @@
 #include <filesystem>
 #include <string>
 
+#include "platform/InstallationFiles.h"
+
 namespace QVSa::embedded {
 
-// The databases of an installation, in the order in which a handle attaches them.
-inline constexpr std::array<const char*, 4> databaseNames = {"master", "QVSys", "QVApp", "QVUpdate"};
+// In the order in which a handle attaches them.
+using platform::databaseNames;
 
 // The layout of the files that this build writes, and the mark that tells an installation's file from any other.
 // Each file holds engine(layout, catalogue), one row: its layout and a count of changed definitions; and gate(n),

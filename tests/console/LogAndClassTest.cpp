@@ -42,6 +42,7 @@ TEST_F(LogAndClasses, EntriesAreWrittenFoundPagedExportedAndCleared) {
   const String file = (folder_.path() / "log.txt").string();
   const Outcome exported = run("log export '" + folder_.path().string() + "\\log.txt' --type 1");
   EXPECT_EQ(exported.document["bytes"], std::filesystem::file_size(file));
+  EXPECT_EQ(run("log export /dev/null").document["bytes"], nullptr);
   EXPECT_EQ(run("log clear --type 1 --export '" + folder_.path().string() + "'").exitCode, 1);
   EXPECT_EQ(value("select count(*) from QVApp..syslog"), "3") << "what could not be exported stays";
   EXPECT_EQ(run("log clear --type 1 --export '" + file + "'").exitCode, 0);

@@ -67,6 +67,9 @@ TEST_F(LogExport, LeavesTheOldFileWhereItCannotBeDone) {
   EXPECT_EQ(log_.errDescription(), "Error in saving system log." + runtimeFailure(number::pathAccess).description());
   EXPECT_FALSE(log_.saveLog(path("missing/log.txt")));
   EXPECT_EQ(log_.errNumber(), number::noPath);
+  EXPECT_FALSE(log_.saveLog((installation_.folder() / "QVSys.db").string()));
+  EXPECT_EQ(log_.errDescription(), "Error in saving system log.A file of an installation is not written over");
+  EXPECT_EQ(left(), "a\nb\nc");
 
   // The rows stream: what was written before the second one fails is gone, and the third is never asked for.
   test::FakeServer server;
