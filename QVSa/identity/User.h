@@ -157,10 +157,11 @@ class User : private Frame {
   // audit, with the rest in a row for the auditor; a mail to the administrator is queued. An outside user goes to
   // "_out", any other to "_root"; `deptName`, the unit that he names, then becomes his `company`. 0x80040BB8 against
   // the policy, 0x8004044E name or login empty, 0x8004046A the row was not stored. The user stays stored where a later
-  // step fails.
+  // step fails. Where the settings can't be read, no mail is queued: True, with their failure in the error values.
   Boolean Reg(const String& deptName = "", const String& desc = "");
   // Accepts or refuses the application of `userId` (0: this user), in whatever state it is, and queues a mail to the
-  // address that this object holds: load the user first. `desc` goes to him.
+  // address that this object holds: load the user first. `desc` goes to him. Settings that can't be read: as for
+  // Reg.
   Boolean regAudit(Boolean pass, const String& desc = "", Long userId = 0);
   // True for every text.
   Boolean chkRegPwd(const String& Pwd);

@@ -38,8 +38,10 @@ Boolean User::Reg(const String& deptName, const String& desc) {
       fail("User", 1130);
     }
     Home home;
-    home.connect(server(), DBName());
-    if (home.allowSMTP()) {
+    // The application is stored whatever becomes of the mail.
+    if (!home.connect(server(), DBName())) {
+      note(home.errNumber(), home.errDescription());
+    } else if (home.allowSMTP()) {
       const String administrator = administratorEmail(connection);
       if (!administrator.empty()) {
         queueMail(connection, administrator, fillMsg(LoadResString(1141), {company_, Name_}),
@@ -102,8 +104,9 @@ Boolean User::regAudit(Boolean pass, const String& desc, Long userId) {
                            .text("noPassReason", desc));
     connection.CommitTrans();
     Home home;
-    home.connect(server(), DBName());
-    if (home.allowSendEmail()) {
+    if (!home.connect(server(), DBName())) {
+      note(home.errNumber(), home.errDescription());
+    } else if (home.allowSendEmail()) {
       queueMail(connection, Email_, home.emailSubject(),
                 (pass ? home.emailPContent() : home.emailRContent()) + lineBreak + desc);
     }

@@ -109,6 +109,13 @@ TEST_F(RegistrationTest, NoMailGoesWhereTheSettingsOrTheAddressSayNo) {
   two.Name("Two");
   EXPECT_TRUE(two.Reg());
   EXPECT_TRUE(two.regAudit(true));
+  EXPECT_EQ(two.errNumber(), 0);
+  tables_.run("update homeinfo set smtpState=1,allowSendEmail=1,AcctDay=null");
+  for (const bool isAudit : {false, true}) {
+    User unread = applicant("unread");
+    EXPECT_TRUE(isAudit ? unread.regAudit(true, "", two.Id()) : unread.Reg());
+    EXPECT_EQ(unread.errNumber(), number::type) << "the settings can't be read";
+  }
   tables_.run("delete from homeinfo");
   User three = applicant("three");
   EXPECT_TRUE(three.Reg()) << "without settings there is no mail server";
