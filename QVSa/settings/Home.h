@@ -135,8 +135,8 @@ class Home : private Frame {
   // Brings what the login screen shows to this machine: LoginNewsUrl and loginTitle into its settings store, where the
   // store has the key; the picture and the icon into the files "\LoginImage" and "\formicon.ico" of the program's
   // folder. A local file that is newer than the last save of the settings stays; one whose picture is gone is deleted.
-  // LoginImageFile and customFormIcon then are the files' paths, or empty. A picture that can't be written leaves its
-  // text in errDescription and is no failure.
+  // LoginImageFile and customFormIcon then are the files' paths, or empty. A picture that can't be written, for a
+  // folder of its name say, leaves its text in errDescription and is no failure.
   Boolean getImage(const String& server, const String& DBName = "");
   // Loads the settings. Without a row they get their defaults, and the result is True.
   Boolean connect(const String& server, const String& DBName = "");

@@ -2,6 +2,7 @@
 #include "QVSa/settings/Home.h"
 #include "QVSa/settings/MachineSettings.h"
 #include "platform/Files.h"
+#include "platform/Folders.h"
 #include "platform/Services.h"
 
 namespace QVSa {
@@ -37,14 +38,15 @@ void Home::fetchText(const Field& column, const String& name, String& value) {
 void Home::fetchPicture(Recordset& row, const String& column, const String& path, String& file) {
   if (row[column].isNull()) {
     file.clear();
-    platform::deleteFile(path);
+    if (platform::fileExists(path)) platform::deleteFile(path);
     return;
   }
-  if (const auto modified = platform::lastModified(path)) {
+  if (platform::fileExists(path)) {
     file = path;
     // Every save of the settings sets the stamp, whichever picture it changed.
+    const auto modified = platform::lastModified(path);
     const Field stamp = row["updTime"];
-    if (!stamp.isNull() && *modified > stamp.asDate()) return;
+    if (modified && !stamp.isNull() && *modified > stamp.asDate()) return;
   }
   String errText;
   if (fieldToFile(row[column], path, errText)) {

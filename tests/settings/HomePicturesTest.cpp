@@ -123,6 +123,15 @@ TEST_F(HomePicturesTest, APictureThatCannotBeMovedIsNoFailure) {
   EXPECT_TRUE(other.getImage(installation_.server()));
   EXPECT_EQ(other.LoginImageFile(), "");
   EXPECT_EQ(other.errDescription(), "Path not found");
+
+  replace(&platform::Services::programFolder, {[this] { return (files_.path() / "local").string(); }});
+  std::filesystem::create_directories(files_.path() / "local" / "LoginImage");
+  for (const char* image : {"LoginImage", "null"}) {
+    store("UpdTime='20200101',LoginImage=" + String(image));
+    EXPECT_TRUE(other.getImage(installation_.server())) << "a folder is no picture, however new";
+    EXPECT_EQ(other.LoginImageFile(), "");
+    EXPECT_EQ(other.errDescription(), "Path/File access error");
+  }
 }
 
 TEST_F(HomePicturesTest, WithoutARowNothingIsFetched) {
