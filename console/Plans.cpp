@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <filesystem>
 #include <memory>
 
 #include "QVSa/frame/Text.h"
@@ -84,6 +85,23 @@ Answer show(const Console& console, const String& name) {
   return {sheet.text(), sheet.document()};
 }
 
+bool isSameFolder(const String& a, const String& b) {
+  const auto pathOf = [](const String& text) { return std::filesystem::path(replaceAll(text, "\\", "/") + "/"); };
+  std::error_code ignored;
+  return std::filesystem::equivalent(pathOf(a), pathOf(b), ignored) ||
+         pathOf(a).lexically_normal() == pathOf(b).lexically_normal();
+}
+
+// A run's folder is named by the second: two plans that are due at the same time would write into one.
+void requireOwnFolder(const Console& console, const String& folder) {
+  BKPlans plans;
+  console.connect(plans);
+  require(plans.GetAll(), plans);
+  for (const auto& plan : plans)
+    if (isSameFolder(plan->bkPath(), folder))
+      throw Refusal("The plan " + plan->Name() + " has this folder: each plan needs one of its own.");
+}
+
 Answer add(const Console& console, const Options& options) {
   requireWithinADay(options);
   BKPlan plan;
@@ -105,6 +123,7 @@ Answer add(const Console& console, const Options& options) {
   // A save takes any schedule, also one that would never be due.
   when.GetNextTime(platform::services().localTime());
   require(when.errNumber() == 0, when);
+  requireOwnFolder(console, plan.bkPath());
   require(plan.Save(), plan);
   Answer answer = show(console, options.plan);
   answer.text = "The plan is added. `qvsa agent run` runs it.\n\n" + answer.text;
@@ -161,7 +180,9 @@ Answer history(const Console& console, const String& name) {
 void addAdding(Console& console, CLI::App* group, const std::shared_ptr<Options>& options) {
   CLI::App* command = group->add_subcommand("add", "Add a plan");
   command->add_option("plan", options->plan)->required();
-  command->add_option("folder", options->folder, "The folder under which each run makes its own; it has to exist")
+  command
+      ->add_option("folder", options->folder,
+                   "The folder under which each run makes its own; it has to exist and be no other plan's")
       ->required();
   command->add_option("--every", options->every, "Every so many days, weeks or months")
       ->check(CLI::PositiveNumber)

@@ -70,7 +70,8 @@ TEST_F(MaintenanceCommands, KeepPlansAndTheirHistory) {
   EXPECT_EQ(run("plan add odd " + backups() + " --weekdays noday").exitCode, 2);
   for (const char* repeat : {"-1", "24", "1440 --repeat-unit minutes"})
     EXPECT_EQ(run("plan add odd " + backups() + " --repeat " + repeat).exitCode, 2) << repeat;
-  EXPECT_EQ(run("plan add odd " + backups() + " --every 32767 --cycle weeks").exitCode, 1) << "it has no next run";
+  EXPECT_EQ(run("plan add twin " + backups() + "//").exitCode, 1) << "two runs of one second would share a folder";
+  EXPECT_EQ(run("plan add odd /elsewhere --every 32767 --cycle weeks").exitCode, 1) << "it has no next run";
   EXPECT_EQ(run("plan list").document["plans"].size(), 1U);
   const Outcome ran = run("plan run nightly");
   ASSERT_EQ(ran.exitCode, 0) << ran.said << ran.document;
@@ -92,7 +93,7 @@ TEST_F(MaintenanceCommands, TheAgentRunsAllThatIsDueOnceAndMendsBrokenChains) {
   ASSERT_EQ(run("plan add nightly " + backups()).exitCode, 0);
   execute("insert into tasks(taskName,taskType) values('foreign',7)");
   execute("insert into QVTaskSche(taskId,schNo) values(4,1)");
-  ASSERT_EQ(run("plan add broken " + backups()).exitCode, 0);
+  ASSERT_EQ(run("plan add broken /elsewhere").exitCode, 0);
   execute("delete from QVTaskSche where taskId=5");
   RunningAgent agent(server());
   expectSoon("select count(*) from QVTaskSche where taskId=5", "1");
@@ -113,7 +114,7 @@ TEST_F(MaintenanceCommands, TheAgentRunsAllThatIsDueOnceAndMendsBrokenChains) {
 TEST_F(MaintenanceCommands, TheAgentOutlivesAFailureAndEndsCleanlyOnASignal) {
   ASSERT_EQ(run("plan add nightly " + backups()).exitCode, 0);
   // No moment of this one can be computed: it is left alone.
-  ASSERT_EQ(run("plan add odd " + backups()).exitCode, 0);
+  ASSERT_EQ(run("plan add odd /elsewhere").exitCode, 0);
   execute("update tasks set cycle=7 where taskName='odd'");
   const auto broken = [&] { execute("delete from QVTaskSche"); };
   broken();
