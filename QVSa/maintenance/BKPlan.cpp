@@ -51,6 +51,7 @@ Boolean BKPlan::Save() {
   const Boolean saved = operation(prefixed(3115).onIntegrity(3116), [&]() -> Boolean {
     const bool isNew = Id_ == 0;
     const String schDesc = schedule()->description();
+    noteFailureOfSchedule();
     Connection connection = open();
     connection.Execute("set nocount on");
     connection.BeginTrans();
@@ -62,6 +63,7 @@ Boolean BKPlan::Save() {
     connection.Execute(sql("delete from QVTaskSche where taskId=<id> and state=0").number("id", Id_));
     const Date now = connection.Execute("select getdate()")[0].asDate();
     queueNext(connection, now);
+    noteFailureOfSchedule();
     connection.CommitTrans();
     return true;
   });
@@ -121,6 +123,10 @@ void BKPlan::updateTask(Connection& connection, const String& schDesc) {
                          " Where taskId =<id>")
                          .number("id", Id_)
                          .text("path", bkPath_));
+}
+
+void BKPlan::noteFailureOfSchedule() {
+  if (!schedule_->hasAnswered_) note(schedule_->errNumber(), schedule_->errDescription());
 }
 
 void BKPlan::queueNext(Connection& connection, Date serverTime) {

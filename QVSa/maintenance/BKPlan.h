@@ -41,16 +41,18 @@ class BKPlan : private Frame {
   // Loads a plan by its Id (`keyName` 1) or its Name (2); by anything else the first of all. 0x80040C1C: no plan.
   Boolean GetOne(Integer keyName = 0, const String& keyValue = "");
   // Inserts a plan without an Id, else updates it. Pending runs are replaced by the next one from now, finished ones
-  // stay. 0x80040E2F the name is taken. A new plan has its Id from a save that succeeded.
+  // stay. 0x80040E2F the name is taken. A new plan has its Id from a save that succeeded. A schedule that can't be
+  // computed is saved as far as it goes: True, with the schedule's failure in the error values.
   Boolean Save();
   // Queues the next run where none is pending in the future: for a plan whose chain of runs was broken. Throws Failure.
   void newSche();
   // Removes the plan `Id` (0: this one) with all its runs; its folders stay.
   Boolean Delete(Long Id = 0);
-  // Runs the due row `schNo`: makes the backup, records it, queues the next run, removes old backups and writes the
-  // log. False with the backup's number where that failed; all the rest is done then, too. Any other failure ends the
-  // run where it stands: 0x80040E2F, somebody else took a number of the log at this moment, and all but the entry in
-  // the log is done. The folder is made on this machine, by its clock.
+  // Runs the due row `schNo`: makes the backup, records it, queues the next run, removes old backups and what killed
+  // runs left half written, and writes the log. False with the backup's number where that failed; all the rest is done
+  // then, too. Any other failure ends the run where it stands: without a number of the rule "_log" the log alone is
+  // missing. 0x80040E2F where somebody else takes such a number at this moment. The folder is made on this machine, by
+  // its clock, and named by the second: two plans with one path that run in one second share it.
   Boolean exec(Long schNo);
 
  private:
@@ -62,8 +64,9 @@ class BKPlan : private Frame {
   Statement taskSql(const String& statement, const String& schDesc);
   Boolean insertTask(Connection& connection, const String& schDesc);
   void updateTask(Connection& connection, const String& schDesc);
+  void noteFailureOfSchedule();
   void queueNext(Connection& connection, Date serverTime);
-  void removeOld(Connection& connection, Date now);
+  void clean(Connection& connection, Date now, const String& ownFolder);
   Boolean isOwnBackup(Connection& connection, const String& folder);
   void log(Connection& connection, const String& opDesc);
 

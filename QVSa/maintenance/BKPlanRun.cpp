@@ -7,6 +7,7 @@
 #include "QVSa/resources/Messages.h"
 #include "platform/Files.h"
 #include "platform/Folders.h"
+#include "platform/NewFile.h"
 #include "platform/Services.h"
 
 namespace QVSa {
@@ -23,6 +24,13 @@ String stampOf(Date moment) {
   String digits = moment.sqlText();
   std::erase_if(digits, [](char c) { return c == ' ' || c == ':'; });
   return digits;
+}
+
+bool isStamp(const String& name) { return name.size() == 14 && name.find_first_not_of("0123456789") == String::npos; }
+
+// What a killed run left half written.
+void removeUnfinished(const String& folder) {
+  for (const char* file : {sysFile, appFile}) platform::removeUnfinished(folder + "\\" + file);
 }
 
 // Backups modified before it are old.
@@ -75,17 +83,19 @@ Boolean BKPlan::exec(Long schNo) {
                            .number("id", Id_)
                            .number("schNo", following(schNo))
                            .date("pTime", next));
-    if (delFiles_) removeOld(connection, now);
+    if (delFiles_) clean(connection, now, folder);
     log(connection, done ? fillMsg(LoadResString(3106), {folder}) : errDescription());
     return done;
   });
 }
 
-void BKPlan::removeOld(Connection& connection, Date now) {
+void BKPlan::clean(Connection& connection, Date now, const String& ownFolder) {
   const Date limit = limitOf(now, delNum_, delUnit_);
   for (const String& name : platform::foldersIn(bkPath_)) {
     const String folder = bkPath_ + "\\" + name;
+    if (folder == ownFolder) continue;
     const auto modified = platform::lastModified(folder);
+    if (isStamp(name)) removeUnfinished(folder);
     if (!modified || *modified >= limit) continue;
     if (!isOwnBackup(connection, folder) || !holdsBackup(folder)) continue;
     platform::removeFolder(folder);
@@ -105,6 +115,7 @@ void BKPlan::log(Connection& connection, const String& opDesc) {
   IdMgr numbers;
   numbers.connect(server(), DBName());
   const String logId = numbers.newId("_log");
+  if (logId.empty()) throw Failure(numbers.errNumber(), "BKPlan", numbers.errDescription());
   connection.Execute(sql("insert into SysLog("
                          " LogId,LogType,LogTime,userId,UserName,Computer,FuncName,OpDesc"
                          " )"

@@ -6,11 +6,17 @@
 namespace QVSa {
 
 Date cSchedule::GetNextTime(Date nowTime) {
-  return operation(plain(), Date(), [&](Date& result) { result = nextTime(rule_, nowTime, result); });
+  hasAnswered_ = false;
+  return operation(plain(), Date(), [&](Date& result) {
+    result = nextTime(rule_, nowTime, result);
+    hasAnswered_ = true;
+  });
 }
 
 String cSchedule::description() {
-  return operation(plain(), [&] { return dayLine() + "\r\n" + timeLine(); });
+  const String lines = operation(plain(), [&] { return dayLine() + "\r\n" + timeLine(); });
+  hasAnswered_ = !lines.empty();
+  return lines;
 }
 
 String cSchedule::dayLine() const {

@@ -48,11 +48,14 @@ class cSchedule : private Frame {
   Long getNextSch(Date baseTime, Integer& T, Long& Id, Long& no, Date& d);
 
  private:
+  friend class BKPlan;
+
   String dayLine() const;
   String timeLine() const;
   String dayNames() const;
 
   Recurrence rule_;
+  bool hasAnswered_ = true;  // whether the last next moment or description could be computed
 };
 
 }  // namespace QVSa

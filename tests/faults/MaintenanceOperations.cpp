@@ -42,7 +42,10 @@ std::vector<Operation> planOperations() {
       operation<BKPlan>("BKPlan.exec", loadPlan, [](BKPlan& plan, const String&) { return plan.exec(1); },
                         {{"use master", failed, false, number, true},
                          {" backup database", failed, false, number, true},
-                         {"restore verifyonly", failed, false, number, true}}),
+                         {"restore verifyonly", failed, false, number, true},
+                         {"select preFix", LoadResString(1503)},
+                         {"select maxId", LoadResString(1503)},
+                         {"update idRec", LoadResString(1503)}}),
       operation<BKPlans>(
           "BKPlans.GetAll", nothing<BKPlans>, [](BKPlans& plans, const String&) { return plans.GetAll(); }, told(3104)),
   };
@@ -115,12 +118,8 @@ std::vector<Operation> maintenanceOperations() {
 }
 
 std::vector<LetPass> maintenanceLetPass() {
-  constexpr const char* noNumber = "the log row has no number then";
   constexpr const char* noLock = "a lock that can't be read or set does not hold the backup up";
   return {
-      {"BKPlan.exec", "select preFix", false, noNumber},
-      {"BKPlan.exec", "select maxId", false, noNumber},
-      {"BKPlan.exec", "update idRec", false, noNumber},
       {"DBMgr.BackUpDB with a lock", "select isnull(roleSpec)", false, noLock},
       {"DBMgr.BackUpDB with a lock", "select repId from reports", false, noLock},
       {"DBMgr.BackUpDB with a lock", "update roles", false, noLock},

@@ -3,6 +3,7 @@
 
 #include "platform/Files.h"
 #include "platform/Folders.h"
+#include "platform/NewFile.h"
 #include "tests/support/Failures.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
@@ -91,6 +92,25 @@ TEST_F(BackupPlans, AreStoredAndLoadedAgain) {
   EXPECT_FALSE(twin.Save());
   EXPECT_EQ(twin.errNumber(), number::integrity);
   EXPECT_EQ(twin.errDescription(), "The name of backup plan is dulplicate.");
+
+  // No day of it can be computed, nor its unit be named.
+  BKPlan odd = plan("odd");
+  odd.schedule()->cycle(1);
+  odd.schedule()->wks("x");
+  EXPECT_TRUE(odd.Save());
+  EXPECT_EQ(odd.errNumber(), number::type);
+  odd.schedule()->wks("1");
+  odd.schedule()->timesOneDay(0);
+  odd.schedule()->valUnit(9);
+  EXPECT_TRUE(odd.Save());
+  EXPECT_EQ(odd.errNumber(), number::argument);
+  EXPECT_EQ(tables_.text("select schDesc from tasks where taskName='odd'"), "");
+  odd.schedule()->valUnit(1);
+  BKPlan mended = connected<BKPlan>();
+  mended.Name("mended");
+  mended.schedule(odd.schedule());
+  EXPECT_TRUE(mended.Save());
+  EXPECT_EQ(mended.errNumber(), 0) << "an earlier failure is none of this save";
 }
 
 TEST_F(BackupPlans, HaveOnePendingRunAndKeepTheFinishedOnes) {
@@ -226,6 +246,36 @@ TEST_F(BackupPlans, RemoveOnlyTheirOwnOldBackups) {
   }
   EXPECT_EQ(tables_.text("select count(*) from QVTaskSche where taskId=1 and state=1 and schNo<10"), "7")
       << "the history stays";
+
+  // Everything until next month is old.
+  nightly.delNum(-1);
+  nightly.delUnit(2);
+  ASSERT_TRUE(nightly.exec(run)) << nightly.errDescription();
+  EXPECT_EQ(platform::foldersIn(path()).size(), 6U) << "the five from above, and the run's own";
+}
+
+TEST_F(BackupPlans, RemoveWhatKilledRunsLeftHalfWritten) {
+  BKPlan nightly = saved("nightly");
+  nightly.delFiles(true);
+  nightly.delUnit(7);
+  const fs::path killed = oldBackup("20200101000000", {"sys.bak", "app.bak.new", "app.bak.new-journal"});
+  const fs::path other = oldBackup("letters", {"app.bak.new"});
+  const fs::path written = backups_.path() / "20200101000001";
+  fs::create_directory(written);
+  platform::NewFile file((written / "sys.bak").string(), platform::NewFile::Writers::one);
+  ASSERT_TRUE(nightly.exec(1)) << nightly.errDescription();
+  EXPECT_EQ(platform::filesIn(killed.string()), std::vector<String>{"sys.bak"});
+  EXPECT_EQ(platform::filesIn(other.string()), std::vector<String>{"app.bak.new"});
+  EXPECT_EQ(platform::filesIn(written.string()), std::vector<String>{"sys.bak.new"}) << "somebody is at it";
+}
+
+TEST_F(BackupPlans, WithoutANumberForTheLogAreDoneButForIt) {
+  BKPlan nightly = saved("nightly");
+  tables_.run("delete from idRule where idName='_log'");
+  EXPECT_FALSE(nightly.exec(1));
+  EXPECT_EQ(nightly.errNumber(), messageNumber(1502));
+  EXPECT_EQ(tables_.text("select schNo,state from QVTaskSche order by schNo"), "1|1\n2|0");
+  EXPECT_EQ(tables_.text("select count(*) from syslog"), "0");
 }
 
 TEST_F(BackupPlans, AreListedByName) {
