@@ -7,10 +7,13 @@
 #include <linux/magic.h>
 #include <sys/stat.h>
 #include <sys/vfs.h>
-#include <unistd.h>
+#include <vector>
 
 #include "QVSa/frame/Failure.h"
+#include "platform/FileDescriptor.h"
+#include "platform/NewFile.h"
 #include "platform/PasswordDigest.h"
+#include "platform/SystemFailure.h"
 #include "providers/embedded/Definitions.h"
 #include "providers/embedded/Pool.h"
 #include "providers/embedded/Script.h"
@@ -23,30 +26,26 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr Long fileExists = 58;
+const std::string insideName = ".building";  // of the folder that is built in the empty one that is there
+const std::string randomEnding = ".XXXXXX";
 constexpr mode_t folderMode = S_ISGID | S_IRWXU | S_IRWXG;
 constexpr mode_t fileMode = S_IRUSR | S_IWUSR | S_IRGRP | S_IWGRP;
 
-[[noreturn]] void throwSystemFailure() {
-  throw runtimeFailure(errno == EACCES || errno == EPERM || errno == EROFS ? number::accessDenied : number::pathAccess);
-}
-
 void require(bool done) {
-  if (!done) throwSystemFailure();
+  if (!done) throw platform::folderFailure(errno);
 }
 
-class OpenFile {
- public:
-  OpenFile(const fs::path& path, int flags) : file_(::open(path.c_str(), flags | O_CLOEXEC, fileMode)) {
-    require(file_ >= 0);
-  }
-  ~OpenFile() { ::close(file_); }
-  OpenFile(const OpenFile&) = delete;
-  OpenFile& operator=(const OpenFile&) = delete;
-  int get() const { return file_; }
+platform::FileDescriptor openFile(const fs::path& path, int flags) {
+  platform::FileDescriptor file(::open(path.c_str(), flags | O_CLOEXEC, fileMode));
+  require(file.isOpen());
+  return file;
+}
 
- private:
-  int file_;
-};
+struct stat stateOf(const fs::path& path) {
+  struct stat state {};
+  require(::stat(path.c_str(), &state) == 0);
+  return state;
+}
 
 // Its locks are not those that a database needs.
 void refuseNetworkFileSystem(const fs::path& folder) {
@@ -60,21 +59,23 @@ void refuseNetworkFileSystem(const fs::path& folder) {
     throw Failure(number::general, "SQL Server", "A database cannot lie on a network file system.");
 }
 
-// The name is finished when the folder is made.
-std::string placeBeside(const fs::path& target) {
-  return target.parent_path() / ("." + target.filename().string() + ".XXXXXX");
-}
-
-// The folder that is being built beside its place. It goes again unless it was moved there.
+// The folder that is being built beside its place, with the owner and group of the empty one that is there, and then
+// renamed. Where no folder can be renamed to that place, it is built inside the empty one, and its files move up. It
+// goes again unless it came to its place.
 class BuildingSite {
  public:
   explicit BuildingSite(const fs::path& target) : target_(target) {
-    std::string path = placeBeside(target);
-    require(::mkdtemp(path.data()) != nullptr);
-    path_ = path;
-    struct stat existing {};
-    if (::stat(target.c_str(), &existing) == 0 && ::chown(path_.c_str(), uid_t(-1), existing.st_gid) != 0) fail();
-    if (::chmod(path_.c_str(), folderMode) != 0) fail();
+    const fs::path above = target.parent_path();
+    const bool isThere = fs::exists(target);
+    const struct stat there = stateOf(isThere ? target : above);
+    const uid_t owner = isThere ? there.st_uid : keep;
+    const gid_t group = isThere ? there.st_gid : keep;
+    const bool isMountPoint = isThere && there.st_dev != stateOf(above).st_dev;
+    int reason = isMountPoint ? EBUSY : make(above / ("." + target.filename().string()), owner, group);
+    isInside_ = reason != 0 && isThere;
+    // None but the superuser gives files to somebody else.
+    if (isInside_) reason = make(target / insideName, ::geteuid() == 0 ? owner : keep, group);
+    if (reason != 0) throw platform::folderFailure(reason);
   }
   ~BuildingSite() { remove(); }
   BuildingSite(const BuildingSite&) = delete;
@@ -84,39 +85,71 @@ class BuildingSite {
 
   void moveToTarget() {
     discardIdleHandle(path_);
-    syncAll();
-    require(::rename(path_.c_str(), target_.c_str()) == 0);
+    giveAndSyncAll();
+    if (isInside_) {
+      moveUp();
+    } else {
+      require(::rename(path_.c_str(), target_.c_str()) == 0);
+    }
     path_.clear();
-    require(::fsync(OpenFile(target_.parent_path(), O_RDONLY | O_DIRECTORY).get()) == 0);
+    sync(isInside_ ? target_ : target_.parent_path());
   }
 
  private:
-  [[noreturn]] void fail() {
+  static constexpr unsigned keep = static_cast<unsigned>(-1);  // the owner or the group
+
+  // 0, or the system's reason.
+  int make(const fs::path& name, uid_t owner, gid_t group) {
+    std::string path = name.string() + randomEnding;
+    if (::mkdtemp(path.data()) == nullptr) return errno;
+    path_ = path;
+    if (::chown(path_.c_str(), owner, group) == 0 && ::chmod(path_.c_str(), folderMode) == 0) return 0;
     const int reason = errno;
     remove();
-    errno = reason;
-    throwSystemFailure();
+    return reason;
   }
+
+  // The files have the group of their folder already.
+  void giveAndSyncAll() const {
+    const uid_t owner = stateOf(path_).st_uid;
+    for (const auto& entry : fs::directory_iterator(path_)) {
+      const platform::FileDescriptor file = openFile(entry.path(), O_RDONLY);
+      require(::fchown(file.get(), owner, keep) == 0 && ::fsync(file.get()) == 0);
+    }
+    sync(path_);
+  }
+
+  void moveUp() {
+    // Somebody else may be building there as well.
+    if (std::distance(fs::directory_iterator(target_), {}) != 1) throw runtimeFailure(fileExists);
+    require(::chmod(target_.c_str(), folderMode) == 0);
+    const std::vector<fs::directory_entry> files(fs::directory_iterator(path_), {});
+    for (const fs::path& file : files) {
+      moved_.push_back(target_ / file.filename());
+      require(::rename(file.c_str(), moved_.back().c_str()) == 0);
+    }
+    require(::rmdir(path_.c_str()) == 0);
+  }
+
+  static void sync(const fs::path& folder) { require(::fsync(openFile(folder, O_RDONLY | O_DIRECTORY).get()) == 0); }
 
   void remove() {
     if (path_.empty()) return;
     discardIdleHandle(path_);
     std::error_code ignored;
     fs::remove_all(path_, ignored);
-  }
-
-  void syncAll() const {
-    for (const auto& entry : fs::directory_iterator(path_))
-      require(::fsync(OpenFile(entry.path(), O_RDONLY).get()) == 0);
-    require(::fsync(OpenFile(path_, O_RDONLY | O_DIRECTORY).get()) == 0);
+    for (const fs::path& file : moved_) fs::remove(file, ignored);
+    path_.clear();
   }
 
   fs::path target_;
-  fs::path path_;
+  fs::path path_;  // empty once it is in its place
+  bool isInside_ = false;
+  std::vector<fs::path> moved_;
 };
 
 void makeFile(const fs::path& path) {
-  const OpenFile file(path, O_RDWR | O_CREAT | O_EXCL);
+  const platform::FileDescriptor file = openFile(path, O_RDWR | O_CREAT | O_EXCL);
   require(::fchmod(file.get(), fileMode) == 0);
 }
 
@@ -168,9 +201,7 @@ void fill(const fs::path& folder, const InstallationPlan& plan) {
 void makeParent(const fs::path& folder) {
   std::error_code error;
   fs::create_directories(folder, error);
-  if (!error) return;
-  errno = error.value();
-  throwSystemFailure();
+  if (error) throw platform::folderFailure(error.value());
 }
 
 }  // namespace
@@ -178,13 +209,14 @@ void makeParent(const fs::path& folder) {
 void createInstallation(const InstallationPlan& plan) {
   fs::path target = fs::absolute(plan.folder).lexically_normal();
   if (!target.has_filename()) target = target.parent_path();
+  target = platform::behindLinks(target);
   std::error_code error;
   if (fs::exists(target, error) && !fs::is_empty(target, error)) throw runtimeFailure(fileExists);
-  const std::size_t spare = placeBeside(target).size() - target.native().size();
+  const std::size_t spare = 1 + insideName.size() + randomEnding.size();
   if (const std::string problem = lengthProblem(target, spare); !problem.empty())
     throw Failure(number::pathAccess, "SQL Server", "The installation cannot be made: " + problem + ".");
   makeParent(target.parent_path());
-  refuseNetworkFileSystem(target.parent_path());
+  refuseNetworkFileSystem(fs::exists(target) ? target : target.parent_path());
   BuildingSite site(target);
   fill(site.path(), plan);
   site.moveToTarget();

@@ -21,9 +21,11 @@ struct InstallationPlan {
 };
 
 // Makes an installation: the folder where it is missing, one file a database, the lock files, the log-ins, then the
-// scripts. It is built in a folder beside the target and renamed, so that a failure leaves nothing behind.
-// Throws 58 where the folder exists and is not empty, 75 or 70 where it cannot be made, 0x80004005 on a network file
-// system.
+// scripts. It is built in a folder beside the target and renamed, so that a failure leaves nothing behind; in an empty
+// folder that no other can replace (the one above can't be written, or it is a mount point) within that. Owner and
+// group of an empty folder are kept, and a link to it is followed.
+// Throws 58 where the folder exists and is not empty, 70, 75 or 76 where it cannot be made, 0x80004005 on a network
+// file system.
 void createInstallation(const InstallationPlan& plan);
 
 // Whether the folder holds an installation of the engine.

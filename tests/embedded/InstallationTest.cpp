@@ -1,6 +1,7 @@
 #include <fstream>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include "QVSa/frame/Failure.h"
 #include "providers/embedded/Installation.h"
@@ -45,6 +46,37 @@ TEST(Installation, AFolderWithSomethingInItIsLeftAlone) {
   EXPECT_TRUE(isInstallation(folder.data()));
 }
 
+TEST(Installation, AnEmptyFolderKeepsItsOwnerAndTheLinkToIt) {
+  if (::geteuid() != 0) GTEST_SKIP() << "Only the superuser can be somebody else as well.";
+  constexpr uid_t stranger = 65'534;
+  // Once beside it, once in a folder above that the owner can't write.
+  for (const uid_t maker : {uid_t{0}, stranger}) {
+    InstallationFolder folder(false);
+    const auto owned = folder.root() / "owned";
+    std::filesystem::create_directory(owned);
+    std::filesystem::create_directory_symlink("owned", folder.data());
+    ASSERT_EQ(::chown(owned.c_str(), stranger, stranger), 0);
+    ASSERT_EQ(::chmod(folder.root().c_str(), 0755), 0);
+    InstallationPlan plan = folder.plan();
+    ASSERT_TRUE(::setegid(maker) == 0 && ::seteuid(maker) == 0);
+    plan.scripts = {{"QVApp", "create nonsense"}};
+    EXPECT_THROW(createInstallation(plan), Failure);
+    EXPECT_TRUE(isEmpty(owned));
+    plan.scripts.clear();
+    EXPECT_NO_THROW(createInstallation(plan));
+    ASSERT_TRUE(::seteuid(0) == 0 && ::setegid(0) == 0);
+    EXPECT_TRUE(isInstallation(owned));
+    EXPECT_EQ(modeOf(owned), 02770);
+    EXPECT_TRUE(std::filesystem::is_symlink(folder.data()));
+    EXPECT_EQ(std::distance(std::filesystem::directory_iterator(owned), {}), 2 * std::ssize(databaseNames));
+    for (const auto& file : {owned, databaseFile(owned, "QVSys"), lockFile(owned, "QVSys")}) {
+      struct stat state {};
+      EXPECT_EQ(::stat(file.c_str(), &state), 0);
+      EXPECT_TRUE(state.st_uid == stranger && state.st_gid == stranger) << file;
+    }
+  }
+}
+
 TEST(Installation, AScriptThatFailsLeavesNothingBehind) {
   InstallationFolder folder(false);
   InstallationPlan plan = folder.plan();
@@ -66,7 +98,7 @@ TEST(Installation, APathThatIsTooLongIsRefusedByItsLength) {
   const Failure notMade = test::thrownBy([&] { createInstallation(plan); });
   EXPECT_EQ(notMade.number(), number::pathAccess);
   EXPECT_NE(notMade.description().find("485 bytes"), String::npos) << notMade.description();
-  plan.folder = below(484);
+  plan.folder = below(475);
   createInstallation(plan);
 
   std::filesystem::rename(plan.folder, below(493));
