@@ -4,6 +4,7 @@
 #include <span>
 
 #include "QVSa/frame/Values.h"
+#include "platform/FileDescriptor.h"
 
 namespace QVSa::platform {
 
@@ -12,15 +13,12 @@ namespace QVSa::platform {
 class FileReader {
  public:
   explicit FileReader(const String& path);
-  ~FileReader();
-  FileReader(const FileReader&) = delete;
-  FileReader& operator=(const FileReader&) = delete;
 
   // Fills the block as far as the file goes, and tells how far; 0 at its end.
   std::size_t read(std::span<std::uint8_t> block);
 
  private:
-  int handle_;
+  FileDescriptor file_;
 };
 
 }  // namespace QVSa::platform
