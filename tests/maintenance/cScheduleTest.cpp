@@ -7,18 +7,21 @@ namespace {
 Date at(const String& text) { return *Date::parse(text); }
 
 // Once a day at ten.
-cSchedule once(Integer cycle, Integer cycleNum = 1) {
+cSchedule once(Integer cycle, Integer cycleNum = 1, const String& wks = "0000000", Integer monthDay = 0) {
   cSchedule schedule;
   schedule.cycle(cycle);
   schedule.cycleNum(cycleNum);
+  schedule.wks(wks);
+  schedule.monthDay(monthDay);
   schedule.timesOneDay(1);
   schedule.StartTime(at("10:00:00"));
   return schedule;
 }
 
-cSchedule repeating(Integer interval, Integer unit, Integer cycle = 0) {
-  cSchedule schedule;
-  schedule.cycle(cycle);
+// From eight on.
+cSchedule repeating(Integer interval, Integer unit, Integer cycle = 0, const String& wks = "0000000") {
+  cSchedule schedule = once(cycle, 1, wks);
+  schedule.timesOneDay(0);
   schedule.StartTime(at("08:00:00"));
   schedule.interval(interval);
   schedule.valUnit(unit);
@@ -29,71 +32,41 @@ String next(cSchedule& schedule, const String& now) { return schedule.GetNextTim
 
 }  // namespace
 
-TEST(ASchedule, CountsDaysFromNow) {
-  auto second = once(0, 2);
-  EXPECT_EQ(next(second, "2026-03-10 09:00"), "2026-03-10 10:00:00");
-  EXPECT_EQ(next(second, "2026-03-10 11:00"), "2026-03-12 10:00:00");
-  auto daily = once(0);
-  EXPECT_EQ(next(daily, "2026-03-10 10:00:00"), "2026-03-11 10:00:00") << "what is due just now is not due again";
-}
-
-TEST(ASchedule, SkipsWeeksBehindASunday) {
-  auto schedule = once(1, 2);
-  schedule.wks("1000100");
-  EXPECT_EQ(next(schedule, "2026-03-11 12:00"), "2026-03-13 10:00:00");
-  EXPECT_EQ(next(schedule, "2026-03-13 12:00"), "2026-03-23 10:00:00");
-  auto empty = once(1, 3);
-  EXPECT_EQ(next(empty, "2026-03-11 12:00"), "2026-04-01 10:00:00") << "no weekday: the same one again";
-  schedule.wks("10");
-  EXPECT_EQ(next(schedule, "2026-03-11 12:00"), "2026-03-23 10:00:00") << "missing weekdays are none";
-}
-
-TEST(ASchedule, CutsTheDayToTheMonth) {
-  auto schedule = once(2);
-  schedule.monthDay(31);
-  EXPECT_EQ(next(schedule, "2026-01-31 12:00"), "2026-02-28 10:00:00");
-  EXPECT_EQ(next(schedule, "2026-02-28 11:00"), "2026-03-31 10:00:00");
-  schedule.monthDay(30);
-  EXPECT_EQ(next(schedule, "2026-02-15 09:00"), "2026-02-28 10:00:00");
-  EXPECT_EQ(next(schedule, "2026-02-28 11:00"), "2026-03-30 10:00:00");
-  schedule.monthDay(0);
-  EXPECT_EQ(next(schedule, "2026-01-31 09:00"), "2026-01-31 10:00:00");
-  auto quarterly = once(2, 3);
-  quarterly.monthDay(15);
-  EXPECT_EQ(next(quarterly, "2026-01-15 11:00"), "2026-04-15 10:00:00");
-  EXPECT_EQ(next(quarterly, "2026-01-10 11:00"), "2026-01-15 10:00:00") << "a day still ahead in this month is taken";
-}
-
-TEST(ASchedule, RepeatsUntilMidnight) {
-  auto hours = repeating(2, 0);
-  EXPECT_EQ(next(hours, "2026-03-10 09:30"), "2026-03-10 10:00:00");
-  auto hourly = repeating(1, 0);
-  EXPECT_EQ(next(hourly, "2026-03-10 23:10"), "2026-03-11 08:00:00");
-  auto quarters = repeating(15, 1);
-  EXPECT_EQ(next(quarters, "2026-03-10 23:50"), "2026-03-11 08:00:00");
-}
-
-TEST(ASchedule, KeepsTodaysSlotOnTheNextRunDay) {
-  auto schedule = repeating(2, 0, 1);
-  schedule.wks("1000000");
-  EXPECT_EQ(next(schedule, "2026-03-15 13:00"), "2026-03-16 14:00:00");
-}
-
-TEST(ASchedule, IsASlotLateBeforeItsStart) {
-  auto hourly = repeating(1, 0);
-  EXPECT_EQ(next(hourly, "2026-03-10 07:30"), "2026-03-10 09:00:00");
-  EXPECT_EQ(next(hourly, "2026-03-10 06:30"), "2026-03-10 08:00:00");
-  EXPECT_EQ(next(hourly, "2026-03-10 05:30"), "2026-03-10 07:00:00");
-}
-
-TEST(ASchedule, WithoutACycleIsATimeAlone) {
-  auto schedule = once(3);
-  EXPECT_EQ(next(schedule, "2026-03-10 09:00"), "10:00:00");
+TEST(ASchedule, IsNextDue) {
+  struct Case {
+    cSchedule schedule;
+    const char* now;
+    const char* due;
+    const char* reason = "";
+  };
+  Case cases[] = {
+      {once(0, 2), "2026-03-10 09:00", "2026-03-10 10:00:00"},
+      {once(0, 2), "2026-03-10 11:00", "2026-03-12 10:00:00"},
+      {once(0), "2026-03-10 10:00:00", "2026-03-11 10:00:00", "what is due just now is not due again"},
+      {once(1, 2, "1000100"), "2026-03-11 12:00", "2026-03-13 10:00:00"},
+      {once(1, 2, "1000100"), "2026-03-13 12:00", "2026-03-23 10:00:00", "weeks are skipped behind a Sunday"},
+      {once(1, 3), "2026-03-11 12:00", "2026-04-01 10:00:00", "no weekday: the same one again"},
+      {once(1, 2, "10"), "2026-03-11 12:00", "2026-03-23 10:00:00", "missing weekdays are none"},
+      {once(2, 1, "", 31), "2026-01-31 12:00", "2026-02-28 10:00:00"},
+      {once(2, 1, "", 31), "2026-02-28 11:00", "2026-03-31 10:00:00"},
+      {once(2, 1, "", 30), "2026-02-15 09:00", "2026-02-28 10:00:00"},
+      {once(2, 1, "", 30), "2026-02-28 11:00", "2026-03-30 10:00:00"},
+      {once(2, 1, "", 0), "2026-01-31 09:00", "2026-01-31 10:00:00"},
+      {once(2, 3, "", 15), "2026-01-15 11:00", "2026-04-15 10:00:00"},
+      {once(2, 3, "", 15), "2026-01-10 11:00", "2026-01-15 10:00:00", "a day still ahead in this month is taken"},
+      {repeating(2, 0), "2026-03-10 09:30", "2026-03-10 10:00:00"},
+      {repeating(1, 0), "2026-03-10 23:10", "2026-03-11 08:00:00"},
+      {repeating(15, 1), "2026-03-10 23:50", "2026-03-11 08:00:00"},
+      {repeating(2, 0, 1, "1000000"), "2026-03-15 13:00", "2026-03-16 14:00:00", "today's slot on the next run day"},
+      {repeating(1, 0), "2026-03-10 07:30", "2026-03-10 09:00:00", "before its start it is a slot late"},
+      {repeating(1, 0), "2026-03-10 05:30", "2026-03-10 07:00:00"},
+      {once(3), "2026-03-10 09:00", "10:00:00", "without a cycle it is a time alone"},
+  };
+  for (Case& one : cases) EXPECT_EQ(next(one.schedule, one.now), one.due) << one.now << " " << one.reason;
 }
 
 TEST(ASchedule, GivesTheTimeThatItReachedWhereItFails) {
-  auto schedule = once(0);
-  schedule.wks("11111111");
+  auto schedule = once(0, 1, "11111111");
   EXPECT_EQ(schedule.GetNextTime(at("2026-03-10 09:00")), Date());
   EXPECT_EQ(schedule.errNumber(), number::position);
 
@@ -104,8 +77,7 @@ TEST(ASchedule, GivesTheTimeThatItReachedWhereItFails) {
   auto far = once(1, 20000);
   EXPECT_EQ(next(far, "2026-03-15 11:00"), "10:00:00") << "the time of day was known before the day failed";
   EXPECT_EQ(far.errNumber(), number::overflow);
-  auto odd = once(1);
-  odd.wks("0000x00");
+  auto odd = once(1, 1, "0000x00");
   EXPECT_EQ(next(odd, "2026-03-11 11:00"), "10:00:00");
   EXPECT_EQ(odd.errNumber(), number::type);
 }
@@ -114,12 +86,10 @@ TEST(ASchedule, DescribesItself) {
   const EnvironmentLocale english("C");
   auto schedule = once(0, 2);
   EXPECT_EQ(schedule.description(), "Occurs every [2] day(s)\r\nat [10:00:00]");
-  schedule = repeating(15, 1, 1);
-  schedule.wks("1000100");
+  schedule = repeating(15, 1, 1, "1000100");
   EXPECT_EQ(schedule.description(),
             "Occurs every [1] week(s) on [Monday, Friday]\r\nfrom [08:00:00], every [15 Minute(s)] hour(s).");
-  schedule = once(2, 3);
-  schedule.monthDay(15);
+  schedule = once(2, 3, "", 15);
   EXPECT_EQ(schedule.description(), "Occurs every [3] month(s) on day [15] of that month\r\nat [10:00:00]");
   schedule.monthDay(0);
   schedule.timesOneDay(0);
