@@ -32,6 +32,8 @@ class AgentInformation : public Scene {
   }
   void shipUpdateProgram(const String& content, const String& moment) {
     updates_.run("insert into sysfile(fileName,updtime) values('QVUpdate.exe','" + moment + "')");
+    EXPECT_EQ(newFiles(), 1);
+    EXPECT_EQ(updateProgram(), "none") << "it has no content yet";
     const TestFolder folder;
     const String path = folder.path().string() + "/content";
     platform::writeFile(path, Bytes(content.begin(), content.end()));

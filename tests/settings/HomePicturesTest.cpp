@@ -107,7 +107,9 @@ TEST_F(HomePicturesTest, OnlyALocalFileNewerThanTheLastSaveStays) {
   EXPECT_EQ(size(), 100U) << "no save is known";
 }
 
-TEST_F(HomePicturesTest, APictureThatCannotBeMovedIsNoFailure) {
+TEST_F(HomePicturesTest, APictureThatCannotBeMovedIsNoFailureAndToldToTheEventLog) {
+  std::vector<String> events;
+  replace(&platform::Services::eventLog, {[&](const String& line) { events.push_back(line); }});
   Home home = connected<Home>();
   home.LoginImageFile(picture(10));
   ASSERT_TRUE(home.Save());
@@ -132,6 +134,7 @@ TEST_F(HomePicturesTest, APictureThatCannotBeMovedIsNoFailure) {
     EXPECT_EQ(other.LoginImageFile(), "");
     EXPECT_EQ(other.errDescription(), "Path/File access error");
   }
+  EXPECT_EQ(events, (std::vector<String>{"File not found", "Path not found", "Path/File access error"}));
 }
 
 TEST_F(HomePicturesTest, WithoutARowNothingIsFetched) {
