@@ -94,10 +94,10 @@ TEST(Installation, APathThatIsTooLongIsRefusedByItsLength) {
     return path / String(length - path.native().size() - 1, 'y');
   };
   InstallationPlan plan = folder.plan();
-  plan.folder = below(485);
+  plan.folder = below(476);
   const Failure notMade = test::thrownBy([&] { createInstallation(plan); });
   EXPECT_EQ(notMade.number(), number::pathAccess);
-  EXPECT_NE(notMade.description().find("485 bytes"), String::npos) << notMade.description();
+  EXPECT_NE(notMade.description().find("476 bytes"), String::npos) << notMade.description();
   plan.folder = below(475);
   createInstallation(plan);
 
