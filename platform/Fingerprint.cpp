@@ -1,11 +1,11 @@
 #include "platform/Fingerprint.h"
 
 #include <array>
+#include <new>
 #include <openssl/evp.h>
-#include <openssl/hmac.h>
-#include <openssl/rand.h>
 
-#include "QVSa/frame/Failure.h"
+#include "platform/OpenSsl.h"
+#include "platform/RandomBytes.h"
 
 namespace QVSa::platform {
 
@@ -16,7 +16,7 @@ using Key = std::array<std::uint8_t, 32>;
 const Key& processKey() {
   static const Key key = [] {
     Key made;
-    if (RAND_bytes(made.data(), static_cast<int>(made.size())) != 1) throw runtimeFailure(number::internal);
+    fillRandom(made);
     return made;
   }();
   return key;
@@ -25,13 +25,14 @@ const Key& processKey() {
 }  // namespace
 
 Bytes fingerprint(const String& secret) {
+  const OpenSslErrorsKept kept;
   const Key& key = processKey();
   Bytes digest(EVP_MAX_MD_SIZE);
-  unsigned int size = 0;
+  std::size_t size = 0;
   const auto* const bytes = reinterpret_cast<const unsigned char*>(secret.data());
-  if (HMAC(EVP_sha256(), key.data(), static_cast<int>(key.size()), bytes, secret.size(), digest.data(), &size) ==
-      nullptr)
-    throw runtimeFailure(number::internal);
+  if (EVP_Q_mac(openSslLibrary(), "HMAC", nullptr, "SHA2-256", nullptr, key.data(), key.size(), bytes, secret.size(),
+                digest.data(), digest.size(), &size) == nullptr)
+    throw std::bad_alloc();
   digest.resize(size);
   return digest;
 }

@@ -1,27 +1,22 @@
 #include "platform/OpenSsl.h"
 
 #include <cerrno>
-#include <memory>
+#include <new>
 #include <openssl/crypto.h>
 #include <openssl/err.h>
 #include <openssl/evp.h>
+#include <openssl/kdf.h>
 #include <openssl/provider.h>
 
 namespace QVSa::platform {
 
 namespace {
 
-template <auto release>
-struct Free {
-  template <typename Object>
-  void operator()(Object* object) const {
-    release(object);
-  }
-};
-using Context = std::unique_ptr<OSSL_LIB_CTX, Free<OSSL_LIB_CTX_free>>;
-using Cipher = std::unique_ptr<EVP_CIPHER, Free<EVP_CIPHER_free>>;
-using Digest = std::unique_ptr<EVP_MD, Free<EVP_MD_free>>;
-using Mac = std::unique_ptr<EVP_MAC, Free<EVP_MAC_free>>;
+using Context = OpenSslPointer<OSSL_LIB_CTX, OSSL_LIB_CTX_free>;
+using Cipher = OpenSslPointer<EVP_CIPHER, EVP_CIPHER_free>;
+using Digest = OpenSslPointer<EVP_MD, EVP_MD_free>;
+using Mac = OpenSslPointer<EVP_MAC, EVP_MAC_free>;
+using Kdf = OpenSslPointer<EVP_KDF, EVP_KDF_free>;
 
 // DES lives without it; the other old ciphers do not. Want of memory may read as want of the module.
 bool loadLegacy(OSSL_LIB_CTX* library) {
@@ -33,7 +28,8 @@ bool loadLegacy(OSSL_LIB_CTX* library) {
 // The first fetch of each kind reads lists that go with OpenSSL's own end.
 bool fetchEachKind(OSSL_LIB_CTX* library) {
   return Cipher(EVP_CIPHER_fetch(library, "DES-EDE3-CBC", nullptr)) &&
-         Digest(EVP_MD_fetch(library, "SHA2-256", nullptr)) && Mac(EVP_MAC_fetch(library, "HMAC", nullptr));
+         Digest(EVP_MD_fetch(library, "SHA2-256", nullptr)) && Mac(EVP_MAC_fetch(library, "HMAC", nullptr)) &&
+         Kdf(EVP_KDF_fetch(library, "PBKDF2", nullptr));
 }
 
 OSSL_LIB_CTX* makeLibrary() {
@@ -43,7 +39,7 @@ OSSL_LIB_CTX* makeLibrary() {
   Context library(OSSL_LIB_CTX_new());
   const bool made = library && OSSL_PROVIDER_load(library.get(), "default") != nullptr && loadLegacy(library.get()) &&
                     fetchEachKind(library.get());
-  if (!made) throw runtimeFailure(number::memory);
+  if (!made) throw std::bad_alloc();
   return library.release();
 }
 

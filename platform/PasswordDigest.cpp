@@ -2,13 +2,16 @@
 
 #include <array>
 #include <charconv>
+#include <new>
+#include <openssl/core_names.h>
 #include <openssl/crypto.h>
-#include <openssl/evp.h>
-#include <openssl/rand.h>
+#include <openssl/kdf.h>
+#include <openssl/params.h>
 #include <optional>
 #include <string_view>
 
-#include "QVSa/frame/Failure.h"
+#include "platform/OpenSsl.h"
+#include "platform/RandomBytes.h"
 
 namespace QVSa::platform {
 
@@ -33,16 +36,22 @@ struct StoredDigest {
 };
 
 Digest derive(const String& password, const Bytes& salt, int rounds) {
+  const OpenSslErrorsKept kept;
+  const OpenSslPointer<EVP_KDF, EVP_KDF_free> kdf(EVP_KDF_fetch(openSslLibrary(), "PBKDF2", nullptr));
+  const OpenSslPointer<EVP_KDF_CTX, EVP_KDF_CTX_free> context(EVP_KDF_CTX_new(kdf.get()));
+  // Lent for reading only.
+  const auto lend = [](const char* name, const auto& value) {
+    return OSSL_PARAM_construct_octet_string(name, const_cast<char*>(reinterpret_cast<const char*>(value.data())),
+                                             value.size());
+  };
+  char hash[] = "SHA2-256";
+  const OSSL_PARAM parameters[] = {lend(OSSL_KDF_PARAM_PASSWORD, password), lend(OSSL_KDF_PARAM_SALT, salt),
+                                   OSSL_PARAM_construct_int(OSSL_KDF_PARAM_ITER, &rounds),
+                                   OSSL_PARAM_construct_utf8_string(OSSL_KDF_PARAM_DIGEST, hash, 0),
+                                   OSSL_PARAM_construct_end()};
   Digest digest;
-  const bool done =
-      PKCS5_PBKDF2_HMAC(password.data(), static_cast<int>(password.size()), salt.data(), static_cast<int>(salt.size()),
-                        rounds, EVP_sha256(), static_cast<int>(digest.size()), digest.data()) == 1;
-  if (!done) throw runtimeFailure(number::internal);
+  if (!context || EVP_KDF_derive(context.get(), digest.data(), digest.size(), parameters) != 1) throw std::bad_alloc();
   return digest;
-}
-
-void fillRandom(Bytes& bytes) {
-  if (RAND_bytes(bytes.data(), static_cast<int>(bytes.size())) != 1) throw runtimeFailure(number::internal);
 }
 
 template <typename Range>
