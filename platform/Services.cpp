@@ -47,9 +47,11 @@ String systemProgramFolder() {
   return std::filesystem::read_symlink("/proc/self/exe", ignored).parent_path().string();
 }
 
+// Never destroyed: a host may call with its last statics.
 Services& current() {
-  static Services services{systemLocalTime,        systemComputerName,  writeEventLog,           systemProgramFolder,
-                           platform::openSettings, platform::ntlmLogon, platform::getUsersFromLD};
+  static Services& services =
+      *new Services{systemLocalTime,        systemComputerName,  writeEventLog,           systemProgramFolder,
+                    platform::openSettings, platform::ntlmLogon, platform::getUsersFromLD};
   return services;
 }
 

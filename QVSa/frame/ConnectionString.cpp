@@ -1,7 +1,10 @@
 #include "QVSa/frame/ConnectionString.h"
 
-#include <map>
+#include <algorithm>
+#include <iterator>
 #include <set>
+#include <string_view>
+#include <utility>
 
 #include "QVSa/frame/DeploymentSecrets.h"
 #include "QVSa/frame/Text.h"
@@ -40,16 +43,17 @@ std::vector<std::uint32_t> multiplied(const std::u16string& text) {
 
 // Whether the keyword is known.
 bool setOption(ConnectionOptions& options, const String& keyword, const String& value) {
-  static const std::map<String, String ConnectionOptions::*> texts{{"provider", &ConnectionOptions::provider},
-                                                                   {"data source", &ConnectionOptions::dataSource},
-                                                                   {"database", &ConnectionOptions::database},
-                                                                   {"uid", &ConnectionOptions::user},
-                                                                   {"pwd", &ConnectionOptions::password}};
+  static constexpr std::pair<std::string_view, String ConnectionOptions::*> texts[] = {
+      {"provider", &ConnectionOptions::provider},
+      {"data source", &ConnectionOptions::dataSource},
+      {"database", &ConnectionOptions::database},
+      {"uid", &ConnectionOptions::user},
+      {"pwd", &ConnectionOptions::password}};
   const bool isIntegrated = keyword == "integrated security";
   if (isIntegrated) options.integrated = sameText(value, "sspi");
-  const auto text = texts.find(keyword);
-  if (text != texts.end()) options.*text->second = value;
-  return isIntegrated || text != texts.end();
+  const auto* const text = std::ranges::find(texts, keyword, [](const auto& entry) { return entry.first; });
+  if (text != std::end(texts)) options.*text->second = value;
+  return isIntegrated || text != std::end(texts);
 }
 
 Failure malformed() { return Failure(number::general, "Connection", "Invalid format of the initialization string."); }

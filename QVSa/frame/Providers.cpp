@@ -16,8 +16,9 @@ std::unique_ptr<ProviderSession> pick(const ConnectionOptions& options) {
   return embedded::provider().open(options);
 }
 
+// Never destroyed: a host may call with its last statics.
 SessionOpener& current() {
-  static SessionOpener opener = pick;
+  static SessionOpener& opener = *new SessionOpener(pick);
   return opener;
 }
 

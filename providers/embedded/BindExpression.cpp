@@ -1,4 +1,7 @@
 #include <algorithm>
+#include <iterator>
+#include <string_view>
+#include <utility>
 
 #include "providers/embedded/Binder.h"
 #include "providers/embedded/Literal.h"
@@ -172,15 +175,15 @@ BoundPtr Binder::bindPlus(BoundPtr left, BoundPtr right) {
 }
 
 BoundPtr Binder::arithmetic(const std::string& op, BoundPtr left, BoundPtr right) {
-  static const std::map<std::string, std::string> functions = {
+  static constexpr std::pair<std::string_view, const char*> functions[] = {
       {"+", "t_add"}, {"-", "t_subtract"}, {"*", "t_multiply"}, {"/", "t_divide"}, {"%", "t_modulo"}};
   Type type = common(left->type, right->type);
   if (!type.isNumber()) throw tsql::sqlFailure(402, "The data types are incompatible in the operator '" + op + "'.");
   left = coerce(std::move(left), type, Purpose::compute);
   right = coerce(std::move(right), type, Purpose::compute);
   if (type.isWhole() && type.base < Base::integer) type = {Base::integer, -1};
-  const auto function = functions.find(op);
-  if (function == functions.end()) return infix(op, type, std::move(left), std::move(right));
+  const auto* const function = std::ranges::find(functions, op, [](const auto& entry) { return entry.first; });
+  if (function == std::end(functions)) return infix(op, type, std::move(left), std::move(right));
   // Large and fractional numbers follow the storage library's own arithmetic; a zero divisor is refused in all.
   if (op != "/" && op != "%" && type.base != Base::integer) return infix(op, type, std::move(left), std::move(right));
   std::vector<BoundPtr> operands;

@@ -1,5 +1,7 @@
 #include <algorithm>
-#include <set>
+#include <array>
+#include <map>
+#include <string_view>
 
 #include "providers/embedded/Binder.h"
 #include "providers/tsql/SqlFailure.h"
@@ -22,8 +24,9 @@ struct Signature {
 
 constexpr Type keep{};
 
+// Never destroyed: a host may call with its last statics.
 const std::map<std::string, Signature>& signatures() {
-  static const std::map<std::string, Signature> table = {
+  static const auto& table = *new std::map<std::string, Signature>{
       {"len", {"t_len", whole, {text}}},
       {"charindex", {"t_charindex", whole, {text, text, whole}}},
       {"replace", {"t_replace", text, {text, text, text}}},
@@ -46,15 +49,15 @@ const std::map<std::string, Signature>& signatures() {
   return table;
 }
 
-const std::set<std::string>& aggregates() {
-  static const std::set<std::string> names = {"count", "min", "max", "sum", "avg"};
-  return names;
+bool isAggregate(const std::string& function) {
+  constexpr std::array<std::string_view, 5> aggregates = {"count", "min", "max", "sum", "avg"};
+  return std::ranges::find(aggregates, function) != aggregates.end();
 }
 
 }  // namespace
 
 BoundPtr Binder::bindFunction(const tsql::Expression& expression, const Scope& scope) {
-  if (aggregates().contains(expression.name)) return bindAggregate(expression, scope);
+  if (isAggregate(expression.name)) return bindAggregate(expression, scope);
   if (expression.name == "isnull") return bindIsNull(expression, scope);
   if (expression.name == "coalesce") return bindCoalesce(expression, scope);
   if (expression.name == "nullif") {
@@ -78,9 +81,8 @@ BoundPtr Binder::bindFunction(const tsql::Expression& expression, const Scope& s
 }
 
 BoundPtr Binder::bindDateFunction(const tsql::Expression& expression, const Scope& scope) {
-  static const std::map<std::string, std::string> parts = {{"year", "year"}, {"month", "month"}, {"day", "day"}};
-  const auto alone = parts.find(expression.name);
-  const std::string part = alone == parts.end() ? expression.datePart : alone->second;
+  const bool namesPart = expression.name == "year" || expression.name == "month" || expression.name == "day";
+  const std::string& part = namesPart ? expression.name : expression.datePart;
   std::vector<BoundPtr> operands;
   operands.push_back(constant("'" + part + "'"));
   for (const auto& operand : expression.operands) {
@@ -89,7 +91,7 @@ BoundPtr Binder::bindDateFunction(const tsql::Expression& expression, const Scop
   }
   if (expression.name == "dateadd") return call("t_dateadd", moment, std::move(operands));
   if (expression.name == "datediff") return call("t_datediff", whole, std::move(operands));
-  if (expression.name == "datepart" || alone != parts.end()) return call("t_datepart", whole, std::move(operands));
+  if (expression.name == "datepart" || namesPart) return call("t_datepart", whole, std::move(operands));
   throw tsql::sqlFailure(195, "'" + expression.name + "' is not a recognized built-in function name.");
 }
 

@@ -2,6 +2,9 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <iterator>
+#include <string_view>
+#include <utility>
 
 #include "providers/embedded/CaseFolding.h"
 #include "providers/embedded/Utf8.h"
@@ -114,7 +117,7 @@ std::optional<std::size_t> databaseByName(const std::string& name) {
 }
 
 Type typeOf(const tsql::TypeName& name) {
-  static const std::map<std::string, Base> known = {
+  static constexpr std::pair<std::string_view, Base> known[] = {
       {"bit", Base::bit},           {"tinyint", Base::tinyint}, {"smallint", Base::smallint},
       {"int", Base::integer},       {"integer", Base::integer}, {"bigint", Base::bigint},
       {"decimal", Base::decimal},   {"numeric", Base::decimal}, {"money", Base::decimal},
@@ -123,8 +126,8 @@ Type typeOf(const tsql::TypeName& name) {
       {"nvarchar", Base::nvarchar}, {"nchar", Base::nvarchar},  {"text", Base::ntext},
       {"ntext", Base::ntext},       {"image", Base::image},     {"binary", Base::image},
       {"varbinary", Base::image}};
-  const auto base = known.find(name.name);
-  if (base == known.end()) throw tsql::sqlFailure(2715, "Cannot find data type " + name.name + ".");
+  const auto* const base = std::ranges::find(known, name.name, [](const auto& entry) { return entry.first; });
+  if (base == std::end(known)) throw tsql::sqlFailure(2715, "Cannot find data type " + name.name + ".");
   const bool sized = base->second == Base::varchar || base->second == Base::nvarchar ||
                      (base->second == Base::image && name.name != "image");
   if (!sized) return {base->second, -1};

@@ -36,7 +36,8 @@ class CheckedLogins {
 };
 
 CheckedLogins& checkedLogins() {
-  static CheckedLogins theLogins;
+  // Never destroyed: a host may call with its last statics.
+  static auto& theLogins = *new CheckedLogins();
   return theLogins;
 }
 

@@ -9,6 +9,7 @@ namespace QVSa::embedded {
 namespace {
 
 // The one idle handle of the process. Handles are closed outside the mutex: that can take a checkpoint.
+// Itself it is never destroyed: a host may call with its last statics.
 class Pool {
  public:
   // The idle handle if it is one of this folder; an idle one of another folder stays.
@@ -17,25 +18,28 @@ class Pool {
     return idle_ && idle_->folder().native() == folder.native() ? std::move(idle_) : nullptr;
   }
 
-  // Keeps the handle; the one that was kept comes back.
+  // Keeps the handle; the one that was kept comes back, or this one at the end of the program.
   std::unique_ptr<Handle> keep(std::unique_ptr<Handle> handle) {
     const std::lock_guard guard(mutex_);
-    std::swap(idle_, handle);
+    if (!ended_) std::swap(idle_, handle);
     return handle;
+  }
+
+  // Nothing is kept from here on. The idle handle comes back.
+  std::unique_ptr<Handle> end() {
+    const std::lock_guard guard(mutex_);
+    ended_ = true;
+    return std::move(idle_);
   }
 
  private:
   std::mutex mutex_;
   std::unique_ptr<Handle> idle_;
+  bool ended_ = false;
 };
 
 std::filesystem::path placeOf(const std::filesystem::path& folder) {
   return folder.is_absolute() ? folder : std::filesystem::absolute(folder);
-}
-
-Pool& pool() {
-  static Pool thePool;
-  return thePool;
 }
 
 // Checked before the mutex is touched, which another thread may have held at the moment of the fork.
@@ -44,6 +48,23 @@ bool isFirstProcess() {
   pid_t none = 0;
   const pid_t self = ::getpid();
   return first.compare_exchange_strong(none, self) || none == self;
+}
+
+// Files that were closed need no recovery.
+struct ClosedAtExit {
+  explicit ClosedAtExit(Pool& closed) : pool(closed) {}
+  ~ClosedAtExit() {
+    if (isFirstProcess()) pool.end();
+  }
+  ClosedAtExit(const ClosedAtExit&) = delete;
+  ClosedAtExit& operator=(const ClosedAtExit&) = delete;
+  Pool& pool;
+};
+
+Pool& pool() {
+  static Pool& thePool = *new Pool();
+  static const ClosedAtExit closed(thePool);
+  return thePool;
 }
 
 }  // namespace

@@ -43,7 +43,8 @@ class EmbeddedProvider : public QVSa::Provider {
 }  // namespace
 
 QVSa::Provider& provider() {
-  static EmbeddedProvider theProvider;
+  // Never destroyed: a host may call with its last statics.
+  static auto& theProvider = *new EmbeddedProvider();
   return theProvider;
 }
 

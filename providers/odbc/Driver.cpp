@@ -82,8 +82,9 @@ Driver chooseDriver(const String& wanted, const std::vector<String>& registered,
 
 Driver systemDriver() {
   // Asked once: the driver manager's list is read by steps that two threads must not take at the same time.
-  static const std::vector<String> registered = registeredDrivers();
-  static const String library = freeTdsLibrary();
+  // Never destroyed: a host may call with its last statics.
+  static const auto& registered = *new std::vector<String>(registeredDrivers());
+  static const auto& library = *new String(freeTdsLibrary());
   const char* wanted = std::getenv("QVSA_ODBC_DRIVER");
   return chooseDriver(wanted ? wanted : "", registered, library);
 }

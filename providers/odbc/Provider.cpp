@@ -17,7 +17,8 @@ class OdbcProvider final : public Provider {
 }  // namespace
 
 Provider& provider() {
-  static OdbcProvider instance;
+  // Never destroyed: a host may call with its last statics.
+  static auto& instance = *new OdbcProvider();
   return instance;
 }
 

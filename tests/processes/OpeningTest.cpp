@@ -81,5 +81,11 @@ TEST_F(Opening, WithoutRightsToWriteNothingIsOpened) {
   expectIntact();
 }
 
+TEST_F(Opening, AHostMayCallWhileItsStaticsAreDestroyed) {
+  Worker worker("call-last", {server()});
+  worker.go();
+  EXPECT_EQ(worker.lines(), std::vector<std::string>{"done"});
+}
+
 }  // namespace
 }  // namespace QVSa::test

@@ -132,9 +132,35 @@ void write(const Words& words) {
   }
 }
 
+// A static of the host's.
+struct LastCaller {
+  std::string server;
+
+  ~LastCaller() {
+    if (server.empty()) return;
+    User ann;
+    ann.connect(server, "QVApp");
+    String session;
+    const bool signedOn = ann.loginAuth("ann", "right", &session);
+    Sessions sessions;
+    sessions.connect(server, "QVApp");
+    const bool done = signedOn && sessions.Terminate(session);
+    writeLine(done ? "done" : failureText(ann.errNumber(), ann.errDescription() + sessions.errDescription()));
+  }
+};
+
+void callLast(LastCaller& caller, const Words& words) {
+  caller.server = words.at(0);
+  User ann;
+  ann.connect(words.at(0), "QVApp");
+  if (!ann.loginAuth("ann", "right")) writeLine(failureText(ann.errNumber(), ann.errDescription()));
+}
+
 }  // namespace
 
 int doWork(const Words& words) {
+  // Made before the library was used, and so destroyed after whatever that made.
+  static LastCaller lastCaller;
   const FakeClock clock(Date(2024, 3, 7, 10, 0, 0));
   std::cin.get();
   const Words arguments(words.begin() + 1, words.end());
@@ -147,6 +173,7 @@ int doWork(const Words& words) {
   if (words.at(0) == "restore") restore(arguments);
   if (words.at(0) == "back-up") backUp(arguments);
   if (words.at(0) == "write") write(arguments);
+  if (words.at(0) == "call-last") callLast(lastCaller, arguments);
   return 0;
 }
 
