@@ -1,9 +1,9 @@
 #pragma once
 
 #include <cstddef>
-#include <variant>
 
 #include "QVSa/frame/Date.h"
+#include "QVSa/frame/OneOf.h"
 #include "QVSa/frame/Values.h"
 
 namespace QVSa {
@@ -60,7 +60,7 @@ class Variant {
   friend bool operator==(const Variant& a, const Variant& b) { return a.value_ == b.value_; }
 
  private:
-  std::variant<std::monostate, NullValue, bool, Integer, Long, double, Date, String, Bytes> value_;
+  OneOf<std::monostate, NullValue, bool, Integer, Long, double, Date, String, Bytes> value_;
 };
 
 }  // namespace QVSa

@@ -1,8 +1,8 @@
 #pragma once
 
 #include <string>
-#include <variant>
 
+#include "QVSa/frame/OneOf.h"
 #include "QVSa/frame/Values.h"
 
 namespace QVSa::embedded {
@@ -44,6 +44,6 @@ struct Type {
 };
 
 // A value as it lies in a file; std::monostate is NULL.
-using Value = std::variant<std::monostate, std::int64_t, double, std::string, Bytes>;
+using Value = OneOf<std::monostate, std::int64_t, double, std::string, Bytes>;
 
 }  // namespace QVSa::embedded
