@@ -2,6 +2,7 @@
 
 #include <cstdlib>
 #include <iostream>
+#include <new>
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/frame/Failure.h"
@@ -62,6 +63,8 @@ int Console::main(int argc, char** argv) {
     return refuse(refusal.what(), refusal.number());
   } catch (const Failure& failure) {
     return refuse(failure.description(), failure.number());
+  } catch (const std::bad_alloc&) {
+    return refuse("Out of memory", number::memory);
   } catch (const std::exception& error) {
     return refuse(error.what(), 0);
   }

@@ -1,8 +1,10 @@
 #include "platform/CodePage.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <cstdint>
 #include <iconv.h>
+#include <new>
 #include <strings.h>
 
 #include "QVSa/frame/Failure.h"
@@ -14,7 +16,9 @@ namespace {
 
 class Converter {
  public:
-  Converter(const String& to, const String& from) : handle_(iconv_open(to.c_str(), from.c_str())) {}
+  Converter(const String& to, const String& from) : handle_(iconv_open(to.c_str(), from.c_str())) {
+    if (!exists() && errno == ENOMEM) throw std::bad_alloc();
+  }
   Converter(const Converter&) = delete;
   Converter& operator=(const Converter&) = delete;
   ~Converter() {

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <ldap.h>
 #include <memory>
+#include <new>
 #include <span>
 #include <vector>
 
@@ -52,6 +53,7 @@ bool isNoAnswer(int code) {
 
 // `otherwise` for every failure that the server itself answered with.
 void require(int code, DirectoryStatus otherwise) {
+  if (code == LDAP_NO_MEMORY) throw std::bad_alloc();
   if (code != LDAP_SUCCESS) throw Ended{isNoAnswer(code) ? directoryUnreachable : otherwise};
 }
 

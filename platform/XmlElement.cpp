@@ -1,6 +1,7 @@
 #include "platform/XmlElement.h"
 
 #include <algorithm>
+#include <new>
 #include <pugixml.hpp>
 
 #include "QVSa/frame/Text.h"
@@ -24,10 +25,19 @@ struct XmlWriter : pugi::xml_writer {
 
   void write(const void* data, std::size_t size) override { output.append(static_cast<const char*>(data), size); }
 
+  // What the library could not make it says nothing of.
+  static void require(bool made) {
+    if (!made) throw std::bad_alloc();
+  }
+
   static void build(pugi::xml_node parent, const XmlElement& element) {
     pugi::xml_node node = parent.append_child(element.name_.c_str());
-    for (const auto& [name, value] : element.attributes_) node.append_attribute(name.c_str()) = allowed(value).c_str();
-    if (!element.content_.empty()) node.text() = allowed(element.content_).c_str();
+    require(node && element.name_ == node.name());
+    for (const auto& [name, value] : element.attributes_) {
+      pugi::xml_attribute attribute = node.append_attribute(name.c_str());
+      require(attribute && name == attribute.name() && attribute.set_value(allowed(value).c_str()));
+    }
+    if (!element.content_.empty()) require(node.text().set(allowed(element.content_).c_str()));
     for (const XmlElement& child : element.children_) build(node, child);
   }
 };

@@ -97,7 +97,7 @@ void Connection::disconnect() noexcept {
   if (inTransaction_) {
     try {
       session_->rollback();
-    } catch (const std::exception&) {
+    } catch (...) {
       // The session's own end discards what this could not.
     }
   }

@@ -53,4 +53,14 @@ Failure asFailure(const std::exception& error) {
   return Failure(number::internal, "QVSa", error.what());
 }
 
+Failure currentFailure() {
+  try {
+    throw;
+  } catch (const std::exception& error) {
+    return asFailure(error);
+  } catch (...) {
+    return runtimeFailure(number::internal);
+  }
+}
+
 }  // namespace QVSa

@@ -71,5 +71,7 @@ Failure runtimeFailure(Long runtimeNumber, Long native = 0);
 
 // Whatever was caught, as a failure: one of ours as it is, 7 for want of memory, 51 for any other.
 Failure asFailure(const std::exception& error);
+// The same of what is being handled, whatever its type: inside a catch block only.
+Failure currentFailure();
 
 }  // namespace QVSa

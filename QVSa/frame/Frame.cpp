@@ -22,29 +22,40 @@ String withoutSecrets(String description, const std::vector<String>& secrets) {
   return description;
 }
 
+String prefixOf(const Handler& handler) {
+  if (handler.prefix == 0) return {};
+  const String message = LoadResString(handler.prefix);
+  return (handler.fill == nullptr ? message : fillMsg(message, {*handler.fill})) + handler.between;
+}
+
 }  // namespace
+
+Handler Handler::filledWith(const String& value) && {
+  fill = &value;
+  return *this;
+}
 
 Handler Handler::number(Long value) && {
   fixedNumber = value;
-  return std::move(*this);
+  return *this;
 }
 
 Handler Handler::onIntegrity(Long messageId) && {
-  aloneOnIntegrity = LoadResString(messageId);
-  return std::move(*this);
+  aloneOnIntegrity = messageId;
+  return *this;
 }
 
 Handler plain() { return {}; }
 
-Handler prefixed(Long messageId, const std::vector<Variant>& fill) {
+Handler prefixed(Long messageId) {
   Handler handler;
-  handler.prefix = fillMsg(LoadResString(messageId), fill);
+  handler.prefix = messageId;
   return handler;
 }
 
-Handler prefixedBlank(Long messageId, const std::vector<Variant>& fill) {
-  Handler handler = prefixed(messageId, fill);
-  handler.prefix += " ";
+Handler prefixedBlank(Long messageId) {
+  Handler handler = prefixed(messageId);
+  handler.between = " ";
   return handler;
 }
 
@@ -92,9 +103,11 @@ Statement& Statement::raw(const String& name, const String& value) {
 Statement::operator String() const { return factory_.fill(text_); }
 
 Boolean Frame::connect(const String& server, const String& DBName) {
-  server_ = server;
-  DBName_ = DBName;
+  // What was connected before must not pass for this.
+  connectionString_.clear();
   return operation(plain(), [&] {
+    server_ = server;
+    DBName_ = DBName;
     connectionString_ = buildConnString(server, DBName, false);
     return true;
   });
@@ -124,11 +137,23 @@ void Frame::fail(const String& source, Long messageId, const std::vector<Variant
   throw Failure(messageNumber(messageId), source, fillMsg(LoadResString(messageId), fill));
 }
 
-void Frame::report(const Handler& handler, const Failure& failure) {
+void Frame::report(const Handler& handler) noexcept {
   if (handler.silent) return;
-  const bool alone = failure.number() == number::integrity && !handler.aloneOnIntegrity.empty();
-  note(handler.fixedNumber != 0 ? handler.fixedNumber : failure.number(),
-       alone ? handler.aloneOnIntegrity : handler.prefix + withoutSecrets(failure.description(), secrets_));
+  try {
+    report(handler, currentFailure());
+  } catch (...) {
+    // Only the memory for a text can have been short. This one finds its place in any string.
+    errNumber_ = number::memory;
+    errDescription_ = "Out of memory";
+  }
+}
+
+void Frame::report(const Handler& handler, const Failure& failure) {
+  const bool alone = failure.number() == number::integrity && handler.aloneOnIntegrity != 0;
+  const bool fixed = failure.number() != number::memory && handler.fixedNumber != 0;
+  note(fixed ? handler.fixedNumber : failure.number(),
+       alone ? LoadResString(handler.aloneOnIntegrity)
+             : prefixOf(handler) + withoutSecrets(failure.description(), secrets_));
 }
 
 }  // namespace QVSa

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <initializer_list>
+#include <new>
 #include <utility>
 
 #include "QVSa/frame/Connection.h"
@@ -10,23 +11,27 @@
 
 namespace QVSa {
 
-// How an operation reports the failure that ended it: a small value, made by plain(), prefixed() or prefixedBlank().
+// How an operation reports the failure that ended it, made by plain(), prefixed() or prefixedBlank(). It is made before
+// the operation begins, where nothing may fail: it names its texts and holds none.
 struct Handler {
-  String prefix;            // stands before the failure's text
-  Long fixedNumber = 0;     // reported in place of the failure's number, where not 0
-  String aloneOnIntegrity;  // reported alone where a key or a not-null column refused the write
-  bool silent = false;      // the error values stay untouched
+  Long prefix = 0;               // the message before the failure's text; 0: none
+  const String* fill = nullptr;  // what the prefix's place is filled with
+  const char* between = "";      // the prefix and the failure's text
+  Long fixedNumber = 0;          // reported in place of the failure's number, where not 0; want of memory stays 7
+  Long aloneOnIntegrity = 0;     // the message told alone where a key or a not-null column refused the write; 0: none
+  bool silent = false;           // the error values stay untouched
 
+  Handler filledWith(const String& value) &&;
   Handler number(Long value) &&;
   Handler onIntegrity(Long messageId) &&;
 };
 
 // The failure's number and text as they are.
 Handler plain();
-// The text of a message, its places filled, directly before the failure's text.
-Handler prefixed(Long messageId, const std::vector<Variant>& fill = {});
+// The text of a message directly before the failure's text.
+Handler prefixed(Long messageId);
 // The same with a blank between.
-Handler prefixedBlank(Long messageId, const std::vector<Variant>& fill = {});
+Handler prefixedBlank(Long messageId);
 // Nothing is reported; the result alone tells.
 Handler silent();
 
@@ -75,6 +80,12 @@ class Frame {
   void setDBName(const String& value) { DBName_ = value; }
   const String& connectionString() const { return connectionString_; }
   void setConnectionString(const String& value) { connectionString_ = value; }
+  // Connects another object to the same place. A False of it is its own affair, but for want of memory: an object that
+  // is not connected must not be handed out or used.
+  template <class Other>
+  void connectAlike(Other& other) const {
+    if (!other.connect(server_, DBName_) && other.errNumber() == number::memory) throw std::bad_alloc();
+  }
 
   // An open connection on the object's own string.
   Connection open() const;
@@ -133,11 +144,13 @@ class Frame {
     std::vector<String> callersSecrets = std::exchange(secrets_, {});
     try {
       body();
-    } catch (const std::exception& error) {
-      report(handler, asFailure(error));
+    } catch (...) {
+      report(handler);
     }
     secrets_ = std::move(callersSecrets);
   }
+  // Of what is being handled.
+  void report(const Handler& handler) noexcept;
   void report(const Handler& handler, const Failure& failure);
 
   String server_;

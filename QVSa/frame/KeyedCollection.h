@@ -22,10 +22,7 @@ class KeyedCollection {
   auto begin() const { return items_.begin(); }
   auto end() const { return items_.end(); }
 
-  void add(Pointer record) {
-    items_.push_back(std::move(record));
-    keys_.emplace_back();
-  }
+  void add(Pointer record) { append(std::move(record), std::nullopt); }
 
   // Throws Failure 457 where the key is taken; nothing is added then.
   void add(Pointer record, const String& key) {
@@ -34,9 +31,14 @@ class KeyedCollection {
   // False where the key is taken; nothing is added then.
   bool addIfNew(Pointer record, const String& key) {
     const String folded = lowerCase(key);
-    if (!index_.emplace(folded, record).second) return false;
-    items_.push_back(std::move(record));
-    keys_.push_back(folded);
+    const auto [entry, isNew] = index_.emplace(folded, record);
+    if (!isNew) return false;
+    try {
+      append(std::move(record), folded);
+    } catch (...) {
+      index_.erase(entry);
+      throw;
+    }
     return true;
   }
 
@@ -59,6 +61,16 @@ class KeyedCollection {
   }
 
  private:
+  // Both or none, also where the memory for one of them is short.
+  void append(Pointer record, std::optional<String> key) {
+    items_.push_back(std::move(record));
+    try {
+      keys_.push_back(std::move(key));
+    } catch (...) {
+      items_.pop_back();
+      throw;
+    }
+  }
   std::size_t positionOf(const Variant& index) const {
     if (!index.isNumeric()) throw runtimeFailure(number::type);
     const Long position = index.toLong();

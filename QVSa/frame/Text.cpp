@@ -1,8 +1,10 @@
 #include "QVSa/frame/Text.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <clocale>
 #include <locale.h>
+#include <new>
 #include <wctype.h>
 
 #include "QVSa/frame/Failure.h"
@@ -71,8 +73,12 @@ void append(String& text, char32_t c) {
 
 // The mappings of all scripts, whatever the process's own locale is.
 locale_t unicode() {
-  static const locale_t locale = newlocale(LC_CTYPE_MASK, "C.UTF-8", static_cast<locale_t>(nullptr));
-  if (locale == nullptr) throw runtimeFailure(number::internal);
+  static const locale_t locale = [] {
+    const locale_t made = newlocale(LC_CTYPE_MASK, "C.UTF-8", static_cast<locale_t>(nullptr));
+    if (made == nullptr && errno == ENOMEM) throw std::bad_alloc();
+    if (made == nullptr) throw runtimeFailure(number::internal);
+    return made;
+  }();
   return locale;
 }
 

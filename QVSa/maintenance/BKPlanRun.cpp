@@ -113,7 +113,7 @@ Boolean BKPlan::isOwnBackup(Connection& connection, const String& folder) {
 void BKPlan::log(Connection& connection, const String& opDesc) {
   constexpr Long administration = 3;
   IdMgr numbers;
-  numbers.connect(server(), DBName());
+  connectAlike(numbers);
   const String logId = numbers.newId("_log");
   if (logId.empty()) throw Failure(numbers.errNumber(), "BKPlan", numbers.errDescription());
   connection.Execute(sql("insert into SysLog("

@@ -7,7 +7,7 @@ std::shared_ptr<BKPlan> BKPlans::Add(Long Id, const String& Name, String* path) 
   plan->Id_ = Id;
   plan->Name(Name);
   if (path != nullptr) plan->bkPath(*path);
-  plan->connect(server(), DBName());
+  connectAlike(*plan);
   items_.add(plan, Name);
   return plan;
 }
@@ -22,7 +22,7 @@ Boolean BKPlans::GetAll() {
                   connection);
          !row.EOF_(); row.MoveNext()) {
       auto plan = std::make_shared<BKPlan>();
-      plan->connect(server(), DBName());
+      connectAlike(*plan);
       plan->read(row);
       plan->delFiles(row["delOld"].isOne());
       items_.add(plan, plan->Name());

@@ -28,33 +28,35 @@ Boolean DBMgr::BackUpDB(const String& ServerName, const String& sysFile, const S
   });
 }
 
+// What fails in the next two is passed over; but a backup that want of memory left unlocked must not be called done.
+
 // The server refuses this statement for its isnull of one argument, so that the lock reads as empty.
-Boolean DBMgr::readBackupLock(Connection& connection, BackupLock& lock) {
-  return operation(silent(), [&] {
-    if (connection.State() != 1) return false;
-    Recordset row;
-    row.Open("select isnull(roleSpec) from roles where roleId=4", connection);
-    if (row.EOF_()) return false;
-    const auto found = BackupLock::read(row[0].asText());
-    if (!found) return false;
-    lock = *found;
-    return true;
-  });
+Boolean DBMgr::readBackupLock(Connection& connection, BackupLock& lock) try {
+  if (connection.State() != 1) return false;
+  Recordset row;
+  row.Open("select isnull(roleSpec) from roles where roleId=4", connection);
+  if (row.EOF_()) return false;
+  const auto found = BackupLock::read(row[0].asText());
+  if (!found) return false;
+  lock = *found;
+  return true;
+} catch (const Failure&) {
+  return false;
 }
 
-Boolean DBMgr::writeBackupLock(Connection& connection, BackupLock lock) {
-  return operation(silent(), [&] {
-    if (connection.State() != 1) return false;
-    if (lock.list.empty()) {
-      std::vector<String> reports;
-      for (Recordset row = connection.Execute("select repId from reports"); !row.EOF_(); row.MoveNext())
-        reports.push_back(row[0].asText());
-      lock.list = join(reports, ".");
-    }
-    if (lock.list.empty()) return true;
-    connection.Execute(sql("update roles set roleSpec=<s> where roleId=4").text("s", lock.cipher()));
-    return true;
-  });
+Boolean DBMgr::writeBackupLock(Connection& connection, BackupLock lock) try {
+  if (connection.State() != 1) return false;
+  if (lock.list.empty()) {
+    std::vector<String> reports;
+    for (Recordset row = connection.Execute("select repId from reports"); !row.EOF_(); row.MoveNext())
+      reports.push_back(row[0].asText());
+    lock.list = join(reports, ".");
+  }
+  if (lock.list.empty()) return true;
+  connection.Execute(sql("update roles set roleSpec=<s> where roleId=4").text("s", lock.cipher()));
+  return true;
+} catch (const Failure&) {
+  return false;
 }
 
 Boolean DBMgr::decryptTmps(const String& server, const String& Pwd) {

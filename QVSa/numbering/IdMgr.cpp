@@ -91,10 +91,12 @@ void IdMgr::updateRule(Connection& connection) {
 }
 
 Boolean IdMgr::Rename(const String& strOld, const String& strNew) {
-  oldName_ = strOld;
-  if (!GetOne(strOld)) return false;
-  idName_ = strNew;
-  return Save();
+  return operation(plain(), [&] {
+    oldName_ = strOld;
+    if (!GetOne(strOld)) return false;
+    idName_ = strNew;
+    return Save();
+  });
 }
 
 String IdMgr::GetSample() const {

@@ -17,7 +17,7 @@ Boolean IdMgrs::GetAll() {
       rule->numPlace(row["noStyle"].asInteger());
       rule->reuseStyle(row["reuseStyle"].asInteger());
       rule->whenSave(row["nws"].asInteger() != 0);
-      rule->connect(server(), DBName());
+      connectAlike(*rule);
       items_.add(rule);
     }
     return true;

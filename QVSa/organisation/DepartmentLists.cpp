@@ -46,7 +46,7 @@ std::shared_ptr<Departments> Department::GetSub() {
 std::shared_ptr<Users> Department::GetUsers() {
   return operation(plain(), [&]() -> std::shared_ptr<Users> {
     auto users = std::make_shared<Users>();
-    users->connect(server(), DBName());
+    connectAlike(*users);
     // The list takes a department number, and is given the inner id.
     if (!users->GetAll(text(InnerId_), 0, false, -1, -1)) return refuseAs(*users);
     return users;

@@ -21,7 +21,7 @@ std::shared_ptr<Department> Departments::Add(const String& Id, const String& Nam
   department->isOrg(isOrg);
   department->InnerId_ = Variant(InnerId == nullptr ? "" : *InnerId).toLong();
   department->fullName(fullName == nullptr ? "" : *fullName);
-  department->connect(server(), DBName());
+  connectAlike(*department);
   add(department, Id);
   return department;
 }
@@ -76,7 +76,7 @@ void Departments::addRows(Connection& connection, const String& statement) {
     department->superInnerId_ = row["superDept"].asLong();
     department->Super(row["superNo"].asText());
     department->isOuter(row["isOuter"].isOne());
-    department->connect(server(), DBName());
+    connectAlike(*department);
     add(department, department->Id());
   }
 }

@@ -5,18 +5,18 @@
 namespace QVSa {
 
 std::shared_ptr<Users> Role::GetUsers(Boolean, Boolean noBuiltIn, const String& deptId) {
-  return operation(prefixedBlank(1206, {Name_}), [&]() -> std::shared_ptr<Users> {
+  return operation(prefixedBlank(1206).filledWith(Name_), [&]() -> std::shared_ptr<Users> {
     auto users = std::make_shared<Users>();
-    users->connect(server(), DBName());
+    connectAlike(*users);
     if (!users->GetAll(deptId, Id_, noBuiltIn, -1, -1)) return refuseAs(*users);
     return users;
   });
 }
 
 std::shared_ptr<Users> Role::GetUsersOfRole(const String& deptId, const String& roleName) {
-  return operation(prefixedBlank(1206, {Name_}), [&]() -> std::shared_ptr<Users> {
+  return operation(prefixedBlank(1206).filledWith(Name_), [&]() -> std::shared_ptr<Users> {
     auto users = std::make_shared<Users>();
-    users->connect(server(), DBName());
+    connectAlike(*users);
     const Integer dept = deptId.empty() ? Integer{0} : Variant(deptId).toInteger();
     if (!users->GetAllOfTheDeptAndRole(dept, roleName)) return refuseAs(*users);
     return users;

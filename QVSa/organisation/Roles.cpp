@@ -6,7 +6,7 @@ std::shared_ptr<Role> Roles::Add(Long Id, const String& Name) {
   auto role = std::make_shared<Role>();
   role->Id(Id);
   role->Name(Name);
-  role->connect(server(), DBName());
+  connectAlike(*role);
   add(role, Name);
   return role;
 }
@@ -21,7 +21,7 @@ Boolean Roles::GetAll() {
     for (; !row.EOF_(); row.MoveNext()) {
       auto role = std::make_shared<Role>();
       role->read(row);
-      role->connect(server(), DBName());
+      connectAlike(*role);
       add(role, role->Name());
     }
     return true;

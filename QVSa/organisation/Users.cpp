@@ -152,7 +152,7 @@ Recordset& Users::GetDataMember(const String&) { return listRecordset_; }
 
 std::shared_ptr<User> Users::connected() const {
   auto user = std::make_shared<User>();
-  user->connect(server(), DBName());
+  connectAlike(*user);
   return user;
 }
 

@@ -39,7 +39,7 @@ Boolean Users::GetAllReg(Integer regState, Long deptId) {
       auto user = readAccount(row);
       user->RegUserDesc(row["userDesc"].asText());
       user->grpName(groupsOf(connection, user->Id()));
-      user->connect(server(), DBName());
+      connectAlike(*user);
       add(user, user->Name());
     }
     return true;
@@ -88,7 +88,7 @@ Boolean Users::GetAll(const String& deptId, Long roleId, Boolean noBuiltIn, Long
       auto user = readAccount(row);
       user->dn(row["ldDn"].asText());
       user->grpName(groupsOf(connection, user->Id()));
-      user->connect(server(), DBName());
+      connectAlike(*user);
       add(user, user->Name());
     }
     return true;

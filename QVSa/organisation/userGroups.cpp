@@ -5,7 +5,7 @@ namespace QVSa {
 std::shared_ptr<userGroup> userGroups::Add(const String& Name) {
   auto group = std::make_shared<userGroup>();
   group->Name(Name);
-  group->connect(server(), DBName());
+  connectAlike(*group);
   add(group, Name);
   return group;
 }
@@ -17,7 +17,7 @@ Boolean userGroups::GetAll() {
     connection.Execute("set nocount on");
     for (Recordset row = connection.Execute("select gId,gName from ItemGroups"); !row.EOF_(); row.MoveNext()) {
       auto group = std::make_shared<userGroup>();
-      group->connect(server(), DBName());
+      connectAlike(*group);
       // A group that can't be read stands in the list all the same, without its values.
       group->GetOne(1, row["gId"].Value());
       add(group, row["gName"].asText());

@@ -132,18 +132,23 @@ Integer Home::count(const String& statement) {
 Integer Home::getUsersFromLDS(String& items) {
   items.clear();
   if (ldEnabled_ == 0) return platform::directoryDisabled;
-  const auto& getUsersFromLD = platform::services().getUsersFromLD;
-  const auto security = directorySecurity();
-  if (!getUsersFromLD || !security) return platform::directoryUnreachable;
-  platform::DirectoryQuery query;
-  query.host = ldHost_;
-  query.port = LDPort_;
-  query.bindDn = ldBindDN_;
-  query.searchText = ldBaseDN_;
-  query.security = *security;
-  Integer status = 0;
-  items = getUsersFromLD(query, ldPasswd_.text(), status);
-  return status;
+  return operation(plain(), Integer{platform::directoryFailed}, [&](Integer& result) {
+    const auto& getUsersFromLD = platform::services().getUsersFromLD;
+    const auto security = directorySecurity();
+    if (!getUsersFromLD || !security) {
+      result = platform::directoryUnreachable;
+      return;
+    }
+    platform::DirectoryQuery query;
+    query.host = ldHost_;
+    query.port = LDPort_;
+    query.bindDn = ldBindDN_;
+    query.searchText = ldBaseDN_;
+    query.security = *security;
+    Integer status = 0;
+    items = getUsersFromLD(query, ldPasswd_.text(), status);
+    result = status;
+  });
 }
 
 }  // namespace QVSa

@@ -35,7 +35,7 @@ Boolean LogRecords::Add(Long userId, Long LogType, const String& FuncName, const
                         const String* rcId, const String* wiId, const String* rtId) {
   return operation(prefixedBlank(1701), [&] {
     IdMgr numbers;
-    numbers.connect(server(), DBName());
+    connectAlike(numbers);
     const String logId = numbers.newId("_log", "", -1, "", "");
     if (logId.empty()) throw Failure(numbers.errNumber(), "LogRecords", numbers.errDescription());
 

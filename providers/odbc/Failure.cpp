@@ -29,6 +29,8 @@ bool speaksOfLink(const Diagnostic& diagnostic) {
   return startsWith(diagnostic.state, "08") || startsWith(diagnostic.state, "HYT");
 }
 
+bool isWantOfMemory(const Diagnostic& diagnostic) { return diagnostic.state == "HY001" || diagnostic.state == "HY013"; }
+
 // Beside the server's, a record may bear the number of a socket error, or one of FreeTDS's client, which counts from
 // 20000 on.
 bool isServers(const Diagnostic& diagnostic) {
@@ -99,6 +101,7 @@ Failure failure(const std::vector<Diagnostic>& diagnostics) {
   if (diagnostics.empty()) return Failure(number::general, "ODBC", "Unspecified error");
   const Diagnostic& error = deciding(diagnostics);
   const String text = withoutPrefixes(error.text);
+  if (isWantOfMemory(error)) return runtimeFailure(number::memory);
   if (!isServers(error)) return Failure(numberOfState(error.state), "ODBC", text);
   const Failure told = tsql::sqlFailure(error.native, text);
   // The server has a number for every reason to refuse a log-in, and one state for all.

@@ -125,11 +125,12 @@ TEST_F(FrameTest, HandlersReportInTheirForms) {
     EXPECT_FALSE(record.Delete(handler));
     return std::pair(record.errNumber(), record.errDescription());
   };
+  const String chief = "Chief";
   EXPECT_EQ(reported(plain()), std::pair(number::integrity, String("It broke.")));
   EXPECT_EQ(reported(prefixed(1601)),
             std::pair(number::integrity, String("Error in listing current connections.It broke.")));
   EXPECT_EQ(reported(prefixedBlank(1109)), std::pair(number::integrity, String("Error in removing user. It broke.")));
-  EXPECT_EQ(reported(prefixed(1206, {"Chief"})),
+  EXPECT_EQ(reported(prefixed(1206).filledWith(chief)),
             std::pair(number::integrity, String("Error in listing users who have the role [Chief].It broke.")));
   EXPECT_EQ(reported(prefixed(1802).number(-5).onIntegrity(1801)),
             std::pair(Long{-5}, String("Name of user group is duplicate.")));
@@ -163,6 +164,8 @@ TEST_F(FrameTest, OtherExceptionsStayInsideToo) {
   EXPECT_EQ(record.errNumber(), number::memory);
   EXPECT_FALSE(record.perform([]() -> Boolean { throw std::out_of_range("index"); }));
   EXPECT_EQ(record.errNumber(), number::internal);
+  EXPECT_FALSE(record.perform([]() -> Boolean { throw "a host's service"; }));
+  EXPECT_EQ(record.errDescription(), "Internal error");
 }
 
 TEST_F(FrameTest, AnErrorTextEndsBeforeAnyPieceOfASecret) {
