@@ -2,6 +2,8 @@
 
 #include <cerrno>
 #include <charconv>
+#include <memory>
+#include <new>
 #include <sys/stat.h>
 #include <system_error>
 #include <unistd.h>
@@ -19,6 +21,10 @@ using tsql::sqlFailure;
 
 constexpr int stepsBetweenLooks = 1000;
 constexpr const char* pageSize = "4096";
+
+struct Finalize {
+  void operator()(sqlite3_stmt* statement) const { sqlite3_finalize(statement); }
+};
 
 // 0 for a text that is no whole number.
 int wholeNumber(const std::string& text) {
@@ -53,7 +59,9 @@ void BackupFile::open() {
   // An empty file would pass for an empty database.
   if (!S_ISREG(state.st_mode) || state.st_size == 0) refuse();
   const int flags = SQLITE_OPEN_READONLY | SQLITE_OPEN_NOMUTEX | SQLITE_OPEN_PRIVATECACHE | SQLITE_OPEN_EXRESCODE;
-  if (sqlite3_open_v2(file.c_str(), &handle_, flags, nullptr) != SQLITE_OK) refuse();
+  const int code = sqlite3_open_v2(file.c_str(), &handle_, flags, nullptr);
+  requireMemory(code);
+  if (code != SQLITE_OK) refuse();
   sqlite3_db_config(handle_, SQLITE_DBCONFIG_TRUSTED_SCHEMA, 0, nullptr);
   sqlite3_progress_handler(handle_, stepsBetweenLooks, onProgress, this);
   registerFunctions(handle_, context_);
@@ -76,7 +84,9 @@ bool BackupFile::isOf(std::size_t database) {
 }
 
 void BackupFile::check() {
-  if (read("pragma integrity_check(1)") != "ok") refuse();
+  const auto isWhole = [this] { return read("pragma integrity_check(1)") == "ok"; };
+  // To the storage library a page that it has no memory for is damage, too. Such damage is not found twice.
+  if (!isWhole() && !isWhole()) refuse();
 }
 
 // The first column of the first row; empty without one, for NULL, and where the file cannot be read.
@@ -84,11 +94,13 @@ std::string BackupFile::read(const std::string& query) {
   sqlite3_stmt* statement = nullptr;
   int code = sqlite3_prepare_v2(handle_, query.c_str(), -1, &statement, nullptr);
   if (code == SQLITE_OK) code = sqlite3_step(statement);
-  const unsigned char* const text = code == SQLITE_ROW ? sqlite3_column_text(statement, 0) : nullptr;
-  const std::string result = text == nullptr ? "" : reinterpret_cast<const char*>(text);
-  sqlite3_finalize(statement);
+  const std::unique_ptr<sqlite3_stmt, Finalize> owned(statement);
+  requireMemory(code);
   if (code == SQLITE_INTERRUPT) throw timeExpired();
-  return result;
+  if (code != SQLITE_ROW || sqlite3_column_type(statement, 0) == SQLITE_NULL) return {};
+  const unsigned char* const text = sqlite3_column_text(statement, 0);
+  if (text == nullptr) throw std::bad_alloc();
+  return reinterpret_cast<const char*>(text);
 }
 
 void BackupFile::refuse() const {

@@ -27,6 +27,7 @@ Failure cannotOpen(const std::string& database, const std::string& reason) {
 
 // What a code of the library means while a file is being opened.
 std::string openingReason(sqlite3* handle, int code) {
+  requireMemory(code);
   const int system = sqlite3_system_errno(handle);
   switch (code & 0xFF) {
     case SQLITE_NOTADB:
@@ -136,8 +137,8 @@ void Handle::attach(std::size_t database) {
     sqlite3_stmt* statement = nullptr;
     int code = sqlite3_prepare_v2(handle_, ("attach ? as \"" + name + "\"").c_str(), -1, &statement, nullptr);
     if (code != SQLITE_OK) throwStorageFailure(handle_, code);
-    sqlite3_bind_text(statement, 1, file.c_str(), -1, SQLITE_STATIC);
-    code = sqlite3_step(statement);
+    code = sqlite3_bind_text(statement, 1, file.c_str(), -1, SQLITE_STATIC);
+    if (code == SQLITE_OK) code = sqlite3_step(statement);
     sqlite3_finalize(statement);
     if (code != SQLITE_DONE) throw cannotOpen(name, openingReason(handle_, code));
   }
@@ -229,9 +230,12 @@ std::string Handle::loginDigest(const std::string& user) {
 
 std::int64_t Handle::schemaVersion() {
   std::int64_t version = 0;
-  if (schemas_.empty())
+  if (schemas_.empty()) {
+    std::vector<Prepared> schemas;
     for (const char* database : databaseNames)
-      schemas_.emplace_back(handle_, std::string("pragma ") + database + ".schema_version");
+      schemas.emplace_back(handle_, std::string("pragma ") + database + ".schema_version");
+    schemas_ = std::move(schemas);
+  }
   for (Prepared& schema : schemas_) {
     schema.step();
     version += std::get<std::int64_t>(schema.column(0));

@@ -1,6 +1,7 @@
 #include "providers/embedded/ListTable.h"
 
 #include <algorithm>
+#include <new>
 #include <sqlite3.h>
 
 #include "providers/embedded/StorageFailure.h"
@@ -29,7 +30,11 @@ const ValueList* listOf(sqlite3_value* argument) {
 
 void isListed(sqlite3_context* context, int, sqlite3_value** arguments) {
   const ValueList* const list = listOf(arguments[1]);
-  sqlite3_result_int(context, list != nullptr && std::ranges::binary_search(*list, readValue(arguments[0])));
+  try {
+    sqlite3_result_int(context, list != nullptr && std::ranges::binary_search(*list, readValue(arguments[0])));
+  } catch (const std::bad_alloc&) {
+    sqlite3_result_error_nomem(context);
+  }
 }
 
 Cursor& of(sqlite3_vtab_cursor* cursor) { return *static_cast<Cursor*>(cursor); }

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <new>
 #include <set>
 
 #include "providers/embedded/Binder.h"
@@ -93,9 +94,12 @@ Prepared Compiled::take(Handle& handle) {
     return statement;
   }
   Prepared statement(handle.get(), text_);
-  if (parameters_.empty())
+  if (parameters_.empty()) {
+    std::vector<std::size_t> named;
     for (int i = 1; i <= sqlite3_bind_parameter_count(statement.get()); ++i)
-      if (sqlite3_bind_parameter_name(statement.get(), i)) parameters_.push_back(static_cast<std::size_t>(i - 1));
+      if (sqlite3_bind_parameter_name(statement.get(), i)) named.push_back(static_cast<std::size_t>(i - 1));
+    parameters_ = std::move(named);
+  }
   return statement;
 }
 
@@ -106,9 +110,13 @@ std::vector<std::size_t> Compiled::databases() const {
   return named;
 }
 
-void Compiled::giveBack(Prepared statement) {
+void Compiled::giveBack(Prepared statement) noexcept {
   statement.reset();
-  idle_.push_back(std::move(statement));
+  try {
+    idle_.push_back(std::move(statement));
+  } catch (const std::bad_alloc&) {
+    // The next run compiles it again.
+  }
 }
 
 Step compile(tsql::Statement statement, const Catalogue& catalogue, std::size_t database, bool updatable,
@@ -156,6 +164,7 @@ void PlanCache::add(const std::string& shape, const std::vector<tsql::Token>& to
   Shape& known = shapes_[shape];
   if (known.plans.empty()) {
     known.patterns = facts.patterns;
+    known.values.clear();
     forEachLiteral(tokens, [&](const tsql::Token& token) {
       if (std::ranges::find(facts.parameters, token.literal) == facts.parameters.end())
         known.values.push_back(token.literal);

@@ -18,7 +18,7 @@ class Compiled {
 
   // A statement for one run. Two runs at once have two of them.
   Prepared take(Handle& handle);
-  void giveBack(Prepared statement);
+  void giveBack(Prepared statement) noexcept;
   // The parameters that the text takes, by their place in the step's list.
   const std::vector<std::size_t>& parameters() const { return parameters_; }
   // The databases that the text names.

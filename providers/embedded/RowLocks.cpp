@@ -56,15 +56,17 @@ RowLocks::~RowLocks() { ::close(file_); }
 
 bool RowLocks::tryLock(const std::string& table, std::int64_t row) {
   const std::int64_t range = rangeOf(table);
-  const auto found = held_.find(range);
-  if (found != held_.end() && (found->second.whole || found->second.rows.contains(row))) return true;
-  if (found != held_.end() && found->second.rows.size() >= mostRows && take(range, rangeLength)) {
-    found->second.whole = true;
+  Held& held = held_[range];
+  if (held.whole || held.rows.contains(row)) return true;
+  if (held.rows.size() >= mostRows && take(range, rangeLength)) {
+    held.whole = true;
     return true;
   }
-  if (!take(byteOf(range, row), 1)) return false;
-  held_[range].rows.insert(row);
-  return true;
+  // Noted first: a lock that nobody knows of would never be let go.
+  const auto noted = held.rows.insert(row).first;
+  if (take(byteOf(range, row), 1)) return true;
+  held.rows.erase(noted);
+  return false;
 }
 
 bool RowLocks::othersHold(const std::string& table) const { return isTaken(rangeOf(table), rangeLength); }

@@ -93,7 +93,7 @@ EmbeddedSession::~EmbeddedSession() {
   try {
     endTransaction();
     if (handle_->inTransaction()) handle_->execute("rollback");
-  } catch (const Failure&) {
+  } catch (...) {
     // The pool does not keep a handle whose transaction could not be ended.
   }
 }
@@ -101,10 +101,11 @@ EmbeddedSession::~EmbeddedSession() {
 void EmbeddedSession::refreshCatalogue() {
   const std::uint64_t mark = handle_->mark().value();
   if (cache_->catalogue && cache_->mark == mark && CatalogueMark::isSettled(mark)) return;
+  if (!cache_->catalogue || cache_->catalogue->version() != handle_->catalogueVersion()) {
+    for (auto& plans : cache_->plans) plans.clear();
+    cache_->catalogue = std::make_shared<const Catalogue>(*handle_);
+  }
   cache_->mark = mark;
-  if (cache_->catalogue && cache_->catalogue->version() == handle_->catalogueVersion()) return;
-  for (auto& plans : cache_->plans) plans.clear();
-  cache_->catalogue = std::make_shared<const Catalogue>(*handle_);
 }
 
 BatchResult EmbeddedSession::run(const Batch& batch) {
@@ -263,9 +264,13 @@ void EmbeddedSession::prepareWrite(std::size_t database) {
 void EmbeddedSession::takeWriter(std::size_t database) {
   if (!started_) handle_->begin();
   started_ = true;
-  if (writing_.contains(database)) return;
-  handle_->takeWriter(database);
-  writing_.insert(database);
+  if (!writing_.insert(database).second) return;
+  try {
+    handle_->takeWriter(database);
+  } catch (...) {
+    writing_.erase(database);
+    throw;
+  }
 }
 
 Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) {
@@ -352,7 +357,7 @@ void EmbeddedSession::defineObject(const tsql::Statement& statement) {
     define(*handle_, *cache_->catalogue, database_, statement);
     refreshCatalogue();
     if (own) commit();
-  } catch (const Failure&) {
+  } catch (...) {
     if (own) rollback();
     refreshCatalogue();
     throw;
@@ -366,11 +371,12 @@ void EmbeddedSession::detach(EmbeddedRows& rows) {
 
 void EmbeddedSession::enter(std::size_t database) {
   if (entered_.contains(database)) return;
-  if (!handle_->locks(database).tryEnter())
-    throw tsql::sqlFailure(924, std::string("Database '") + databaseNames[database] +
-                                    "' is already open and can only "
-                                    "have one user at a time.");
+  RowLocks& locks = handle_->locks(database);
   entered_.insert(database);
+  if (locks.tryEnter()) return;
+  entered_.erase(database);
+  throw tsql::sqlFailure(924, std::string("Database '") + databaseNames[database] +
+                                  "' is already open and can only have one user at a time.");
 }
 
 // A database that is not the current one is in use while a statement runs there: up to the end of its row set, or of

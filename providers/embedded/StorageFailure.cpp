@@ -120,9 +120,13 @@ Failure failureOf(sqlite3* handle, int code, const std::string& message) {
 
 Failure timeExpired() { return Failure(number::timeout, "SQL Server", "Timeout expired"); }
 
+void requireMemory(int code) {
+  if ((code & 0xFF) == SQLITE_NOMEM || code == SQLITE_IOERR_NOMEM) throw std::bad_alloc();
+}
+
 void throwStorageFailure(sqlite3* handle, int code) {
   rethrowFailure(handle);
-  if (code == SQLITE_NOMEM) throw std::bad_alloc();
+  requireMemory(code);
   // Looking for an index below runs statements of its own on the handle.
   const std::string message = sqlite3_errmsg(handle);
   throw failureOf(handle, code, message);

@@ -6,6 +6,9 @@ struct sqlite3;
 
 namespace QVSa::embedded {
 
+// Throws std::bad_alloc where the result code of the storage library means want of memory.
+void requireMemory(int code);
+
 // Throws the failure for a result code of the storage library, with SQL Server's number where it has one: a function's
 // own failure first, then 2627 and 2601 (unique), 515 (not null), 1205 (the writer's place is taken while this handle
 // writes, or the rows read are old), the time-out, 1105 (no room), 3906 (read-only), 823 (input or output error), 824

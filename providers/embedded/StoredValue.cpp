@@ -1,16 +1,20 @@
 #include "providers/embedded/StoredValue.h"
 
+#include <new>
 #include <sqlite3.h>
 
 namespace QVSa::embedded {
 
 namespace {
 
+// The storage library gives no bytes where it had no memory to make them ready.
 std::string textFrom(const unsigned char* text, int size) {
+  if (text == nullptr) throw std::bad_alloc();
   return std::string(reinterpret_cast<const char*>(text), static_cast<std::size_t>(size));
 }
 
 Bytes bytesFrom(const void* bytes, int size) {
+  if (bytes == nullptr && size > 0) throw std::bad_alloc();
   const auto* const first = static_cast<const std::uint8_t*>(bytes);
   return Bytes(first, first + size);
 }
