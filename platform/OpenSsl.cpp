@@ -8,6 +8,8 @@
 #include <openssl/kdf.h>
 #include <openssl/provider.h>
 
+#include "QVSa/frame/Failure.h"
+
 namespace QVSa::platform {
 
 namespace {
@@ -18,12 +20,7 @@ using Digest = OpenSslPointer<EVP_MD, EVP_MD_free>;
 using Mac = OpenSslPointer<EVP_MAC, EVP_MAC_free>;
 using Kdf = OpenSslPointer<EVP_KDF, EVP_KDF_free>;
 
-// DES lives without it; the other old ciphers do not. Want of memory may read as want of the module.
-bool loadLegacy(OSSL_LIB_CTX* library) {
-  errno = 0;
-  if (OSSL_PROVIDER_load(library, "legacy") != nullptr) return true;
-  return errno != ENOMEM && ERR_GET_REASON(ERR_peek_last_error()) != ERR_R_MALLOC_FAILURE;
-}
+bool isRunning() { return OPENSSL_init_crypto(0, nullptr) == 1; }
 
 // The first fetch of each kind reads lists that go with OpenSSL's own end.
 bool fetchEachKind(OSSL_LIB_CTX* library) {
@@ -34,13 +31,22 @@ bool fetchEachKind(OSSL_LIB_CTX* library) {
 
 OSSL_LIB_CTX* makeLibrary() {
   const OpenSslErrorsKept kept;
-  if (OPENSSL_init_crypto(0, nullptr) != 1)
-    throw Failure(number::internal, "QVSa", "OpenSSL could not start, or has ended with the program.");
+  if (!isRunning()) throw Failure(number::internal, "QVSa", "OpenSSL could not start, or has ended with the program.");
   Context library(OSSL_LIB_CTX_new());
-  const bool made = library && OSSL_PROVIDER_load(library.get(), "default") != nullptr && loadLegacy(library.get()) &&
-                    fetchEachKind(library.get());
+  const bool made = library && OSSL_PROVIDER_load(library.get(), "default") != nullptr && fetchEachKind(library.get());
   if (!made) throw std::bad_alloc();
   return library.release();
+}
+
+// Want of memory may read as want of the module.
+bool loadLegacy(OSSL_LIB_CTX* library) {
+  const OpenSslErrorsKept kept;
+  if (!isRunning()) return false;
+  errno = 0;
+  if (OSSL_PROVIDER_load(library, "legacy") != nullptr && Cipher(EVP_CIPHER_fetch(library, "RC4", nullptr)))
+    return true;
+  if (errno == ENOMEM || memoryWasShort()) throw std::bad_alloc();
+  return false;
 }
 
 }  // namespace
@@ -48,6 +54,12 @@ OSSL_LIB_CTX* makeLibrary() {
 OSSL_LIB_CTX* openSslLibrary() {
   static OSSL_LIB_CTX* const library = makeLibrary();
   return library;
+}
+
+// Not before one of these ciphers is wanted: OpenSSL 3.0 does not survive want of memory while it loads this module.
+bool loadOldCiphers() {
+  static const bool loaded = loadLegacy(openSslLibrary());
+  return loaded;
 }
 
 OpenSslErrorsKept::OpenSslErrorsKept() {
@@ -73,11 +85,11 @@ OpenSslErrorsKept::~OpenSslErrorsKept() {
   }
 }
 
-Failure openSslFailure() {
-  Long reason = number::internal;
-  while (const unsigned long code = ERR_get_error())
-    if (ERR_GET_REASON(code) == ERR_R_MALLOC_FAILURE) reason = number::memory;
-  return runtimeFailure(reason);
+bool memoryWasShort() {
+  // An error that left no trace found no memory for it.
+  bool isShort = ERR_peek_error() == 0;
+  while (const unsigned long code = ERR_get_error()) isShort = isShort || ERR_GET_REASON(code) == ERR_R_MALLOC_FAILURE;
+  return isShort;
 }
 
 }  // namespace QVSa::platform

@@ -4,16 +4,18 @@
 #include <openssl/types.h>
 #include <vector>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/frame/Values.h"
 
 namespace QVSa::platform {
 
-// OpenSSL with its default and its legacy provider in a context of the library's own: a host's providers and settings
-// are neither used nor changed. Made at the first call and never let go: its ciphers, digests, MACs and KDFs work on
-// after OpenSSL's own end, for a caller who comes with the last statics of a program. Its random numbers do not. Throws
-// std::bad_alloc, and Failure 51 where OpenSSL ended before the first call, or never could start; the next call tries
-// again.
+// OpenSSL with its default provider in a context of the library's own: a host's providers and settings are neither used
+// nor changed. Made at the first call and never let go: its ciphers, digests, MACs and KDFs work on after OpenSSL's own
+// end, for a caller who comes with the last statics of a program. Its random numbers do not. Throws std::bad_alloc, and
+// Failure 51 where OpenSSL ended before the first call, or never could start; the next call tries again.
 OSSL_LIB_CTX* openSslLibrary();
+// Loads the legacy provider into that context, which RC2 and RC4 need. False where the system lacks it. Throws
+// std::bad_alloc.
+bool loadOldCiphers();
 
 // What OpenSSL made and `release` frees.
 template <auto release>
@@ -46,7 +48,7 @@ class OpenSslErrorsKept {
   std::vector<Error> hosts_;
 };
 
-// Why OpenSSL refused, by the errors in the thread's queue, which it empties: 7 for want of memory, else 51.
-Failure openSslFailure();
+// Whether OpenSSL has just refused for want of memory, by the errors in the thread's queue.
+bool memoryWasShort();
 
 }  // namespace QVSa::platform

@@ -7,8 +7,8 @@
 namespace QVSa::platform {
 
 // Writes and reads the message form in which secrets are stored: DER in Base64, lines of 64 characters each ended by CR
-// LF, the key derived from the password. All of these throw Failure where OpenSSL can't run: 7 for want of memory, else
-// 51.
+// LF, the key derived from the password. All of these throw std::bad_alloc for want of memory, and Failure 51 where
+// OpenSSL can't run.
 
 // The text in a new message, by DES, with a fresh iv and salt.
 String encryptText(const String& plain, const String& secret);

@@ -2,11 +2,12 @@
 
 #include <limits>
 #include <memory>
+#include <new>
 #include <openssl/evp.h>
-#include <openssl/provider.h>
-#include <openssl/rand.h>
 
+#include "QVSa/frame/Failure.h"
 #include "platform/OpenSsl.h"
+#include "platform/RandomBytes.h"
 
 namespace QVSa::platform {
 
@@ -66,7 +67,7 @@ CipherKey desKey(const SecretBytes& hash) {
 // The keys of RC2 and RC4. At 40 bits some writers fill the key up with zeros and some do not: two keys to try.
 std::vector<CipherKey> variableKeys(const char* cipher, const SecretBytes& hash, Long bits) {
   const bool known = bits == 40 || bits == 56 || bits == 128;
-  if (!known || OSSL_PROVIDER_available(openSslLibrary(), "legacy") != 1) return {};
+  if (!known || !loadOldCiphers()) return {};
   std::vector<CipherKey> keys{{cipher, firstBytes(hash, static_cast<std::size_t>(bits / 8)), bits}};
   if (bits == 40) {
     keys.push_back(keys.front());
@@ -97,8 +98,9 @@ std::vector<CipherKey> keysOf(const SealedText& sealed, const String& secret) {
   }
 }
 
+// The ciphers are there and are given what they take: what fails has no memory.
 void require(bool done) {
-  if (!done) throw openSslFailure();
+  if (!done) throw std::bad_alloc();
 }
 
 // Nothing for an iv of another length than the cipher's.
@@ -161,7 +163,7 @@ std::optional<String> openSealedText(const SealedText& sealed, const String& sec
 
 Bytes randomBytes(std::size_t count) {
   Bytes bytes(count);
-  require(RAND_bytes_ex(openSslLibrary(), bytes.data(), count, 0) == 1);
+  fillRandom(bytes);
   return bytes;
 }
 

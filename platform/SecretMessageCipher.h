@@ -6,7 +6,7 @@
 
 namespace QVSa::platform {
 
-// All of these throw Failure where OpenSSL can't run: 7 for want of memory, else 51.
+// All of these throw std::bad_alloc for want of memory, and Failure 51 where OpenSSL can't run.
 
 // The text enciphered by DES under a key made of the secret and the salt. The iv has 8 bytes.
 SealedText sealText(const String& plain, const String& secret, const Bytes& iv, const Bytes& salt);

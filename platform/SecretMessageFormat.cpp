@@ -2,6 +2,7 @@
 
 #include <limits>
 #include <memory>
+#include <new>
 #include <openssl/asn1t.h>
 #include <openssl/evp.h>
 #include <openssl/objects.h>
@@ -86,7 +87,7 @@ Bytes bytesOf(const ASN1_OCTET_STRING* text) {
 
 EnvelopePointer makeEnvelope(const SealedText& sealed) {
   EnvelopePointer envelope(reinterpret_cast<Envelope*>(ASN1_item_new(ASN1_ITEM_rptr(Envelope))));
-  if (!envelope) throw openSslFailure();
+  if (!envelope) throw std::bad_alloc();
   Typed& content = *envelope->content;
   Sealed& target = *content.sealed;
   envelope->type = OBJ_txt2obj(envelopeType, 1);
@@ -96,17 +97,17 @@ EnvelopePointer makeEnvelope(const SealedText& sealed) {
   const bool filled = envelope->type != nullptr && content.type != nullptr &&
                       ASN1_INTEGER_set(target.version, messageVersion) == 1 && setBytes(target.iv, sealed.iv) &&
                       setBytes(target.salt, sealed.salt) && setBytes(target.cipherText, sealed.cipherText);
-  if (!filled) throw openSslFailure();
+  if (!filled) throw std::bad_alloc();
   return envelope;
 }
 
 Bytes toDer(const Envelope& envelope) {
   const auto* value = reinterpret_cast<const ASN1_VALUE*>(&envelope);
   const int size = ASN1_item_i2d(value, nullptr, ASN1_ITEM_rptr(Envelope));
-  if (size <= 0) throw openSslFailure();
+  if (size <= 0) throw std::bad_alloc();
   Bytes der(static_cast<std::size_t>(size));
   unsigned char* end = der.data();
-  if (ASN1_item_i2d(value, &end, ASN1_ITEM_rptr(Envelope)) != size) throw openSslFailure();
+  if (ASN1_item_i2d(value, &end, ASN1_ITEM_rptr(Envelope)) != size) throw std::bad_alloc();
   return der;
 }
 
@@ -122,7 +123,7 @@ String toBase64Lines(const Bytes& der) {
 
 Bytes fromBase64(const String& message) {
   const std::unique_ptr<EVP_ENCODE_CTX, FreeDecoder> decoder(EVP_ENCODE_CTX_new());
-  if (!decoder) throw openSslFailure();
+  if (!decoder) throw std::bad_alloc();
   if (message.size() > std::numeric_limits<int>::max()) return {};
   EVP_DecodeInit(decoder.get());
   Bytes der(message.size() + 3);
@@ -146,8 +147,7 @@ std::optional<SealedText> readSealedText(const String& message) {
       ASN1_item_d2i(nullptr, &start, static_cast<long>(der.size()), ASN1_ITEM_rptr(Envelope))));
   if (!envelope) {
     // The decoder refuses a text of another form and a lack of memory in the same way.
-    const Failure failure = openSslFailure();
-    if (failure.number() == number::memory) throw failure;
+    if (memoryWasShort()) throw std::bad_alloc();
     return std::nullopt;
   }
   if (!isType(envelope->type, envelopeType) || !isType(envelope->content->type, contentType)) return std::nullopt;

@@ -26,7 +26,7 @@ struct SealedText {
   Bytes cipherText;
 };
 
-// Both throw Failure where OpenSSL can't run: 7 for want of memory, else 51.
+// Both throw std::bad_alloc for want of memory.
 
 // The message in Base64, its lines ended by CR LF.
 String writeSealedText(const SealedText& sealed);
