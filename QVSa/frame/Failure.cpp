@@ -47,19 +47,29 @@ Failure runtimeFailure(Long runtimeNumber, Long native) {
   return Failure(runtimeNumber, "QVSa", runtimeText(runtimeNumber), native);
 }
 
-Failure asFailure(const std::exception& error) {
-  if (const auto* const failure = dynamic_cast<const Failure*>(&error)) return *failure;
-  if (dynamic_cast<const std::bad_alloc*>(&error) != nullptr) return runtimeFailure(number::memory);
-  return Failure(number::internal, "QVSa", error.what());
-}
-
 Failure currentFailure() {
   try {
     throw;
+  } catch (const Failure& failure) {
+    return failure;
+  } catch (const std::bad_alloc&) {
+    return runtimeFailure(number::memory);
   } catch (const std::exception& error) {
-    return asFailure(error);
+    return Failure(number::internal, "QVSa", error.what());
   } catch (...) {
     return runtimeFailure(number::internal);
+  }
+}
+
+void tellCurrentFailure(Long& number, String& description) noexcept {
+  try {
+    const Failure failure = currentFailure();
+    description = failure.description();
+    number = failure.number();
+  } catch (...) {
+    number = number::memory;
+    // Short enough to find its place in any string.
+    description = "Out of memory";
   }
 }
 

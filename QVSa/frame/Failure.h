@@ -69,9 +69,9 @@ constexpr Long keyExists = 457;
 // A run-time failure with its usual text: 6 "Overflow", 9 "Subscript out of range", 13 "Type mismatch" and so on.
 Failure runtimeFailure(Long runtimeNumber, Long native = 0);
 
-// Whatever was caught, as a failure: one of ours as it is, 7 for want of memory, 51 for any other.
-Failure asFailure(const std::exception& error);
-// The same of what is being handled, whatever its type: inside a catch block only.
+// What is being handled in a catch block, as a failure: one of ours as it is, 7 for want of memory, 51 for any other.
 Failure currentFailure();
+// The number and text of that. Where there is no memory for the text, those of want of memory.
+void tellCurrentFailure(Long& number, String& description) noexcept;
 
 }  // namespace QVSa

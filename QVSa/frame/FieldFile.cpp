@@ -22,8 +22,10 @@ Boolean reported(String& errText, Body body) {
   try {
     body();
     return true;
-  } catch (const std::exception& error) {
-    errText = asFailure(error).description();
+  } catch (const std::bad_alloc&) {
+    throw;
+  } catch (...) {
+    errText = currentFailure().description();
     platform::services().eventLog(errText);
     return false;
   }

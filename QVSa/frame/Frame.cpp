@@ -133,6 +133,18 @@ Frame::Refusal Frame::refuse(Long messageId, const std::vector<Variant>& fill) {
   return {};
 }
 
+Frame::Refusal Frame::refuseButFailures() {
+  try {
+    throw;
+  } catch (const Failure& failure) {
+    if (failure.number() != number::memory) throw;
+    report(plain());
+  } catch (...) {
+    report(plain());
+  }
+  return {};
+}
+
 void Frame::fail(const String& source, Long messageId, const std::vector<Variant>& fill) {
   throw Failure(messageNumber(messageId), source, fillMsg(LoadResString(messageId), fill));
 }
@@ -142,9 +154,8 @@ void Frame::report(const Handler& handler) noexcept {
   try {
     report(handler, currentFailure());
   } catch (...) {
-    // Only the memory for a text can have been short. This one finds its place in any string.
-    errNumber_ = number::memory;
-    errDescription_ = "Out of memory";
+    // The memory for the text was short.
+    tellCurrentFailure(errNumber_, errDescription_);
   }
 }
 

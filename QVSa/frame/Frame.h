@@ -134,6 +134,10 @@ class Frame {
     return {};
   }
 
+  // The end of an operation without a handler, from its catch block: a failure passes on to the caller; want of memory,
+  // and what no part of the library has thrown, are reported as they are.
+  Refusal refuseButFailures();
+
   // A refusal that passes through the operation's handler, and so gets its prefix.
   [[noreturn]] static void fail(const String& source, Long messageId, const std::vector<Variant>& fill = {});
 

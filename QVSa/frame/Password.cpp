@@ -8,12 +8,27 @@ namespace QVSa {
 
 Password::Password(String&& text) : text_(text) { platform::clearSecret(text); }
 
-Password::~Password() { platform::clearSecret(text_); }
+Password::Password(Password&& other) noexcept {
+  text_.swap(other.text_);
+  other.clear();
+}
 
-Password& Password::operator=(const Password& other) {
-  if (this == &other) return *this;
+Password::~Password() { clear(); }
+
+Password& Password::operator=(Password other) noexcept {
+  text_.swap(other.text_);
+  return *this;
+}
+
+// The whole of the string's memory: a short text that was swapped out has left its bytes behind.
+void Password::clear() noexcept {
+  text_.resize(text_.capacity());
   platform::clearSecret(text_);
-  text_ = other.text_;
+}
+
+StoredPassword& StoredPassword::operator=(StoredPassword other) noexcept {
+  clear_ = std::move(other.clear_);
+  unread_ = std::move(other.unread_);
   return *this;
 }
 

@@ -13,11 +13,15 @@ class Password {
   explicit Password(String&& text);
   ~Password();
   Password(const Password& other) = default;
-  Password& operator=(const Password& other);
+  Password(Password&& other) noexcept;
+  // All or nothing: a password that could not be copied must not turn into the empty one.
+  Password& operator=(Password other) noexcept;
 
   const String& text() const { return text_; }
 
  private:
+  void clear() noexcept;
+
   String text_;
 };
 
@@ -27,7 +31,11 @@ class StoredPassword {
  public:
   StoredPassword() = default;
   explicit StoredPassword(const String& clear) : clear_(clear) {}
-  // `secret`: what the text was encrypted under. Throws Failure 7 or 51 where the cipher can't run.
+  StoredPassword(const StoredPassword& other) = default;
+  StoredPassword(StoredPassword&& other) noexcept = default;
+  StoredPassword& operator=(StoredPassword other) noexcept;
+  // `secret`: what the text was encrypted under. Throws std::bad_alloc, and Failure 51 where the cipher can't
+  // run.
   static StoredPassword read(const String& cipher, const String& secret);
 
   bool isReadable() const { return unread_.empty(); }

@@ -99,10 +99,8 @@ Boolean SQLFactory::makeSql(String& sql, const String& nullParas) {
     if (nullParas.empty()) return true;
     for (const String& name : split(nullParas, ',')) sql = replaceAll(sql, token(name), "null");
     return true;
-  } catch (const std::exception& error) {
-    const Failure failure = asFailure(error);
-    errNumber_ = failure.number();
-    errDescription_ = failure.description();
+  } catch (...) {
+    tellCurrentFailure(errNumber_, errDescription_);
     return false;
   }
 }

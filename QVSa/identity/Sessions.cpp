@@ -11,8 +11,8 @@ Boolean Sessions::connect(const String& server, const String& DBName) {
     setServer(server);
     setDBName(DBName);
     setConnectionString(buildConnString(server, "", false));
-    GetAll();
-    return true;
+    const Boolean listed = GetAll().toBoolean();
+    return listed || errNumber() != number::memory;
   });
 }
 

@@ -31,7 +31,7 @@ Boolean User::Save(Boolean passPwdCheck) {
 
 Boolean User::passesPolicy(const String& password, Integer& cycle) {
   safeRule rule;
-  rule.connect(server(), DBName());
+  connectAlike(rule);
   if (!rule.GetOne() || !rule.checkPwd(password)) return refuseAs(rule);
   cycle = rule.cycle();
   return true;

@@ -21,7 +21,7 @@ class SessionId {
   SessionId(const SessionId&) = delete;
   SessionId& operator=(const SessionId&) = delete;
 
-  void set(const String& value) { value_ = value; }
+  void set(String value) { value_ = std::move(value); }
 
  private:
   String* given_;
@@ -66,7 +66,7 @@ void User::countFailure(Connection& connection) {
 }
 
 Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, Boolean authLd, const String& ipAddr,
-                        const String& hostName, const Integer* userVerifyLevel) {
+                        const String& hostName, const Integer* userVerifyLevel) try {
   SessionId given(sI);
   const Integer level = userVerifyLevel == nullptr ? Integer{0} : *userVerifyLevel;
   Boolean wrongPwd = false;
@@ -76,7 +76,7 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
 
   Sessions sessions;
   if (!hostName.empty() && !synLogin_) {
-    sessions.connect(server(), "");
+    if (!sessions.connect(server(), "")) return refuseAs(sessions);
     for (const auto& session : sessions) {
       // The row has its texts without trailing blanks.
       const Boolean elsewhere = session->DBName() == DBName() && session->UserLogin() == trimRight(loginName) &&
@@ -86,9 +86,11 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
   }
 
   safeRule rule;
-  rule.connect(server(), DBName());
-  // Where the policy can't be read, nothing of it is tested.
-  if (rule.GetOne() && isLockedOut(rule)) return refuse(1118);
+  connectAlike(rule);
+  // Where the policy can't be read, nothing of it is tested; but want of memory opens no locked account.
+  const Boolean known = rule.GetOne();
+  if (!known && rule.errNumber() == number::memory) return refuseAs(rule);
+  if (known && isLockedOut(rule)) return refuse(1118);
   if (wrongPwd) {
     clearRecord();
     return refuse(uType_ == adUser ? 1123 : 1106);
@@ -96,11 +98,13 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
   // The host lets the user in as far as changing the password.
   if (isExpired(rule.maxDay())) return true;
 
-  sessions.connect(server(), "");
-  const String id = sessions.newSession(loginName, hostName, DBName(), split(ipAddr, '|').front());
+  if (!sessions.connect(server(), "")) return refuseAs(sessions);
+  String id = sessions.newSession(loginName, hostName, DBName(), split(ipAddr, '|').front());
   if (id.empty()) return refuseAs(sessions);
-  given.set(id);
+  given.set(std::move(id));
   return true;
+} catch (...) {
+  return refuseButFailures();
 }
 
 Boolean User::fromPermittedAddress(const String& ipAddr) const {
@@ -133,10 +137,12 @@ Boolean User::digestMatches(const String& digest) const {
   return Pwd_.isReadable() && upperCase(digest) == upperCase(platform::md5Hex(Pwd_.text()));
 }
 
-Boolean User::loginAuth_1(const String& loginName, const String& pwdMd5) {
+Boolean User::loginAuth_1(const String& loginName, const String& pwdMd5) try {
   if (!GetOne(3, loginName)) return false;
   if (!digestMatches(pwdMd5)) return refuse(1106);
   return true;
+} catch (...) {
+  return refuseButFailures();
 }
 
 Boolean User::chgPwd(const String& oldPwd, const String& newPwd) {

@@ -85,8 +85,8 @@ String safeRule::charSet() const {
   return String() + (caseMixed_ ? '1' : '0') + (numCharMixed_ ? '1' : '0') + (hasSpecialChar_ ? '1' : '0');
 }
 
-Boolean safeRule::checkPwd(const String& s) {
-  if (!loaded_) GetOne();
+Boolean safeRule::checkPwd(const String& s) try {
+  if (!loaded_ && !GetOne() && errNumber() == number::memory) return false;
   note(errNumber(), "");
 
   String problems;
@@ -96,6 +96,8 @@ Boolean safeRule::checkPwd(const String& s) {
   // One number for every rule of the policy, whatever the message.
   note(messageNumber(3000), problems);
   return false;
+} catch (...) {
+  return refuseButFailures();
 }
 
 String safeRule::missingCharacters(const String& s) const {
