@@ -141,7 +141,7 @@ struct LastCaller {
     User ann;
     ann.connect(server, "QVApp");
     String session;
-    const bool signedOn = ann.loginAuth("ann", "right", &session);
+    const bool signedOn = ann.loginAuth("ann", "right", &session) && ann.chgPwd("right", "new");
     Sessions sessions;
     sessions.connect(server, "QVApp");
     const bool done = signedOn && sessions.Terminate(session);

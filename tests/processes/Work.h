@@ -21,8 +21,9 @@ namespace QVSa::test {
 //                                   or the failure's number and text
 //   write SERVER                    adds 1 to both rows of the table pair in one transaction, signs Ann on, and so on
 //                                   without end; "writing" after the first time, and a line for each failure
-//   call-last SERVER                signs Ann on, and once more with a static of its own that is destroyed after all
-//                                   others; ends that session, too: "done", or the failure's number and text
+//   call-last SERVER                signs Ann on, and once more from a static that is destroyed after all others, which
+//                                   changes her password and ends that session: "done", or the failure's number and
+//                                   text
 // Gives the exit code.
 int doWork(const std::vector<std::string>& words);
 
