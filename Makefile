@@ -8,10 +8,10 @@ JOBS ?= $(shell nproc)
 export CTEST_PARALLEL_LEVEL ?= $(JOBS)
 say = @printf '\n== %s\n'
 
-.PHONY: help packages build demo test sanitize bench fuzz format lint clean
+.PHONY: help packages build demo test test-long sanitize bench fuzz format lint clean
 
 help:  ## List the targets
-	@grep -hE '^[a-z]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
+	@grep -hE '^[a-z-]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
 
 packages:
 	@tools/install-packages.sh
@@ -33,6 +33,11 @@ test: build  ## Build and run all tests, then the quick ones once more under the
 	@red=0; ctest --preset release || red=1; \
 	  $(MAKE) sanitize BUILD='--target quick_tests' TESTS='-LE slow' || red=1; \
 	  exit $$red
+
+test-long: build  ## Run every allocation of the operations out of memory, and not a sample of them (an hour on 2 cores)
+	$(say) 'Testing want of memory'
+	@seq 0 $$(( $(JOBS) - 1 )) | xargs -P $(JOBS) -I{} env QVSA_ALLOCATIONS=all GTEST_TOTAL_SHARDS=$(JOBS) \
+	  GTEST_SHARD_INDEX={} build/release/tests/memory/memory_tests --gtest_brief=1
 
 sanitize: packages  ## Run all tests under the address and undefined behaviour sanitizers (build/sanitize)
 	$(say) 'Building with the sanitizers (build/sanitize)'
