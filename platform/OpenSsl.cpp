@@ -1,6 +1,8 @@
 #include "platform/OpenSsl.h"
 
+#include <algorithm>
 #include <cerrno>
+#include <initializer_list>
 #include <new>
 #include <openssl/crypto.h>
 #include <openssl/err.h>
@@ -22,31 +24,45 @@ using Kdf = OpenSslPointer<EVP_KDF, EVP_KDF_free>;
 
 bool isRunning() { return OPENSSL_init_crypto(0, nullptr) == 1; }
 
-// The first fetch of each kind reads lists that go with OpenSSL's own end.
-bool fetchEachKind(OSSL_LIB_CTX* library) {
-  return Cipher(EVP_CIPHER_fetch(library, "DES-EDE3-CBC", nullptr)) &&
-         Digest(EVP_MD_fetch(library, "SHA2-256", nullptr)) && Mac(EVP_MAC_fetch(library, "HMAC", nullptr)) &&
-         Kdf(EVP_KDF_fetch(library, "PBKDF2", nullptr));
+// Null where it could not be made.
+Context contextWith(const char* provider) {
+  Context context(OSSL_LIB_CTX_new());
+  return context && OSSL_PROVIDER_load(context.get(), provider) != nullptr ? std::move(context) : nullptr;
+}
+
+// The first fetch of a kind makes all methods of that kind, by lists that go with OpenSSL's own end. One for which the
+// memory was short is missing from the context for good, without a word: a context is kept where it has them all.
+bool hasCiphers(OSSL_LIB_CTX* context, std::initializer_list<const char*> names) {
+  return std::ranges::all_of(
+      names, [&](const char* name) { return Cipher(EVP_CIPHER_fetch(context, name, nullptr)) != nullptr; });
+}
+
+bool hasDigests(OSSL_LIB_CTX* context, std::initializer_list<const char*> names) {
+  return std::ranges::all_of(names,
+                             [&](const char* name) { return Digest(EVP_MD_fetch(context, name, nullptr)) != nullptr; });
 }
 
 OSSL_LIB_CTX* makeLibrary() {
   const OpenSslErrorsKept kept;
   if (!isRunning()) throw Failure(number::internal, "QVSa", "OpenSSL could not start, or has ended with the program.");
-  Context library(OSSL_LIB_CTX_new());
-  const bool made = library && OSSL_PROVIDER_load(library.get(), "default") != nullptr && fetchEachKind(library.get());
-  if (!made) throw std::bad_alloc();
+  Context library = contextWith("default");
+  const bool complete =
+      library && hasCiphers(library.get(), {"DES-EDE3-CBC", "AES-128-CBC", "AES-192-CBC", "AES-256-CBC"}) &&
+      hasDigests(library.get(), {"SHA1", "SHA2-256", "MD5"}) && Mac(EVP_MAC_fetch(library.get(), "HMAC", nullptr)) &&
+      Kdf(EVP_KDF_fetch(library.get(), "PBKDF2", nullptr));
+  if (!complete) throw std::bad_alloc();
   return library.release();
 }
 
 // Want of memory may read as want of the module.
-bool loadLegacy(OSSL_LIB_CTX* library) {
+OSSL_LIB_CTX* makeOldCiphers() {
   const OpenSslErrorsKept kept;
-  if (!isRunning()) return false;
+  if (!isRunning()) return nullptr;
   errno = 0;
-  if (OSSL_PROVIDER_load(library, "legacy") != nullptr && Cipher(EVP_CIPHER_fetch(library, "RC4", nullptr)))
-    return true;
-  if (errno == ENOMEM || memoryWasShort()) throw std::bad_alloc();
-  return false;
+  Context context = contextWith("legacy");
+  if (context && hasCiphers(context.get(), {"RC2-CBC", "RC4"})) return context.release();
+  if (context || errno == ENOMEM || memoryWasShort()) throw std::bad_alloc();
+  return nullptr;
 }
 
 }  // namespace
@@ -57,9 +73,9 @@ OSSL_LIB_CTX* openSslLibrary() {
 }
 
 // Not before one of these ciphers is wanted: OpenSSL 3.0 does not survive want of memory while it loads this module.
-bool loadOldCiphers() {
-  static const bool loaded = loadLegacy(openSslLibrary());
-  return loaded;
+OSSL_LIB_CTX* openSslOldCiphers() {
+  static OSSL_LIB_CTX* const ciphers = makeOldCiphers();
+  return ciphers;
 }
 
 OpenSslErrorsKept::OpenSslErrorsKept() {

@@ -8,14 +8,15 @@
 
 namespace QVSa::platform {
 
-// OpenSSL with its default provider in a context of the library's own: a host's providers and settings are neither used
-// nor changed. Made at the first call and never let go: its ciphers, digests, MACs and KDFs work on after OpenSSL's own
-// end, for a caller who comes with the last statics of a program. Its random numbers do not. Throws std::bad_alloc, and
-// Failure 51 where OpenSSL ended before the first call, or never could start; the next call tries again.
+// OpenSSL in contexts of the library's own: a host's providers and settings are neither used nor changed. Made at the
+// first call and never let go: what they hold works on after OpenSSL's own end, for a caller who comes with the last
+// statics of a program. Random numbers would not. Both throw std::bad_alloc; the next call tries again.
+
+// The default provider: DES-EDE3-CBC, AES-128-CBC to AES-256-CBC, SHA1, SHA2-256, MD5, HMAC and PBKDF2. Throws Failure
+// 51 as well, where OpenSSL ended before the first call, or never could start.
 OSSL_LIB_CTX* openSslLibrary();
-// Loads the legacy provider into that context, which RC2 and RC4 need. False where the system lacks it. Throws
-// std::bad_alloc.
-bool loadOldCiphers();
+// The legacy provider: RC2-CBC and RC4. Null where the system lacks it, or OpenSSL ended before the first call.
+OSSL_LIB_CTX* openSslOldCiphers();
 
 // What OpenSSL made and `release` frees.
 template <auto release>

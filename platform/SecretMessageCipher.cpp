@@ -28,6 +28,7 @@ struct CipherKey {
   const char* cipher;
   SecretBytes key;
   int effectiveBits = 0;  // of RC2 only
+  OSSL_LIB_CTX* library = openSslLibrary();
 };
 
 SecretBytes secretHash(const String& secret, const Bytes& salt) {
@@ -67,8 +68,9 @@ CipherKey desKey(const SecretBytes& hash) {
 // The keys of RC2 and RC4. At 40 bits some writers fill the key up with zeros and some do not: two keys to try.
 std::vector<CipherKey> variableKeys(const char* cipher, const SecretBytes& hash, Long bits) {
   const bool known = bits == 40 || bits == 56 || bits == 128;
-  if (!known || !loadOldCiphers()) return {};
-  std::vector<CipherKey> keys{{cipher, firstBytes(hash, static_cast<std::size_t>(bits / 8)), bits}};
+  OSSL_LIB_CTX* const library = known ? openSslOldCiphers() : nullptr;
+  if (library == nullptr) return {};
+  std::vector<CipherKey> keys{{cipher, firstBytes(hash, static_cast<std::size_t>(bits / 8)), bits, library}};
   if (bits == 40) {
     keys.push_back(keys.front());
     keys.back().key.resize(fullKeySize);
@@ -105,7 +107,7 @@ void require(bool done) {
 
 // Nothing for an iv of another length than the cipher's.
 CipherContext startCipher(const CipherKey& key, const Bytes& iv, bool encrypt) {
-  const Cipher cipher(EVP_CIPHER_fetch(openSslLibrary(), key.cipher, nullptr));
+  const Cipher cipher(EVP_CIPHER_fetch(key.library, key.cipher, nullptr));
   CipherContext context(EVP_CIPHER_CTX_new());
   require(cipher && context);
   if (static_cast<std::size_t>(EVP_CIPHER_get_iv_length(cipher.get())) != iv.size()) return nullptr;

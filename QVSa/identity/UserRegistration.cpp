@@ -11,7 +11,7 @@ constexpr Integer normal = 0;
 constexpr Integer waitingForAudit = 2;
 constexpr Integer refusedAtAudit = 3;
 
-const String lineBreak = "\r\n";
+constexpr const char* lineBreak = "\r\n";
 
 }  // namespace
 
