@@ -34,7 +34,7 @@ test: build  ## Build and run all tests, then the quick ones once more under the
 	  $(MAKE) sanitize BUILD='--target quick_tests' TESTS='-LE slow' || red=1; \
 	  exit $$red
 
-test-long: build  ## Run every allocation of the operations out of memory, and not a sample of them (an hour on 2 cores)
+test-long: build  ## Run every allocation of the operations out of memory, and not a sample of them
 	$(say) 'Testing want of memory'
 	@seq 0 $$(( $(JOBS) - 1 )) | xargs -P $(JOBS) -I{} env QVSA_ALLOCATIONS=all GTEST_TOTAL_SHARDS=$(JOBS) \
 	  GTEST_SHARD_INDEX={} build/release/tests/memory/memory_tests --gtest_brief=1

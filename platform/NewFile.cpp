@@ -102,17 +102,12 @@ int lockByName(int file, const fs::path& name) {
   return isSameFile(mine, named) ? 0 : EBUSY;
 }
 
-void discard(const fs::path& name) {
-  ::unlink((name.string() + journalEnding).c_str());
-  ::unlink(name.c_str());
-}
-
 // 0 as well where there is none.
 int removeLeft(const fs::path& name) {
   const FileDescriptor file(::open(name.c_str(), O_RDWR | O_NOFOLLOW | O_CLOEXEC));
   if (!file.isOpen()) return errno == ENOENT ? 0 : errno;
   if (const int reason = lockByName(file.get(), name); reason != 0) return reason;
-  discard(name);
+  NewFile::NameBeside(name).discard();
   return 0;
 }
 
@@ -209,6 +204,13 @@ bool syncFolderOf(const fs::path& file) {
 
 }  // namespace
 
+NewFile::NameBeside::NameBeside(fs::path file) : name(std::move(file)), journal(name.string() + journalEnding) {}
+
+void NewFile::NameBeside::discard() const noexcept {
+  ::unlink(journal.c_str());
+  ::unlink(name.c_str());
+}
+
 fs::path behindLinks(const fs::path& path) { return placeOf(path).path; }
 
 void removeUnfinished(const String& target) { removeLeft(onlyNameBeside(localPath(target))); }
@@ -238,6 +240,7 @@ NewFile::NewFile(const String& path, Writers writers) {
 int NewFile::openBeside(Writers writers, const struct stat* old) {
   const bool isOnlyOne = writers == Writers::one;
   const fs::path name = isOnlyOne ? onlyNameBeside(target_) : anyNameBeside(target_);
+  NameBeside beside(name);
   if (isOnlyOne) {
     // One that another account writes, say: that is no reason to write past it.
     const int reason = removeLeft(name);
@@ -248,10 +251,10 @@ int NewFile::openBeside(Writers writers, const struct stat* old) {
   if (isOnlyOne)
     if (const int reason = lockByName(file.get(), name); reason != 0) return reason;
   if (old != nullptr && !giveOwnerAndMode(file.get(), *old)) {
-    discard(name);
+    beside.discard();
     return EPERM;
   }
-  name_ = name;
+  beside_ = std::move(beside);
   file_ = std::move(file);
   return 0;
 }
@@ -260,15 +263,14 @@ void NewFile::openInTemporaryFolder() {
   std::error_code error;
   const fs::path folder = fs::temp_directory_path(error);
   if (error) fail(error.value());
-  name_ = anyNameBeside(folder / "");
-  file_ = create(name_, forOwner);
-  if (file_.isOpen()) return;
-  name_.clear();
-  fail(errno);
+  NameBeside beside(anyNameBeside(folder / ""));
+  file_ = create(beside.name, forOwner);
+  if (!file_.isOpen()) fail(errno);
+  beside_ = std::move(beside);
 }
 
 NewFile::~NewFile() {
-  if (!name_.empty()) discard(name_);
+  if (beside_) beside_->discard();
 }
 
 void NewFile::write(std::string_view bytes) {
@@ -278,14 +280,14 @@ void NewFile::write(std::string_view bytes) {
 void NewFile::keep() {
   if (straight_.isOpen()) return copyToTarget();
   if (::fsync(file_.get()) != 0) fail(errno);
-  if (::rename(name_.c_str(), target_.c_str()) != 0) {
+  if (::rename(name().c_str(), target_.c_str()) != 0) {
     // A file that is a mount point by itself.
     if (errno != EBUSY) fail(errno);
     straight_ = openStraight({target_});
     return copyToTarget();
   }
   // From here on another writer's file may bear the name.
-  name_.clear();
+  beside_.reset();
   file_ = FileDescriptor();
   if (!syncFolderOf(target_)) fail(errno);
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <filesystem>
+#include <optional>
 #include <string_view>
 #include <sys/stat.h>
 
@@ -35,9 +36,19 @@ class NewFile {
   NewFile& operator=(const NewFile&) = delete;
 
   // Where the content is until it is kept.
-  const std::filesystem::path& name() const { return name_; }
+  const std::filesystem::path& name() const { return beside_->name; }
   void write(std::string_view bytes);
   void keep();
+
+  // The file that is written, and what the storage library keeps beside it: made with both names, since what must go
+  // has to go without memory.
+  struct NameBeside {
+    explicit NameBeside(std::filesystem::path file);
+    void discard() const noexcept;
+
+    std::filesystem::path name;
+    std::filesystem::path journal;
+  };
 
  private:
   int openBeside(Writers writers, const struct stat* old);
@@ -46,7 +57,7 @@ class NewFile {
   [[noreturn]] void fail(int systemError) const;
 
   std::filesystem::path target_;
-  std::filesystem::path name_;  // empty once it is kept
+  std::optional<NameBeside> beside_;  // nothing once it is kept
   FileDescriptor file_;
   FileDescriptor straight_;  // the target, where it can't be replaced
 };

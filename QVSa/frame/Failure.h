@@ -9,7 +9,8 @@ namespace QVSa {
 
 // The one kind of exception of the library: a failure number that callers test, the name of who raised it, a text for a
 // person, and the own number of the database server or the operating system (0 where there is none). No text holds a
-// password or a connection string.
+// password or a connection string. Only want of memory is std::bad_alloc, which needs no memory itself, until an
+// operation reports it as 7.
 class Failure : public std::runtime_error {
  public:
   Failure(Long number, const String& source, const String& description, Long native = 0)

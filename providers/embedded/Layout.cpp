@@ -1,6 +1,7 @@
 #include "providers/embedded/Layout.h"
 
 #include <algorithm>
+#include <new>
 #include <sqlite3.h>
 #include <string_view>
 
@@ -26,8 +27,10 @@ std::string lengthProblem(const std::filesystem::path& folder, std::size_t spare
   std::size_t longestName = 0;
   for (const char* database : databaseNames)
     longestName = std::max(longestName, databaseFile("/", database).native().size());
-  const std::size_t most =
-      static_cast<std::size_t>(sqlite3_vfs_find(nullptr)->mxPathname) - longestSuffix.size() - longestName - spare;
+  // Without memory the library does not start.
+  const sqlite3_vfs* system = sqlite3_vfs_find(nullptr);
+  if (system == nullptr) throw std::bad_alloc();
+  const std::size_t most = static_cast<std::size_t>(system->mxPathname) - longestSuffix.size() - longestName - spare;
   const std::size_t length = folder.native().size();
   if (length <= most) return {};
   return "the path of its folder has " + std::to_string(length) + " bytes, and " + std::to_string(most) +

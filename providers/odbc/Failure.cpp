@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <new>
 
 #include "providers/tsql/SqlFailure.h"
 
@@ -101,7 +102,7 @@ Failure failure(const std::vector<Diagnostic>& diagnostics) {
   if (diagnostics.empty()) return Failure(number::general, "ODBC", "Unspecified error");
   const Diagnostic& error = deciding(diagnostics);
   const String text = withoutPrefixes(error.text);
-  if (isWantOfMemory(error)) return runtimeFailure(number::memory);
+  if (isWantOfMemory(error)) throw std::bad_alloc();
   if (!isServers(error)) return Failure(numberOfState(error.state), "ODBC", text);
   const Failure told = tsql::sqlFailure(error.native, text);
   // The server has a number for every reason to refuse a log-in, and one state for all.

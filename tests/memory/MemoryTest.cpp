@@ -44,26 +44,16 @@ std::vector<Case> cases() {
   return result;
 }
 
-// What a child leaves to its parent, also where it dies.
+// What a child tells its parent, also where it dies.
 struct Told {
-  std::size_t tried = 0;
-  char complaint[1000] = {};
+  std::size_t tried;
+  char complaint[1000];
 };
 
-class SharedTold {
- public:
-  SharedTold() : memory_(::mmap(nullptr, sizeof(Told), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0)) {
-    if (memory_ == MAP_FAILED) throw std::bad_alloc();
-    new (memory_) Told();
-  }
-  ~SharedTold() { ::munmap(memory_, sizeof(Told)); }
-  SharedTold(const SharedTold&) = delete;
-  SharedTold& operator=(const SharedTold&) = delete;
-  Told* operator->() const { return static_cast<Told*>(memory_); }
-
- private:
-  void* memory_;
-};
+Told& told() {
+  static void* const shared = ::mmap(nullptr, sizeof(Told), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+  return *static_cast<Told*>(shared);
+}
 
 // Empty where a call that was short of memory kept its word.
 std::string complaintOf(const Call& call, long first, Shortage shortage) {
@@ -93,7 +83,10 @@ std::string complaintOf(const Call& undisturbed) {
 // Everything happens in children of a process that has used nothing of the library itself.
 class WantOfMemory : public testing::TestWithParam<Case> {
  protected:
-  WantOfMemory() { std::filesystem::copy(ground(), folder_.path()); }
+  WantOfMemory() {
+    std::filesystem::copy(ground(), folder_.path());
+    told() = {};
+  }
 
   // The numbers of the allocations that ask for memory from different places.
   std::vector<long> places() const {
@@ -116,27 +109,25 @@ class WantOfMemory : public testing::TestWithParam<Case> {
 
   // Tries one allocation in a cold process, all that are left in a warm one. False where there is a complaint.
   bool tryNext(const std::vector<long>& allocations) {
-    told_->complaint[0] = '\0';
+    told().complaint[0] = '\0';
     ChildProcess child([&] {
       warmUp();
       do {
-        std::string complaint = complaintOf(call(), allocations[told_->tried], GetParam().shortage);
+        std::string complaint = complaintOf(call(), allocations[told().tried], GetParam().shortage);
         if (complaint.empty()) complaint = complaintOf(call());
-        std::strncpy(told_->complaint, complaint.c_str(), sizeof told_->complaint - 1);
+        std::strncpy(told().complaint, complaint.c_str(), sizeof told().complaint - 1);
         if (!complaint.empty()) return 1;
-        ++told_->tried;
-      } while (GetParam().process == Process::warm && told_->tried < allocations.size());
+        ++told().tried;
+      } while (GetParam().process == Process::warm && told().tried < allocations.size());
       return 0;
     });
     const int code = child.exitCode();
     if (code == 0) return true;
-    ADD_FAILURE() << "allocation " << allocations[told_->tried] << ": "
-                  << (code == 1 ? told_->complaint : "the process died");
-    ++told_->tried;
+    ADD_FAILURE() << "allocation " << allocations[told().tried] << ": "
+                  << (code == 1 ? told().complaint : "the process died");
+    ++told().tried;
     return false;
   }
-
-  SharedTold told_;
 
  private:
   static const std::filesystem::path& ground() {
@@ -179,7 +170,7 @@ TEST_P(WantOfMemory, IsReportedAndLeavesNothingBehind) {
   ASSERT_FALSE(allocations.empty());
   RecordProperty("allocations", static_cast<int>(allocations.size()));
   std::size_t complaints = 0;
-  while (told_->tried < allocations.size() && complaints < mostComplaints)
+  while (told().tried < allocations.size() && complaints < mostComplaints)
     if (!tryNext(allocations)) ++complaints;
 }
 

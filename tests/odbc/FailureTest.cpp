@@ -25,7 +25,7 @@ TEST(OdbcFailure, TakesItsNumberFromTheStateWhereADriverSpeaks) {
   EXPECT_EQ(failure({{"08S01", 104, "Communication link failure"}}).native(), 0);
   EXPECT_EQ(failure({{"22001", 0, "String data, right truncation"}}).number(), number::range);
   EXPECT_EQ(failure({{"22018", 0, "Invalid character value"}}).number(), number::conversion);
-  EXPECT_EQ(failure({{"HY001", 0, "Memory allocation error"}}).number(), number::memory);
+  EXPECT_THROW(failure({{"HY001", 0, "Memory allocation error"}}), std::bad_alloc);
   EXPECT_EQ(failure({{"HY000", 0, "Connection is busy"}}).number(), number::general);
   EXPECT_EQ(failure({}).number(), number::general);
 }
