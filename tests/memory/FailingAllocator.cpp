@@ -104,5 +104,7 @@ void* allocateOrThrow(std::size_t size) {
 }  // namespace QVSa::test
 
 void* operator new(std::size_t size) { return QVSa::test::allocateOrThrow(size); }
+// AddressSanitizer has one of its own, which the delete below would not match.
+void* operator new(std::size_t size, const std::nothrow_t&) noexcept { return QVSa::test::allocate(size); }
 void operator delete(void* memory) noexcept { std::free(memory); }
 void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }

@@ -43,7 +43,8 @@ class HostileTexts : public test::Scene {
                                   &Home::emailContent, &Home::emailPContent, &Home::emailRContent, &Home::smtpServer,
                                   &Home::ldServerName, &Home::ldHost,        &Home::ldBaseDN,      &Home::ldBindDN,
                                   &Home::LoginNewsUrl, &Home::attLimit,      &Home::loginTitle};
-    for (std::size_t i = 0; i < std::size(setters); ++i) (home.*setters[i])(texts[i]);
+    auto text = texts.begin();
+    for (const Setter set : setters) (home.*set)(*text++);
   }
 
   template <class Class>
