@@ -8,7 +8,7 @@ JOBS ?= $(shell nproc)
 export CTEST_PARALLEL_LEVEL ?= $(JOBS)
 say = @printf '\n== %s\n'
 
-.PHONY: help packages build demo test test-long sanitize bench fuzz format lint clean
+.PHONY: help packages build demo test test-long mutate sanitize bench fuzz format lint clean
 
 help:  ## List the targets
 	@grep -hE '^[a-z-]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
@@ -38,6 +38,10 @@ test-long: build  ## Run every allocation of the operations out of memory, and n
 	$(say) 'Testing want of memory'
 	@seq 0 $$(( $(JOBS) - 1 )) | xargs -P $(JOBS) -I{} env QVSA_ALLOCATIONS=all GTEST_TOTAL_SHARDS=$(JOBS) \
 	  GTEST_SHARD_INDEX={} build/release/tests/memory/memory_tests --gtest_brief=1
+
+mutate: packages  ## Put small faults into a copy of the sources, and look whether the tests notice
+	$(say) 'Putting faults into the sources (build/mutate)'
+	@tools/mutate.py $(ONLY)
 
 sanitize: packages  ## Run all tests under the address and undefined behaviour sanitizers (build/sanitize)
 	$(say) 'Building with the sanitizers (build/sanitize)'
