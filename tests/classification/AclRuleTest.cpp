@@ -1,18 +1,13 @@
-#include <gtest/gtest.h>
-
 #include "QVSa/classification/AclRule.h"
-#include "tests/support/PlainSession.h"
-#include "tests/support/TestInstallation.h"
+#include "tests/support/Scene.h"
 
 namespace QVSa {
 namespace {
 
-class AccessRule : public testing::Test {
+class AccessRule : public test::Scene {
  protected:
-  AccessRule() { rule_.connect(installation_.server(), "QVApp"); }
+  AccessRule() { rule_.connect(server(), "QVApp"); }
 
-  test::TestInstallation installation_;
-  test::PlainSession db_{installation_.server()};
   AclRule rule_;
 };
 
@@ -32,10 +27,10 @@ TEST_F(AccessRule, IsInsertedOnceAndThenUpdatedWhateverItsId) {
   EXPECT_EQ(rule_.Id(), 1);
   const String columns =
       "select id,RWType,RWDeptSet,RWRoleSet,DesignType,DesignDeptSet,DesignRoleSet,excludeAdmin from AclRule";
-  EXPECT_EQ(db_.text(columns), "1|5|-2|3|4|6|7|-1");
+  EXPECT_EQ(tables_.text(columns), "1|5|-2|3|4|6|7|-1");
 
   AclRule other;
-  other.connect(installation_.server());
+  other.connect(server());
   EXPECT_FALSE(other.Save()) << "the rule is there, and was not loaded";
   EXPECT_EQ(other.errNumber(), number::integrity);
   EXPECT_EQ(other.Id(), 0);
@@ -45,7 +40,7 @@ TEST_F(AccessRule, IsInsertedOnceAndThenUpdatedWhateverItsId) {
   other.Id(9);
   other.RWRoleSet(8);
   EXPECT_TRUE(other.Save());
-  EXPECT_EQ(db_.text(columns), "1|5|-2|8|4|6|7|-1");
+  EXPECT_EQ(tables_.text(columns), "1|5|-2|8|4|6|7|-1");
 }
 
 }  // namespace

@@ -1,19 +1,16 @@
-#include <gtest/gtest.h>
-
 #include "QVSa/classification/Directory.h"
 #include "QVSa/resources/Messages.h"
 #include "tests/support/EnvironmentLocale.h"
-#include "tests/support/PlainSession.h"
-#include "tests/support/TestInstallation.h"
+#include "tests/support/Scene.h"
 
 namespace QVSa {
 namespace {
 
-class ReportClasses : public testing::Test {
+class ReportClasses : public test::Scene {
  protected:
   Directory node() const {
     Directory made;
-    made.connect(installation_.server(), "QVApp");
+    made.connect(server(), "QVApp");
     return made;
   }
   Directory loaded(const String& name) const {
@@ -29,7 +26,7 @@ class ReportClasses : public testing::Test {
   }
   // The three texts of a row.
   String row(const String& name) const {
-    return db_.text("select path,fullName,ordNo,ordPath from RptDirectory where class='" + name + "'");
+    return tables_.text("select path,fullName,ordNo,ordPath from RptDirectory where class='" + name + "'");
   }
   // Names in the order of the tree's listing.
   String listed(const String& superior = "") const {
@@ -43,8 +40,6 @@ class ReportClasses : public testing::Test {
   }
 
   test::EnvironmentLocale locale_{"C"};
-  test::TestInstallation installation_;
-  test::PlainSession db_{installation_.server()};
 };
 
 TEST_F(ReportClasses, TakeTheirPlaceBehindTheirSiblings) {
@@ -67,7 +62,7 @@ TEST_F(ReportClasses, TakeTheirPlaceBehindTheirSiblings) {
 }
 
 TEST_F(ReportClasses, HaveNoPlaceBelowOneWithoutAPlace) {
-  db_.run("insert into RptDirectory(class) values('Bare')");
+  tables_.run("insert into RptDirectory(class) values('Bare')");
   ASSERT_TRUE(add("X", "Bare"));
   EXPECT_EQ(row("X"), ".X.|X|-|-");
 }
@@ -107,11 +102,11 @@ TEST_F(ReportClasses, RenameTheirBranchByWholeNames) {
   ASSERT_TRUE(a.Save()) << a.errDescription();
   EXPECT_EQ(row("AA"), ".X.AA.|X,AA|1|001.001");
   EXPECT_EQ(row("B"), ".X.AA.B.|X,AA,B|1|001.001.001");
-  EXPECT_EQ(db_.text("select superClass from RptDirectory where class='AA'"), "A") << "the name above stays";
+  EXPECT_EQ(tables_.text("select superClass from RptDirectory where class='AA'"), "A") << "the name above stays";
   EXPECT_EQ(a.fullName(), "X");
 
   Directory b = loaded("B");
-  db_.run("delete from RptDirectory where class='B'");
+  tables_.run("delete from RptDirectory where class='B'");
   b.superClass("");
   EXPECT_FALSE(b.Save());
   EXPECT_EQ(b.errDescription(), "Classification [B] does not exist.");
@@ -163,7 +158,7 @@ TEST_F(ReportClasses, AreRefusedAThousandthPlace) {
   String values;
   for (int i = 1; i < 1000; ++i) values += (i > 1 ? ",('c" : "('c") + std::to_string(i) + "','')";
   add("A");
-  db_.run("insert into RptDirectory(class,superClass) values " + values);
+  tables_.run("insert into RptDirectory(class,superClass) values " + values);
   Directory late = node();
   late.Class("late");
   EXPECT_FALSE(late.Save());
@@ -180,7 +175,7 @@ TEST_F(ReportClasses, ThatAreDeletedLeaveTheirBranchCutOff) {
   Directory b = loaded("B");
   EXPECT_TRUE(b.Delete());
   EXPECT_EQ(row("C"), ".C.|.,C|1|001.001.001");
-  EXPECT_EQ(db_.text("select superClass from RptDirectory where class='C'"), "B");
+  EXPECT_EQ(tables_.text("select superClass from RptDirectory where class='C'"), "B");
   EXPECT_FALSE(b.Delete());
   EXPECT_EQ(b.errNumber(), static_cast<Long>(0x80040578));
   EXPECT_EQ(b.errDescription(), "Classification [B] does not exist.");
@@ -189,11 +184,11 @@ TEST_F(ReportClasses, ThatAreDeletedLeaveTheirBranchCutOff) {
 
 TEST_F(ReportClasses, AreListedFlatWithEveryAttributeInItsOrder) {
   EXPECT_EQ(node().GetAll(), "<ds/>");
-  db_.run(
+  tables_.run(
       "insert into RptDirectory(class,superClass,path,fullName,CreUId,CreUName,CreateTime,UpdUId,UpdUName,UpdTime,"
       "OtherCanUpd,ordNo,ordPath) values('B','A','.A.B.','A,B',1,'<Ann','20240307 14:05:09',2,'Bob','20240308',1,"
       "3,'001.003')");
-  db_.run("insert into RptDirectory(class) values('A')");
+  tables_.run("insert into RptDirectory(class) values('A')");
   const String a =
       R"(<d super="" path="" full="" creUserId="0" creUserName="" createTime="0" updUserId="0" updUserName="" )"
       R"(updTime="0" OtherCanDesign="0" ordno="0" ordpath="">A</d>)";
@@ -205,7 +200,7 @@ TEST_F(ReportClasses, AreListedFlatWithEveryAttributeInItsOrder) {
   EXPECT_EQ(node().GetAll("A"), "<ds>" + b + "</ds>");
 
   Directory lost = node();
-  db_.run("drop table QVSys..RptDirectory");
+  tables_.run("drop table QVSys..RptDirectory");
   EXPECT_EQ(lost.GetAll(), "");
   EXPECT_EQ(lost.errNumber(), number::noTable);
 }

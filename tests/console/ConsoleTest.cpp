@@ -46,14 +46,6 @@ TEST_F(Program, InitShowsThePasswordsThatItMadeUp) {
   EXPECT_NE(made.document["saPassword"], made.document["adminPassword"]);
 }
 
-TEST_F(Program, APolicyKeepsWhatIsNotNamed) {
-  ASSERT_EQ(run("policy set --mixed-case --other-characters").exitCode, 0);
-  ASSERT_EQ(run("policy set --no-other-characters --min-length 3").exitCode, 0);
-  const Json policy = run("policy show").document;
-  EXPECT_EQ(policy["mixedCase"], true);
-  EXPECT_EQ(policy["otherCharacters"], false);
-}
-
 TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   const Outcome wrong = run("sign-on Admin", "wrong\n");
   EXPECT_EQ(wrong.exitCode, 1);
@@ -274,12 +266,8 @@ TEST_F(Program, TheTreeIsDrawnWithEachBranchUnderItsSuperior) {
   ASSERT_EQ(tree.size(), 1U);
   EXPECT_EQ(tree[0]["below"][0]["number"], "a");
   EXPECT_EQ(tree[0]["below"][1]["below"][0]["name"], "C");
-  FILE* pipe = popen((String(QVSA_CONSOLE) + " --server '" + server() + "' dept tree --under _root").c_str(), "r");
-  char buffer[512] = {};
-  const std::size_t read = fread(buffer, 1, sizeof buffer - 1, pipe);
-  pclose(pipe);
   EXPECT_EQ(
-      String(buffer, read),
+      shown("dept tree --under _root"),
       "Company *  (_root)\n├── A  (a)\n└── B *  (b)\n    └── C  (c)\n\n4 departments; * marks an organisation.\n");
   EXPECT_EQ(run("dept list --by-level").document["departments"][3]["number"], "c");
   execute("update departments set superDept=" + value("select deptId from departments where deptNo='c'") +
@@ -293,6 +281,22 @@ TEST_F(Program, DoctorTellsWhatASignOnWouldPassOver) {
   EXPECT_EQ(outcome.exitCode, 1);
   EXPECT_EQ(outcome.document["points"][0]["state"], "BAD");
   EXPECT_EQ(outcome.document["points"][1]["state"], "good");
+}
+
+TEST_F(Program, ATableShowsItsColumnsAsWideAsTheirTexts) {
+  run("group add 王小明的组 --description first");
+  run("group add B --description second");
+  EXPECT_EQ(shown("group list"),
+            "Id  Name        Description\n"
+            "2   B           second\n"
+            "1   王小明的组  first\n");
+  EXPECT_EQ(shown("group show B"),
+            "Name         B\n"
+            "Id           2\n"
+            "Description  second\n"
+            "Roles\n"
+            "\n"
+            "Login  Name  Department\n");
 }
 
 }  // namespace

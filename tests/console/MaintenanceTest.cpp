@@ -73,6 +73,8 @@ TEST_F(MaintenanceCommands, KeepPlansAndTheirHistory) {
   EXPECT_EQ(run("plan add twin " + backups() + "//").exitCode, 1) << "two runs of one second would share a folder";
   EXPECT_EQ(run("plan add odd /elsewhere --every 32767 --cycle weeks").exitCode, 1) << "it has no next run";
   EXPECT_EQ(run("plan list").document["plans"].size(), 1U);
+  EXPECT_EQ(run("plan add bare /elsewhere --keep 0").document["kept"], "0 days") << "the last run alone";
+  EXPECT_EQ(run("plan add all /else --cycle days").document["kept"], "for ever");
   const Outcome ran = run("plan run nightly");
   ASSERT_EQ(ran.exitCode, 0) << ran.said << ran.document;
   const Json runs = run("plan history nightly").document["runs"];

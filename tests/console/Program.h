@@ -6,9 +6,8 @@
 #include <sstream>
 #include <sys/wait.h>
 
-#include "QVSa/frame/Connection.h"
-#include "QVSa/frame/ConnectionString.h"
 #include "console/Answer.h"
+#include "tests/support/PlainSession.h"
 #include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {
@@ -46,17 +45,20 @@ class Program : public testing::Test {
     return {WEXITSTATUS(status), Json::parse(output, nullptr, false), said.str()};
   }
 
-  void execute(const String& statement, const String& database = "QVSys") {
-    Connection connection;
-    connection.Open(buildConnString(server(), database, false));
-    connection.Execute(statement);
+  // What a terminal shows.
+  String shown(const String& arguments) {
+    FILE* pipe = popen((String(QVSA_CONSOLE) + " --server '" + server() + "' " + arguments).c_str(), "r");
+    char buffer[4096] = {};
+    const std::size_t count = fread(buffer, 1, sizeof buffer - 1, pipe);
+    pclose(pipe);
+    return String(buffer, count);
   }
 
+  void execute(const String& statement, const String& database = "QVSys") {
+    PlainSession(server(), database).run(statement);
+  }
   String value(const String& query, const String& database = "QVSys") {
-    Connection connection;
-    connection.Open(buildConnString(server(), database, false));
-    Recordset row = connection.Execute(query);
-    return row[0].asText();
+    return PlainSession(server(), database).rows(query).at(0);
   }
 
   TestFolder folder_;

@@ -60,12 +60,5 @@ TEST_F(Keys, AFlagOfThePolicyReadsMinusOneAsTrueAndAPlansFlagKeepsIt) {
   EXPECT_EQ(rows("select delOld from QVBkPlan"), (test::Lines{"-1"}));
 }
 
-TEST_F(Keys, ATextThatIsTooLongIsRefusedAndNotCut) {
-  const String longest(100, 'x');
-  run("insert into users(userName,userLogin) values('" + longest + "','ann')");
-  EXPECT_EQ(failureOf([&] { run("insert into users(userName,userLogin) values('" + longest + "x','bob')"); }),
-            number::range);
-}
-
 }  // namespace
 }  // namespace QVSa

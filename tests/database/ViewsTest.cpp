@@ -62,30 +62,6 @@ TEST_F(Views, TheWayUpFromAJobMarksItsOwnDepartmentAndEndsAtTheTop) {
   EXPECT_EQ(rows("select count(*) from QV_v_JobDeptPath where deptid=22"), (Lines{"0"}));
 }
 
-// As the chains above jobs are asked for: an unqualified jobid, and an order by a column of the list.
-TEST_F(Views, TheyJoinWithoutAnAmbiguousColumn) {
-  const String hub = job(2, 12);
-  EXPECT_EQ(
-      rows(" select distinct jd.pathDeptId , jd.pathDeptName , jd.superDeptId , jd.fullName , jd.path , jd.deptNo "
-           "     from QV_v_JobDeptPath jd , QV_v_DeptOrg_1 do "
-           "     where jobid in (N'" +
-               hub +
-               "') and jd.pathdeptid = do.deptid and do.orgno = N'N10'  and jd.x = 1 "
-               " order by path ",
-           "QVApp"),
-      (Lines{"10|Sales|1|full Sales|.1.10.|N10", "11|East|10|full East|.1.10.11.|N11"}));
-}
-
-TEST_F(Views, PeopleOfOneOrganisationAreFoundAcrossItsDepartments) {
-  for (const char* values : {"'a','a',10", "'b','b',12", "'c','c',13", "'d','d',20"})
-    run("insert into users(userName,userLogin,deptId) values(" + String(values) + ")");
-  const String ofUser = rows("select userId from users where userLogin='a'")[0];
-  EXPECT_EQ(rows("select u.userName from users u, QV_v_DeptOrg_1 d where u.deptId = d.deptId  and exists (select * from"
-                 " users thisU, QV_v_DeptOrg_1 thisD where thisU.userId=" +
-                 ofUser + " and thisU.deptId = thisD.deptId and d.orgId = thisD.orgId ) order by u.userName "),
-            (Lines{"a", "b"}));
-}
-
 TEST_F(Views, ARoleHeldTwiceOrThroughAGroupStandsOnce) {
   run("insert into userJob(userId,jobId) values(7," + job(2, 10) + ")");
   run("insert into userJob(userId,jobId) values(7," + job(2, 11) + ")");

@@ -16,11 +16,8 @@ constexpr const char* statement = "delete from jobs where deptNo=N'S''1'";
 class Record : private Frame {
  public:
   using Frame::connect;
-  using Frame::connectionString;
-  using Frame::DBName;
   using Frame::errDescription;
   using Frame::errNumber;
-  using Frame::server;
 
   bool Delete(const Handler& handler) {
     return operation(handler, [&] {
@@ -46,26 +43,6 @@ class Record : private Frame {
     return operation(plain(), body);
   }
 
-  Boolean refuseSoft() {
-    return operation(plain(), [&]() -> Boolean {
-      if (Delete(plain())) return true;
-      return refuse(1002);
-    });
-  }
-  String refuseText() {
-    return operation(plain(), [&]() -> String { return refuse(1201, {"Chief"}); });
-  }
-  std::shared_ptr<Record> refuseObject() {
-    return operation(plain(), [&]() -> std::shared_ptr<Record> { return refuse(1001); });
-  }
-  Boolean refuseHard() {
-    return operation(prefixedBlank(1109), [&]() -> Boolean { fail("User", 1101); });
-  }
-  Boolean passOn(const Record& other) {
-    return operation(plain(), [&]() -> Boolean { return refuseAs(other); });
-  }
-  void noteName(const String& name) { note(1400, {name}); }
-
   Boolean store(const String& secret) {
     return operation(plain(), [&] {
       Connection connection = open();
@@ -73,10 +50,6 @@ class Record : private Frame {
       connection.Execute(statement);
       return true;
     });
-  }
-
-  String filled() {
-    return sql("<n> <t> <d> <l> <x>").number("n", "").text("t", "a ").date("d", Date::empty()).list("l", "a,b");
   }
 };
 
@@ -91,16 +64,6 @@ class FrameTest : public testing::Test {
   Record record;
 };
 
-TEST_F(FrameTest, ConnectKeepsWhatItIsToldAndOpensNothing) {
-  Record fresh;
-  EXPECT_EQ(fresh.errNumber(), 0);
-  EXPECT_TRUE(fresh.connect("db1|AB"));
-  EXPECT_EQ(fresh.server(), "db1|AB");
-  EXPECT_EQ(fresh.DBName(), "");
-  EXPECT_EQ(fresh.connectionString(), buildConnString("db1|AB", "QVSys", false));
-  EXPECT_TRUE(server.log.empty());
-}
-
 TEST_F(FrameTest, BeforeConnectAnOperationFailsInTheDatabaseLayer) {
   Record fresh;
   EXPECT_FALSE(fresh.Delete(plain()));
@@ -114,31 +77,10 @@ TEST_F(FrameTest, AnOperationLeavesNothingOpenAndASuccessClearsNoFailure) {
   EXPECT_FALSE(record.Delete(plain()));
   EXPECT_EQ(server.log, (std::vector<String>{"open", "begin", statement, "rollback", "close"}));
   EXPECT_EQ(record.errNumber(), number::timeout);
+  EXPECT_FALSE(record.Delete(silent()));
   EXPECT_TRUE(record.perform([] { return true; }));
   EXPECT_EQ(record.errNumber(), number::timeout);
   EXPECT_EQ(record.errDescription(), "It broke.");
-}
-
-TEST_F(FrameTest, HandlersReportInTheirForms) {
-  failing(number::integrity);
-  const auto reported = [&](const Handler& handler) {
-    EXPECT_FALSE(record.Delete(handler));
-    return std::pair(record.errNumber(), record.errDescription());
-  };
-  const String chief = "Chief";
-  EXPECT_EQ(reported(plain()), std::pair(number::integrity, String("It broke.")));
-  EXPECT_EQ(reported(prefixed(1601)),
-            std::pair(number::integrity, String("Error in listing current connections.It broke.")));
-  EXPECT_EQ(reported(prefixedBlank(1109)), std::pair(number::integrity, String("Error in removing user. It broke.")));
-  EXPECT_EQ(reported(prefixed(1206).filledWith(chief)),
-            std::pair(number::integrity, String("Error in listing users who have the role [Chief].It broke.")));
-  EXPECT_EQ(reported(prefixed(1802).number(-5).onIntegrity(1801)),
-            std::pair(Long{-5}, String("Name of user group is duplicate.")));
-  failing(number::timeout);
-  EXPECT_EQ(reported(prefixed(1802).onIntegrity(1801)),
-            std::pair(number::timeout, String("Error in adding the new user group.It broke.")));
-  failing(number::range);
-  EXPECT_EQ(reported(silent()).first, number::timeout);
 }
 
 TEST_F(FrameTest, AResultOfItsOwnIsTheLastOneStored) {
@@ -183,30 +125,6 @@ TEST_F(FrameTest, AnErrorTextEndsBeforeAnyPieceOfASecret) {
   EXPECT_EQ(record.errDescription(), "Truncated value: '***");
   EXPECT_FALSE(record.store("other"));
   EXPECT_NE(record.errDescription(), "Truncated value: '***");
-}
-
-TEST_F(FrameTest, RefusalsReportTheirMessage) {
-  failing(number::timeout);
-  EXPECT_FALSE(record.refuseSoft());
-  EXPECT_EQ(record.errNumber(), messageNumber(1002));
-  EXPECT_EQ(record.refuseText(), "");
-  EXPECT_EQ(record.errDescription(), "Undefined role [Chief].");
-  EXPECT_EQ(record.refuseObject(), nullptr);
-  EXPECT_EQ(record.errDescription(), "Department does not exist.");
-  EXPECT_FALSE(record.refuseHard());
-  EXPECT_EQ(record.errNumber(), static_cast<Long>(0x8004044D));
-  EXPECT_EQ(record.errDescription(), "Error in removing user. User does not exist.");
-  Record other;
-  EXPECT_FALSE(other.passOn(record));
-  EXPECT_EQ(other.errDescription(), record.errDescription());
-  record.noteName("Sales");
-  EXPECT_EQ(record.errNumber(), messageNumber(1400));
-  EXPECT_EQ(record.errDescription(), "Classification [Sales] does not exist.");
-}
-
-TEST_F(FrameTest, StatementsAreFilledWithTheUsualFlags) {
-  EXPECT_EQ(record.filled(), "0 N'a' '' N'a',N'b' <x>");
-  EXPECT_EQ(record.filled(), "0 N'a' '' N'a',N'b' <x>");
 }
 
 }  // namespace QVSa

@@ -13,12 +13,6 @@ using Names = KeyedCollection<String>;
 
 std::shared_ptr<String> name(const char* text) { return std::make_shared<String>(text); }
 
-String all(const Names& names) {
-  std::vector<String> texts;
-  for (const auto& entry : names) texts.push_back(*entry);
-  return join(texts, " ");
-}
-
 Names three() {
   Names names;
   names.add(name("one"), "a");
@@ -29,15 +23,6 @@ Names three() {
 
 }  // namespace
 
-TEST(KeyedCollection, FindsByPositionAndByKeyWithoutRegardToCase) {
-  const Names names = three();
-  EXPECT_EQ(all(names), "one two three");
-  EXPECT_EQ(*names.at(1), "one");
-  EXPECT_EQ(*names.at(3.0), "three");
-  EXPECT_EQ(*names.at("A"), "one");
-  EXPECT_EQ(*names.at("5"), "three");
-}
-
 TEST(KeyedCollection, EachWrongIndexFailsInItsOwnWay) {
   Names names = three();
   EXPECT_EQ(failureOf([&] { names.at(0); }), number::position);
@@ -46,19 +31,7 @@ TEST(KeyedCollection, EachWrongIndexFailsInItsOwnWay) {
   EXPECT_EQ(failureOf([&] { names.remove(""); }), number::argument);
   EXPECT_EQ(failureOf([&] { names.at(Variant::null()); }), number::type);
   EXPECT_EQ(names.size(), 3U);
-}
-
-TEST(KeyedCollection, ATakenKeyAddsNothing) {
-  Names names = three();
-  EXPECT_EQ(failureOf([&] { names.add(name("other"), "A"); }), number::keyExists);
-  EXPECT_EQ(all(names), "one two three");
-}
-
-TEST(KeyedCollection, ARemovedKeyIsFreeAgain) {
-  Names names = three();
   names.remove("a");
-  names.remove(1);
-  EXPECT_EQ(all(names), "three");
   names.add(name("new"), "A");
   EXPECT_EQ(*names.at("a"), "new");
   EXPECT_EQ(*names.at("5"), "three");

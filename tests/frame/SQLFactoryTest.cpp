@@ -28,28 +28,22 @@ TEST(SQLFactory, FillsEveryOccurrenceOfATokenAndLeavesUnknownOnes) {
   EXPECT_EQ(sql, "1 N'3' <A> 3 1 null null <z>");
 }
 
-TEST(SQLFactory, TakesItsOwnTextWhereNoneIsGiven) {
-  SQLFactory factory;
-  factory.SQL("select <a>");
-  factory.AddPara("a", paraNumber, 5, false, true);
-  String sql;
-  EXPECT_TRUE(factory.makeSql(sql, ""));
-  EXPECT_EQ(sql, "select 5");
-  factory.Clear();
-  sql.clear();
-  EXPECT_TRUE(factory.makeSql(sql, ""));
-  EXPECT_EQ(sql, "select <a>");
-}
-
-TEST(SQLFactory, WithoutAnyTextItFailsUntilCleared) {
+TEST(SQLFactory, TakesItsOwnTextWhereNoneIsGivenOrFailsUntilCleared) {
   SQLFactory factory;
   String sql;
   EXPECT_FALSE(factory.makeSql(sql, ""));
   EXPECT_EQ(factory.errNumber(), -1);
   EXPECT_EQ(factory.errDescription(), "have not sql of need replace.");
+  factory.SQL("select <a>");
+  factory.AddPara("a", paraNumber, 5, false, true);
+  EXPECT_TRUE(factory.makeSql(sql, ""));
+  EXPECT_EQ(sql, "select 5");
   factory.Clear();
   EXPECT_EQ(factory.errNumber(), 0);
   EXPECT_EQ(factory.errDescription(), "");
+  sql.clear();
+  EXPECT_TRUE(factory.makeSql(sql, ""));
+  EXPECT_EQ(sql, "select <a>");
 }
 
 TEST(SQLFactory, AFailureKeepsWhatTheTextHadBecome) {

@@ -5,29 +5,15 @@
 namespace QVSa {
 namespace {
 
-TEST(IpRules, AFullAddressMatchesItselfAndBlanksDoNotCount) {
-  EXPECT_TRUE(ipMatchesOne("10.0.0.5", " 10.0. 0.5 "));
-  EXPECT_FALSE(ipMatchesOne("10.0.0.5", "10.0.0.50"));
-  EXPECT_TRUE(ipMatchesOne("fe80::1", "fe80::1"));
+TEST(IpRules, MatchOneAddressAStarForItsLastPartOrARangeThere) {
+  const std::pair<const char*, const char*> matches[] = {{"10.0.0.5", " 10.0. 0.5 "}, {"fe80::1", "fe80::1"},
+                                                         {"10.0.0.5", "10.0.0.*"},    {"10.0.0.1", "10.0.0.1-9"},
+                                                         {"10.0.0.9", "10.0.0.1-9"},  {"10.0.0.10", "10.0.0.9-11"}};
+  for (const auto& [address, rule] : matches) EXPECT_TRUE(ipMatchesOne(address, rule)) << address << " " << rule;
+  for (const char* rule : {"10.0.0.50", "*", "10.0.1.*", "10.0.*.5", "10.0.0.5*", "10.0.0.6-9", "10.0.0.1-4",
+                           "10.0.1.1-9", "10.0.0.-", "10.0.0.1-", "10.0.0.-9", "10.0.0.1-9-12", "10.0.0.a-z"})
+    EXPECT_FALSE(ipMatchesOne("10.0.0.5", rule)) << rule;
   EXPECT_FALSE(ipMatchesOne("fe80::1", "10.0.0.*"));
-  EXPECT_FALSE(ipMatchesOne("10.0.0.5", "*"));
-}
-
-TEST(IpRules, AStarStandsForTheLastPartOnly) {
-  EXPECT_TRUE(ipMatchesOne("10.0.0.5", "10.0.0.*"));
-  EXPECT_FALSE(ipMatchesOne("10.0.0.5", "10.0.1.*"));
-  EXPECT_FALSE(ipMatchesOne("10.0.0.5", "10.0.*.5"));
-  EXPECT_FALSE(ipMatchesOne("10.0.0.5", "10.0.0.5*"));
-}
-
-TEST(IpRules, ARangeHoldsBothItsEnds) {
-  for (const char* inside : {"10.0.0.1", "10.0.0.5", "10.0.0.9"}) EXPECT_TRUE(ipMatchesOne(inside, "10.0.0.1-9"));
-  for (const char* outside : {"10.0.0.0", "10.0.0.10", "10.0.1.5"}) EXPECT_FALSE(ipMatchesOne(outside, "10.0.0.1-9"));
-  // Numbers, not texts: 9 lies below 10.
-  EXPECT_TRUE(ipMatchesOne("10.0.0.10", "10.0.0.9-11"));
-  for (const char* broken : {"10.0.0.-", "10.0.0.1-", "10.0.0.-9", "10.0.0.1-9-12", "10.0.0.a-z"}) {
-    EXPECT_FALSE(ipMatchesOne("10.0.0.5", broken)) << broken;
-  }
 }
 
 TEST(IpRules, OneMatchingPatternOfTheListIsEnoughAndAnEmptyListPermitsNothing) {

@@ -2,6 +2,7 @@
 
 #include "QVSa/QVSa.h"
 #include "QVSa/resources/Messages.h"
+#include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
 
 namespace QVSa {
@@ -95,6 +96,13 @@ TEST_F(RegistrationTest, ARefusedApplicationLeavesNothing) {
   User second = applicant("Admin");
   EXPECT_FALSE(second.Reg());
   EXPECT_EQ(second.errNumber(), number::integrity) << "the login is taken";
+  test::RecordingProvider recorder;
+  recorder.beforeEach([&](const String& event) {
+    if (event.starts_with("select * from QVUserRegInfo")) tables_.run("delete from QVUserRegInfo");
+  });
+  User lost = applicant();
+  EXPECT_FALSE(lost.Reg()) << "without the row of extra data he is deleted again";
+  EXPECT_EQ(lost.errNumber(), messageNumber(1130));
   EXPECT_EQ(tables_.text("select count(*) from users"), "1");
   EXPECT_EQ(tables_.text("select count(*) from QVUserRegInfo"), "0");
   EXPECT_EQ(mails(), "");

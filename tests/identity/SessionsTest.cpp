@@ -1,16 +1,10 @@
-#include <gtest/gtest.h>
-
-#include "QVSa/identity/Sessions.h"
-#include "QVSa/resources/Messages.h"
 #include "tests/support/Failures.h"
-#include "tests/support/FakeSession.h"
+#include "tests/support/Scene.h"
 
 namespace QVSa {
 namespace {
 
 using test::failureOf;
-using test::FakeServer;
-using Log = std::vector<String>;
 
 // clearSessions is for the library alone; an explicit instantiation may name it all the same.
 template <auto Operation>
@@ -20,85 +14,90 @@ struct Reach {
 Boolean clearSessions(Sessions& sessions, const String& id);
 template struct Reach<&Sessions::clearSessions>;
 
-const Failure unreachable(number::general, "server", "no server.");
-
-class SessionsTest : public ::testing::Test {
+// Ann is signed on; rule "inv" gives released numbers out again.
+class SessionEnd : public test::Scene {
  protected:
-  SessionsTest() {
-    server_.answer(
-        "select * from sesLog",
-        {{{"SESID"}, {"userLogin"}, {"ip"}, {"computer"}, {"beginTime"}, {"dbname"}, {"moduName"}, {"lastActTime"}},
-         {{"s1", "ann", Variant::null(), "pc1", Date(2024, 3, 7, 8, 30), "QVApp", Variant::null(),
-           Date(2024, 3, 7, 9, 0, 5)},
-          {"s2", "ben", "10.0.0.5", "pc2", Date(2024, 3, 7), "QVApp", "", ""}}});
+  SessionEnd() {
+    addUser("ann");
+    EXPECT_TRUE(connected<User>().loginAuth("ann", "right", &id_));
+    auto rule = connected<IdMgr>();
+    rule.idName("inv");
+    rule.preFix("I");
+    rule.numPlace(3);
+    rule.reuseStyle(anyone);
+    EXPECT_TRUE(rule.Save());
   }
 
-  FakeServer server_;
-  Sessions sessions_;
+  String issue(const String& record, const String& session) {
+    return connected<IdMgr>().newId("inv", "", -1, record, session);
+  }
+
+  String id_;
 };
 
-TEST_F(SessionsTest, ConnectReadsTheListFromTheSystemDatabaseWhateverDatabaseItNames) {
-  EXPECT_TRUE(sessions_.connect("host", "QVApp"));
-  EXPECT_EQ(server_.lastOptions.database, "QVSys");
-  ASSERT_EQ(sessions_.Count(), 2);
-  EXPECT_EQ(sessions_.Item("S1"), sessions_.Item(1));
-  EXPECT_EQ(sessions_.Item(1)->ip(), "");
-  EXPECT_EQ(sessions_.Item(1)->BeginTime(), "2024-03-07 08:30:00");
-  EXPECT_EQ(failureOf([&] { sessions_.Item(3); }), number::position);
-  EXPECT_EQ(failureOf([&] { sessions_.Item("none"); }), number::argument);
-  sessions_.Remove("s1");
-  EXPECT_EQ(sessions_.Item(1)->UserLogin(), "ben");
+TEST_F(SessionEnd, GivesBackTheNumbersThatTheSessionStillHolds) {
+  EXPECT_EQ(issue("r1", id_), "I001");
+  EXPECT_EQ(issue("r2", "other"), "I002");
+  EXPECT_EQ(issue("r3", id_), "I003");
+  // A host that keeps a number takes it out of its session.
+  tables_.run("update QVIdDel set sesId=null where rcId='r1'");
+
+  auto sessions = connected<Sessions>();
+  ASSERT_EQ(sessions.Count(), 1);
+  EXPECT_EQ(sessions.Item(id_)->DBName(), "QVApp");
+  EXPECT_TRUE(sessions.Terminate(id_)) << sessions.errDescription();
+  EXPECT_EQ(sessions.Count(), 1);
+  sessions.GetAll();
+  EXPECT_EQ(sessions.Count(), 0);
+  EXPECT_EQ(tables_.text("select theId,rcId,sesId,state from idDel order by theId"),
+            "I001|r1|-|1\nI002|r2|other|1\nI003|-|-|0");
+  EXPECT_EQ(issue("", "other"), "I004") << "without a record nothing is given out again";
+  EXPECT_EQ(issue("r4", "other"), "I003");
+  EXPECT_EQ(issue("r5", "other"), "I005");
+  EXPECT_TRUE(sessions.Terminate("unknown"));
 }
 
-TEST_F(SessionsTest, AListThatCannotBeReadLeavesConnectTrueWithAReport) {
-  server_.fail("open", unreachable);
-  EXPECT_TRUE(sessions_.connect("host"));
-  EXPECT_EQ(sessions_.Count(), 0);
-  EXPECT_EQ(sessions_.errNumber(), number::general);
-  EXPECT_EQ(sessions_.errDescription(), LoadResString(1601) + "no server.");
+TEST_F(SessionEnd, WithoutAnApplicationDatabaseTakesTheSessionAndLeavesTheNumbers) {
+  issue("r1", id_);
+  Sessions sessions;
+  sessions.connect(server());
+  EXPECT_FALSE(sessions.Terminate(id_));
+  EXPECT_EQ(sessions.errNumber(), number::noTable);
+  EXPECT_EQ(sessions.errDescription(), "Disconnection error.Invalid object name 'QVIdDel'.");
+  EXPECT_EQ(tables_.text("select count(*) from seslog"), "0");
+  EXPECT_EQ(tables_.text("select rcId,sesId from idDel"), "r1|" + id_);
 }
 
-TEST_F(SessionsTest, EndingASessionFreesItsNumbersInTheApplicationDatabase) {
-  sessions_.connect("host", "QVApp");
-  server_.log.clear();
-  EXPECT_TRUE(sessions_.Terminate("s1"));
-  EXPECT_EQ(server_.log,
-            (Log{"open", "delete from seslog where sesId=N's1'", "use QVApp",
-                 "update QVIdDel set rcId=null,sesId=null,state=0 where sesId=N's1'", "use QVSys", "close"}));
-  EXPECT_EQ(sessions_.Count(), 2) << "the list is that of the last reading";
+TEST_F(SessionEnd, IsWhatAHostLearnsWhenItMarksActivity) {
+  clock_.set(Date(2024, 3, 7, 11, 30, 0));
+  Long uid = 7;
+  Sessions sessions;
+  EXPECT_TRUE(sessions.newAction(id_, server(), uid, "", 0)) << sessions.errDescription();
+  EXPECT_EQ(tables_.text("select begintime,lastActTime from seslog"), "2024-03-07 10:00:00|2024-03-07 11:30:00");
+  connected<Sessions>().Terminate(id_);
+  EXPECT_FALSE(sessions.newAction(id_, server(), uid, "", 0));
+  EXPECT_EQ(sessions.errNumber(), 0);
 }
 
-TEST_F(SessionsTest, WithoutAnApplicationDatabaseTheSessionGoesAndItsNumbersDoNot) {
-  sessions_.connect("host");
-  server_.log.clear();
-  const String release = "update QVIdDel set rcId=null,sesId=null,state=0 where sesId=N's1'";
-  server_.fail(release, Failure(number::noTable, "server", "no table."));
-  EXPECT_FALSE(sessions_.Terminate("s1"));
-  EXPECT_EQ(sessions_.errDescription(), LoadResString(1603) + "no table.");
-  EXPECT_EQ(server_.log, (Log{"open", "delete from seslog where sesId=N's1'", release, "close"}));
-}
+TEST_F(SessionEnd, ComesForAllOrForAllButOne) {
+  tables_.run("insert into seslog(sesId,userLogin,computer) values('s2','ben','pc2')");
+  auto sessions = connected<Sessions>();
+  EXPECT_EQ(sessions.Item("S2"), sessions.Item(2));
+  EXPECT_EQ(sessions.Item(1)->BeginTime(), "2024-03-07 10:00:00");
+  EXPECT_EQ(sessions.Item(2)->ip(), "");
+  EXPECT_EQ(failureOf([&] { sessions.Item(3); }), number::position);
+  EXPECT_EQ(failureOf([&] { sessions.Item("none"); }), number::argument);
+  sessions.Remove("s2");
+  EXPECT_EQ(sessions.Count(), 1);
 
-TEST_F(SessionsTest, AllCanBeEndedOrAllButOne) {
-  sessions_.connect("host");
-  server_.log.clear();
-  server_.fail("delete from seslog", unreachable);
-  EXPECT_TRUE(clearSessions(sessions_, "s1"));
-  EXPECT_FALSE(clearSessions(sessions_, ""));
-  EXPECT_EQ(sessions_.errDescription(), LoadResString(1603) + "no server.");
-  EXPECT_EQ(server_.log,
-            (Log{"open", "delete from seslog where sesId<>N's1'", "close", "open", "delete from seslog", "close"}));
-}
+  EXPECT_TRUE(clearSessions(sessions, id_));
+  EXPECT_EQ(tables_.text("select sesId from seslog"), id_);
+  EXPECT_TRUE(clearSessions(sessions, ""));
+  EXPECT_EQ(tables_.text("select count(*) from seslog"), "0");
 
-TEST_F(SessionsTest, ActivityIsMarkedForASessionThatIsThereAndRefusedInSilenceOtherwise) {
-  const String find = "select count(*) from sesLog where sesId=N's1'";
-  Long uid = 0;
-  server_.answer(find, {{{""}}, {{Long{1}}}});
-  EXPECT_TRUE(sessions_.newAction("s1", "host", uid, "", 0));
-  EXPECT_EQ(server_.log[2], "update sesLog set lastacttime=getdate() where sesId=N's1'");
-
-  server_.answer(find, {{{""}}, {{Long{0}}}});
-  EXPECT_FALSE(sessions_.newAction("s1", "host", uid, "", 0));
-  EXPECT_EQ(sessions_.errNumber(), 0);
+  EXPECT_TRUE(sessions.connect(server() + "-gone")) << "the list can be read later";
+  EXPECT_EQ(sessions.errNumber(), number::general);
+  EXPECT_FALSE(clearSessions(sessions, ""));
 }
 
 }  // namespace

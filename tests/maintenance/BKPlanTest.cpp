@@ -269,15 +269,6 @@ TEST_F(BackupPlans, RemoveWhatKilledRunsLeftHalfWritten) {
   EXPECT_EQ(platform::filesIn(written.string()), std::vector<String>{"sys.bak.new"}) << "somebody is at it";
 }
 
-TEST_F(BackupPlans, WithoutANumberForTheLogAreDoneButForIt) {
-  BKPlan nightly = saved("nightly");
-  tables_.run("delete from idRule where idName='_log'");
-  EXPECT_FALSE(nightly.exec(1));
-  EXPECT_EQ(nightly.errNumber(), messageNumber(1502));
-  EXPECT_EQ(tables_.text("select schNo,state from QVTaskSche order by schNo"), "1|1\n2|0");
-  EXPECT_EQ(tables_.text("select count(*) from syslog"), "0");
-}
-
 TEST_F(BackupPlans, AreListedByName) {
   BKPlan first = plan("nightly");
   first.delFiles(true);

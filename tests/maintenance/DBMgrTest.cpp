@@ -1,13 +1,12 @@
 #include <filesystem>
 
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/frame/Providers.h"
 #include "QVSa/frame/Text.h"
 #include "QVSa/maintenance/BackupLock.h"
 #include "QVSa/maintenance/RotatedKey.h"
 #include "platform/Files.h"
 #include "platform/SecretMessage.h"
-#include "providers/embedded/Provider.h"
+#include "tests/support/FakeSession.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
 
@@ -80,6 +79,9 @@ TEST_F(Backups, AreRefusedWhereAFileIsMissing) {
   std::filesystem::remove(folder_.path() / "sys.bak");
   EXPECT_FALSE(restore());
   EXPECT_EQ(manager_.errNumber(), messageNumber(2904));
+  EXPECT_FALSE(manager_.BackUpDB(server(), file("no\\sys.bak"), file("app.bak")));
+  EXPECT_EQ(manager_.errNumber(), messageNumber(2906));
+  EXPECT_EQ(manager_.errDescription().rfind("Database backup error.Cannot open backup device", 0), 0U);
 }
 
 TEST_F(Backups, NeedTheAdministratorToRestore) {
@@ -90,49 +92,6 @@ TEST_F(Backups, NeedTheAdministratorToRestore) {
   EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), defaultDbPwd(), false, "QVUser"));
   EXPECT_EQ(manager_.errDescription(), "User does not have permission to RESTORE database 'QVSys'.:3110");
   EXPECT_EQ(tables_.text("select count(*) from users"), "1") << "and the database is back for all";
-}
-
-TEST_F(Backups, SendTheirStatementsInOrder) {
-  std::vector<String> log;
-  {
-    RecordingProvider recorder;
-    backUp("lock");
-    log = recorder.log();
-  }
-  const String sys = file("sys.bak"), app = file("app.bak");
-  EXPECT_EQ(
-      log,
-      (Lines{"open master", "use QVSys", "select isnull(roleSpec) from roles where roleId=4",
-             "select repId from reports", "use master", " backup database QVApp to DISK = '" + app + "' with init",
-             " backup database QVSys to DISK = '" + sys + "' with init", "restore verifyonly from disk='" + sys + "'",
-             "restore verifyonly from disk='" + app + "'", "select repId from reports", "close"}));
-  {
-    RecordingProvider recorder;
-    ASSERT_TRUE(restore());
-    log = recorder.log();
-  }
-  const auto restoring = [&](const String& database, const String& backup) {
-    const String data = (installation_.folder() / (database + ".db")).string();
-    return Lines{"open master",
-                 "alter database " + database + " set SINGLE_USER",
-                 "use " + database,
-                 "select name, fileName from sysfiles",
-                 "use master",
-                 "RESTORE DATABASE " + database + " FROM DISK = N'" + backup + "' With  move N'" + database +
-                     "' to N'" + data + "', move N'" + database + "_log' to N'" + data + "-wal',replace",
-                 "alter database " + database + " set MULTI_USER",
-                 "use " + database,
-                 "sp_changedbowner N'QVUser'",
-                 "close"};
-  };
-  Lines expected = restoring("QVSys", sys);
-  for (const Lines& more :
-       {Lines{"open QVSys", "select isnull(release,'6.5') from sysinfo", "close"}, restoring("QVApp", app),
-        Lines{"open QVSys", "delete from sesLog",
-              "update reptmps set ifCheckout=0,checkOutBy=null Where ifCheckOut = 1",
-              "update CFWorkItems set state=0,checkOutBy=0,checkOutByName='' where state=1", "close"}})
-    expected.insert(expected.end(), more.begin(), more.end());
-  EXPECT_EQ(log, expected);
 }
 
 TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
@@ -207,30 +166,14 @@ TEST_F(Backups, OfAnOlderReleaseGetTheTableOfRoles) {
       << manager_.errDescription();
 }
 
-// A database whose log is kept from the reader.
-class OneFileSession : public ProviderSession {
- public:
-  explicit OneFileSession(const ConnectionOptions& options) : inner_(embedded::provider().open(options)) {}
-  BatchResult run(const Batch& batch) override {
-    return inner_->run({replaceAll(batch.text, "select name", "select top 1 name"), batch.updatable, batch.timeout});
-  }
-  void begin() override { inner_->begin(); }
-  void commit() override { inner_->commit(); }
-  void rollback() override { inner_->rollback(); }
-
- private:
-  std::unique_ptr<ProviderSession> inner_;
-};
-
 TEST_F(Backups, OfADatabaseWithOneFileAreRefused) {
   backUp();
-  SessionOpener before =
-      interposeOpener([](const ConnectionOptions& options) { return std::make_unique<OneFileSession>(options); });
-  EXPECT_FALSE(restore());
-  interposeOpener(std::move(before));
+  FakeServer server;
+  server.answer("select name, fileName from sysfiles", {{{"name"}, {"fileName"}}, {{"QVSys", "QVSys.db"}}});
+  EXPECT_FALSE(restore("host"));
   EXPECT_EQ(manager_.errNumber(), messageNumber(2907));
   EXPECT_EQ(manager_.errDescription(), "The backup fies has error, can not be restored.");
-  EXPECT_TRUE(restore()) << "the database is in multi-user mode again: " << manager_.errDescription();
+  EXPECT_EQ(server.log[server.log.size() - 2], "alter database QVSys set MULTI_USER");
 }
 
 TEST_F(Backups, LeaveTheDatabaseToAllWhereARestoreFails) {
@@ -246,19 +189,10 @@ TEST_F(Backups, LeaveTheDatabaseToAllWhereARestoreFails) {
   }
 }
 
-TEST_F(Backups, DamagedOrForeignAreRefused) {
-  backUp();
-  addUser("ann");
-  damage("sys.bak");
-  EXPECT_FALSE(restore());
-  EXPECT_EQ(manager_.errDescription().substr(manager_.errDescription().size() - 5), ":3241");
-  platform::writeFile(file("sys.bak"), {});
-  EXPECT_FALSE(restore());
-  EXPECT_EQ(manager_.errNumber(), number::statement);
-  EXPECT_EQ(tables_.text("select userLogin from users where userId>1"), "ann") << "nothing was touched";
-  EXPECT_FALSE(manager_.BackUpDB(server(), file("no\\sys.bak"), file("app.bak")));
-  EXPECT_EQ(manager_.errNumber(), messageNumber(2906));
-  EXPECT_EQ(manager_.errDescription().rfind("Database backup error.Cannot open backup device", 0), 0U);
+TEST(ARotatedKey, BeginsAtTheStartThatIsForcedIntoItsRange) {
+  const String all(secrets::rotatedKeyCharacters.begin(), secrets::rotatedKeyCharacters.end());
+  const std::pair<Integer, std::size_t> cases[] = {{0, 0}, {3, 3}, {9, 9}, {-1, 0}, {12, 9}};
+  for (const auto& [start, first] : cases) EXPECT_EQ(rotatedKey(start), all.substr(first) + all.substr(0, first));
 }
 
 }  // namespace

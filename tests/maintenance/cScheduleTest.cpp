@@ -56,6 +56,7 @@ TEST(ASchedule, IsNextDue) {
       {once(2, 3, "", 15), "2026-01-10 11:00", "2026-01-15 10:00:00", "a day still ahead in this month is taken"},
       {repeating(2, 0), "2026-03-10 09:30", "2026-03-10 10:00:00"},
       {repeating(1, 0), "2026-03-10 23:10", "2026-03-11 08:00:00"},
+      {repeating(1, 0), "2026-03-10 22:10", "2026-03-10 23:00:00"},
       {repeating(15, 1), "2026-03-10 23:50", "2026-03-11 08:00:00"},
       {repeating(2, 0, 1, "1000000"), "2026-03-15 13:00", "2026-03-16 14:00:00", "today's slot on the next run day"},
       {repeating(1, 0), "2026-03-10 07:30", "2026-03-10 09:00:00", "before its start it is a slot late"},
@@ -102,39 +103,6 @@ TEST(ASchedule, DescribesItself) {
   schedule.valUnit(9);
   EXPECT_EQ(schedule.description(), "") << "there is no such unit to name";
   EXPECT_EQ(schedule.errNumber(), number::argument);
-}
-
-class DueTasks : public Scene {
- protected:
-  Long due(const String& base) { return schedule_.getNextSch(at(base), type_, task_, run_, moment_); }
-
-  cSchedule schedule_ = connected<cSchedule>();
-  Integer type_ = -7;
-  Long task_ = -7;
-  Long run_ = -7;
-  Date moment_;
-};
-
-TEST_F(DueTasks, AreTheFirstPendingOnesFromAMomentOn) {
-  EXPECT_EQ(due("2024-03-07"), 0);
-  EXPECT_EQ(task_, -7) << "untouched";
-  tables_.run("insert into tasks(taskName,taskType) values('one',2)");
-  tables_.run("insert into QVTaskSche(taskId,schNo,pTime,state) values(1,1,'20240306 10:00:00',1)");
-  tables_.run("insert into QVTaskSche(taskId,schNo,pTime) values(1,2,'20240308 10:00:00')");
-  tables_.run("insert into QVTaskSche(taskId,schNo,pTime) values(1,3,'20240307 11:00:00')");
-  EXPECT_EQ(due("2024-03-01"), 1) << schedule_.errDescription();
-  EXPECT_EQ(type_, 2);
-  EXPECT_EQ(task_, 1);
-  EXPECT_EQ(run_, 3);
-  EXPECT_EQ(moment_.text(), "2024-03-07 11:00:00");
-  EXPECT_EQ(due("2024-03-08 10:00:00"), 1);
-  EXPECT_EQ(run_, 2);
-  EXPECT_EQ(due("2024-03-08 10:00:01"), 0) << "what was missed is not offered again";
-
-  cSchedule nowhere;
-  nowhere.connect("file:" + installation_.folder().string() + "-gone");
-  EXPECT_EQ(nowhere.getNextSch(at("2024-03-01"), type_, task_, run_, moment_), -1);
-  EXPECT_EQ(nowhere.errNumber(), number::general);
 }
 
 }  // namespace QVSa::test

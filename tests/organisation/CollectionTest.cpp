@@ -8,18 +8,6 @@ namespace {
 using test::failureOf;
 using test::names;
 
-TEST(CollectionTest, ItemsAreFoundByPositionAndByKeyInAnyCase) {
-  Roles roles;
-  roles.Add(7, "Manager");
-  roles.Add(8, "5");
-  EXPECT_EQ(roles.Count(), 2);
-  EXPECT_EQ(roles.Item(Long{1})->Id(), 7);
-  EXPECT_EQ(roles.Item("MANAGER")->Id(), 7);
-  EXPECT_EQ(roles.Item("5")->Id(), 8) << "a text is a key, digits too";
-  EXPECT_EQ(failureOf([&] { roles.Add(9, "manager"); }), number::keyExists);
-  EXPECT_EQ(roles.Count(), 2);
-}
-
 TEST(CollectionTest, WhatIsNotThereIsNoObjectForItemAndAFailureForRemove) {
   userGroups groups;
   groups.Add("one");
@@ -47,17 +35,7 @@ TEST(CollectionTest, ACollectionThatOutgrewItsCounterCanNoLongerBeEmptied) {
   EXPECT_NE(users.Item("one more"), nullptr);
 }
 
-class ListsTest : public test::Company {
- protected:
-  // What a list call tells before the database's own text.
-  template <class List, class Call>
-  String told(Call call) const {
-    auto list = connected<List>();
-    EXPECT_FALSE(call(list));
-    EXPECT_EQ(list.errNumber(), number::noTable);
-    return list.errDescription().substr(0, list.errDescription().find("Invalid object name"));
-  }
-};
+class ListsTest : public test::Company {};
 
 TEST_F(ListsTest, AListReplacesTheOneBeforeAndItsRecordsAreConnected) {
   auto roles = connected<Roles>();
@@ -89,22 +67,6 @@ TEST_F(ListsTest, AListThatMeetsAKeyTwiceFailsAndKeepsWhatItHad) {
   auto users = connected<Users>();
   EXPECT_FALSE(users.GetAllOfTheDept(0));
   EXPECT_EQ(names(users), (test::Lines{"Administrator", "twin"}));
-}
-
-TEST_F(ListsTest, EachListReportsAFailureByItsOwnMessage) {
-  for (const char* table : {"departments", "roles", "ItemGroups"}) tables_.run(String("drop synonym ") + table);
-  EXPECT_EQ(told<Departments>([](auto& list) { return list.GetAll(); }), "");
-  EXPECT_EQ(told<Departments>([](auto& list) { return list.GetRoot(); }), "");
-  EXPECT_EQ(told<Roles>([](auto& list) { return list.GetAll(); }), "Error in getting all roles. ");
-  EXPECT_EQ(told<userGroups>([](auto& list) { return list.GetAll(); }), "Fail to get all user groups. ");
-  EXPECT_EQ(told<Jobs>([](auto& list) { return list.GetAll(); }), "Fail to add new backup plan. ");
-  EXPECT_EQ(told<Jobs>([](auto& list) { return list.GetAllOfDept(); }), "Fail to add new backup plan. ");
-  EXPECT_EQ(told<Jobs>([](auto& list) { return list.GetAllSameRole(); }), "Fail to add new backup plan. ");
-  EXPECT_EQ(told<Users>([](auto& list) { return list.GetAll(); }), "Error in listing users ");
-  EXPECT_EQ(told<Users>([](auto& list) { return list.GetAllReg(); }), "");
-  EXPECT_EQ(told<Users>([](auto& list) { return list.GetAllOfTheDept(0); }), "Error in listing users ");
-  EXPECT_EQ(told<Users>([](auto& list) { return list.GetAllOfTheDeptAndRole(); }), "Error in listing users ");
-  EXPECT_EQ(told<Users>([](auto& list) { return list.GetList(0) != -1; }), "Error in listing users ");
 }
 
 }  // namespace

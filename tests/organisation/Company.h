@@ -1,16 +1,12 @@
 #pragma once
 
-#include <gtest/gtest.h>
-
-#include "QVSa/QVSa.h"
-#include "tests/support/PlainSession.h"
-#include "tests/support/TestInstallation.h"
+#include "tests/support/Scene.h"
 
 namespace QVSa::test {
 
 // A small company on the engine. _root over Sales (S, an organisation) over East (E) over Hub (H), and over Works (W);
 // the role Manager.
-class Company : public testing::Test {
+class Company : public Scene {
  protected:
   Company() {
     for (const auto& [number, name, superior] :
@@ -19,19 +15,12 @@ class Company : public testing::Test {
     manager_ = addRole("Manager");
   }
 
-  template <class Object>
-  Object connected() const {
-    Object object;
-    object.connect(installation_.server(), "QVApp");
-    return object;
-  }
-
-  Department department(const String& number) const {
+  Department department(const String& number) {
     auto result = connected<Department>();
     EXPECT_TRUE(result.GetOne(1, number)) << result.errDescription();
     return result;
   }
-  String idOf(const String& number) const { return text(department(number).InnerId()); }
+  String idOf(const String& number) { return text(department(number).InnerId()); }
 
   void addDepartment(const String& number, const String& name, const String& superior) {
     auto added = connected<Department>();
@@ -73,8 +62,6 @@ class Company : public testing::Test {
     return group;
   }
 
-  TestInstallation installation_;
-  PlainSession tables_{installation_.server()};
   Role manager_;
 };
 

@@ -1,181 +1,227 @@
-#include <gtest/gtest.h>
-
-#include "QVSa/organisation/Department.h"
-#include "QVSa/organisation/Role.h"
-#include "QVSa/organisation/userGroup.h"
-#include "QVSa/resources/Messages.h"
 #include "tests/support/FakeSession.h"
+#include "tests/support/RecordingProvider.h"
+#include "tests/support/Scene.h"
 
 namespace QVSa {
 namespace {
 
-using test::FakeServer;
-using test::FakeTable;
-using Log = std::vector<String>;
+using test::Lines;
 
-const char* const readEast =
-    "select d1.*,superNo=d2.deptNo  from departments d1,departments d2 where d1.superDept*=d2.deptId"
-    " and d1.deptNo=N'E'";
-
-String readOrganisation(const String& path, Long deptId) {
-  return "select deptId,deptName,fullName,deptNo from departments where (" + path +
-         " like '%'+path+'%' and isOrg=1 and deptId<>" + text(deptId) + ") or deptNo='_root' order by path desc";
-}
-
-FakeTable row(const Variant& superDept, const Variant& superNo, const Variant& isOrg, const Variant& path) {
-  return {{{"deptId"},
-           {"deptNo"},
-           {"deptName"},
-           {"superDept"},
-           {"superNo"},
-           {"fullname"},
-           {"isOrg"},
-           {"path"},
-           {"isOuter"}},
-          {{Long{7}, "E", "East", superDept, superNo, "Sales-East", isOrg, path, Long{1}}}};
-}
-
-FakeTable organisation(const char* deptNo) {
-  return {{{"deptId"}, {"deptName"}, {"fullName"}, {"deptNo"}}, {{Long{1}, "Group", "Group", deptNo}}};
-}
-
-class DepartmentTest : public ::testing::Test {
+// Sales (3) with East (4) and in that Hub (5); Overseas (6).
+class DepartmentTree : public test::Scene {
  protected:
-  DepartmentTest() {
-    server_.answer(readEast, row(Long{3}, "S", Integer{0}, ".1.3.7."));
-    server_.answer(readOrganisation("N'.1.3.7.'", 7), organisation("S"));
-    east_.connect("host");
+  DepartmentTree() {
+    add("S", "Sales", "_root");
+    add("E", "East", "S");
+    add("H", "Hub", "E");
+    add("O", "Overseas", "_root");
   }
 
-  void answerStored() {
-    server_.answer(
-        "select d1.path,d1.fullName,superNo=d2.deptNo,superFullName=d2.fullName,d1.deptName"
-        " from departments d1,departments d2 where d1.deptId=7 and d1.superDept*=d2.deptId",
-        {{{"path"}, {"fullName"}, {"superNo"}, {"superFullName"}, {"deptName"}},
-         {{".1.3.7.", "Sales-East", "S", "Sales", "East"}}});
+  void add(const String& id, const String& name, const String& super) {
+    auto department = connected<Department>();
+    department.Id(id);
+    department.Name(name);
+    department.Super(super);
+    ASSERT_TRUE(department.Save()) << department.errDescription();
+    EXPECT_EQ(department.fullId(), "") << "the path comes with the next load";
   }
-  void answerSuper(const char* number, const Variant& path, const Variant& fullName) {
-    server_.answer("select deptId,path,fullName,deptNo from departments where deptNo=N'" + String(number) + "'",
-                   {{{"deptId"}, {"path"}, {"fullName"}, {"deptNo"}}, {{Long{5}, path, fullName, number}}});
+  Department department(const String& id) {
+    auto result = connected<Department>();
+    EXPECT_TRUE(result.GetOne(1, id)) << result.errDescription();
+    return result;
   }
-
-  FakeServer server_;
-  Department east_;
+  void change(const String& id, const std::function<void(Department&)>& change) {
+    Department changed = department(id);
+    change(changed);
+    ASSERT_TRUE(changed.Save()) << changed.errDescription();
+  }
+  void move(const String& id, const String& super) {
+    change(id, [&](Department& moved) { moved.Super(super); });
+  }
+  void expectRefused(Department& subject, Boolean result, Long message) {
+    EXPECT_FALSE(result);
+    EXPECT_EQ(subject.errNumber(), messageNumber(message)) << subject.errDescription();
+  }
+  Lines tree() const {
+    return tables_.rows("select deptNo,path,fullName from departments where deptId>2 order by deptId");
+  }
 };
 
-TEST_F(DepartmentTest, ARowAtTheTopIsNoOrganisationWhereItsColumnIsNull) {
-  server_.answer(readEast, row(Variant::null(), Variant::null(), Variant::null(), ".7."));
-  server_.answer(readOrganisation("N'.7.'", 7), organisation("_root"));
-  ASSERT_TRUE(east_.GetOne(1, "E"));
-  EXPECT_FALSE(east_.isOrg());
-  EXPECT_TRUE(east_.isOuter());
+TEST_F(DepartmentTree, GrowsWithPathsAndFullNamesThatLeaveOutTheRoot) {
+  add("T", " Top ", "");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|.1.3.4.|Sales-East", "H|.1.3.4.5.|Sales-East-Hub", "O|.1.6.|Overseas",
+                           "T|.7.|Top"}));
+  const Department hub = department("h");
+  EXPECT_EQ(hub.InnerId(), 5);
+  EXPECT_EQ(hub.Super(), "E");
+  EXPECT_EQ(hub.superInnerId(), 4);
+  EXPECT_EQ(hub.fullId(), ".1.3.4.5.");
+  auto same = connected<Department>();
+  EXPECT_TRUE(same.GetOne(2, "hub"));
+  EXPECT_TRUE(same.GetOne(3, "5"));
 }
 
-TEST_F(DepartmentTest, AMoveRewritesTheSubtreeInTheSameTransaction) {
-  ASSERT_TRUE(east_.GetOne(1, "E"));
-  answerStored();
-  answerSuper("O", ".1.5.", "Overseas ");
-  east_.Super("O");
-  server_.log.clear();
-  ASSERT_TRUE(east_.Save());
-  EXPECT_EQ(east_.fullName(), "Overseas-East");
-  EXPECT_EQ(Log(server_.log.begin() + 4, server_.log.end()),
-            (Log{"begin",
-                 "update departments set deptNo=N'E',deptName=N'East',fullName=N'Overseas-East',path=N'.1.5.7.',"
-                 "superDept=5,isOrg=0 where deptId=7",
-                 "update departments set path=replace(path,N'.1.3.7.',N'.1.5.7.'),"
-                 "fullName=replace(fullName,N'Sales-East',N'Overseas-East') where path like N'.1.3.7.%' and deptId<>7",
-                 "commit", "close"}));
+TEST_F(DepartmentTree, AMoveOrANewNameGoesThroughAllThatLiesBelow) {
+  move("E", "O");
+  EXPECT_EQ(tree(),
+            (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Overseas-East", "H|.1.6.4.5.|Overseas-East-Hub", "O|.1.6.|Overseas"}));
+  EXPECT_EQ(tables_.text("select superDept from departments where deptNo='E'"), "6");
+  change("E", [](Department& east) { east.Name("West"); });
+  EXPECT_EQ(tree(),
+            (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Overseas-West", "H|.1.6.4.5.|Overseas-West-Hub", "O|.1.6.|Overseas"}));
+  move("E", "");
+  EXPECT_EQ(tree()[1], "E|.4.|West");
+  EXPECT_EQ(tree()[2], "H|.4.5.|West-Hub");
+  move("E", "_root");
+  EXPECT_EQ(tree()[2], "H|.1.4.5.|West-Hub");
 }
 
-TEST_F(DepartmentTest, AnUnchangedDepartmentIsWrittenWithoutItsSubtreeAndARenamedOneWithIt) {
-  ASSERT_TRUE(east_.GetOne(1, "E"));
-  answerStored();
-  server_.log.clear();
-  ASSERT_TRUE(east_.Save());
-  EXPECT_EQ(server_.log.size(), 7U);
-
-  east_.Name("West");
-  server_.log.clear();
-  ASSERT_TRUE(east_.Save());
-  EXPECT_EQ(east_.fullName(), "Sales-West");
-  EXPECT_EQ(server_.log[5],
-            "update departments set path=replace(path,N'.1.3.7.',N'.1.3.7.'),"
-            "fullName=replace(fullName,N'Sales-East',N'Sales-West') where path like N'.1.3.7.%' and deptId<>7");
+TEST_F(DepartmentTree, AMoveBelowItselfIsNotRefused) {
+  move("S", "H");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.4.5.3.|Sales-East-Hub-Sales", "E|.1.3.4.5.3.4.|Sales-East-Hub-Sales-East",
+                           "H|.1.3.4.5.3.4.5.|Sales-East-Hub-Sales-East-Hub", "O|.1.6.|Overseas"}));
 }
 
-TEST_F(DepartmentTest, ANewDepartmentIsInsertedFirstAndGetsItsPathFromItsId) {
-  answerSuper("_root", ".1.", "Group");
-  server_.answer("select scope_identity()", {{{""}}, {{9.0}}});
-  Department added;
-  added.connect("host");
+TEST_F(DepartmentTree, ARefusedSaveChangesNothing) {
+  const Lines before = tree();
+  auto empty = connected<Department>();
+  empty.Id("X");
+  expectRefused(empty, empty.Save(), 1002);
+  empty.Name("X");
+  empty.Super("nowhere");
+  expectRefused(empty, empty.Save(), 1003);
+
+  Department east = department("E");
+  east.Super("nowhere");
+  expectRefused(east, east.Save(), 1003);
+  east.Name("");
+  expectRefused(east, east.Save(), 1002);
+  EXPECT_EQ(tree(), before);
+}
+
+TEST_F(DepartmentTree, WhetherItIsForOutsidersIsWrittenOnce) {
+  change("E", [](Department& east) {
+    east.isOuter(true);
+    east.isOrg(true);
+  });
+  EXPECT_EQ(tables_.text("select isOuter,isOrg from departments where deptNo='E'"), "0|1");
+  EXPECT_EQ(department("H").Org(), "E");
+  EXPECT_EQ(department("E").Org(), "E");
+  EXPECT_EQ(department("O").Org(), "_root");
+}
+
+TEST_F(DepartmentTree, NullsInTheColumnsOfTheTree) {
+  tables_.run("update departments set superDept=null where deptNo='O'");
+  EXPECT_TRUE(department("O").isOrg()) << "nothing above it";
+  tables_.run("update departments set isOrg=null where deptNo='O'");
+  EXPECT_FALSE(department("O").isOrg());
+  EXPECT_EQ(department("O").Super(), "");
+
+  tables_.run("update departments set path=null where deptNo='E'");
+  auto east = connected<Department>();
+  EXPECT_FALSE(east.GetOne(1, "E"));
+  EXPECT_EQ(east.errNumber(), number::nullUse);
+  EXPECT_EQ(east.Name(), "East") << "the fields are there";
+  expectRefused(east, east.GetOne(1, "nowhere"), 1001);
+  EXPECT_EQ(east.Org(), "_root");
+  add("N", "New", "E");
+  EXPECT_EQ(tree().back(), "N|7.|Sales-East-New");
+  tables_.run("update departments set fullName=null where deptNo='E'");
+  add("M", "More", "E");
+  EXPECT_EQ(tree().back(), "M|8.|");
+}
+
+TEST_F(DepartmentTree, ADepartmentWithoutAPathIsSavedAloneAndGetsItsPath) {
+  auto added = connected<Department>();
   added.Id("N");
-  added.Name("North");
-  added.Super("_root");
-  ASSERT_TRUE(added.Save());
-  EXPECT_EQ(added.InnerId(), 9);
-  EXPECT_EQ(added.fullName(), "North") << "the root's name stands in no chain";
-  EXPECT_EQ(added.fullId(), "");
-  EXPECT_EQ(server_.log[3],
-            "insert into departments(deptNo,deptName,superDept,fullName,isOrg,isOuter) "
-            " values(N'N',N'North',5,N'North',0,0)");
-  EXPECT_EQ(server_.log[5], "update departments set path=N'.1.9.' where deptId=9");
+  added.Name("New");
+  added.Super("E");
+  {
+    test::RecordingProvider recorder;
+    recorder.failAt(6, Failure(number::timeout, "server", "late."));
+    ASSERT_FALSE(added.Save());
+    EXPECT_EQ(recorder.log().back(), "close");
+  }
+  EXPECT_EQ(tree().back(), "N|-|Sales-East-New");
+  Lines expected = tree();
+  added.Name("Newer");
+  ASSERT_TRUE(added.Save()) << added.errDescription();
+  expected.back() = "N|.1.3.4.7.|Sales-East-Newer";
+  EXPECT_EQ(tree(), expected);
+
+  // Below one without a path it can be no better off, but it can be moved away again with all that it has below it.
+  tables_.run("update departments set path=null where deptNo='O'");
+  move("E", "O");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|4.|Overseas-East", "H|4.5.|Overseas-East-Hub", "O|-|Overseas",
+                           "N|4.7.|Overseas-East-Newer"}));
+  move("E", "S");
+  expected[3] = "O|-|Overseas";
+  EXPECT_EQ(tree(), expected);
+}
+
+TEST_F(DepartmentTree, ADeleteIsRefusedWhileSomebodyIsLeftAndTakesTheJobs) {
+  addUser("ann", [](User& user) { user.deptId("E"); });
+  addUser("ben", [](User& user) { user.deptId("H"); });
+  auto subject = connected<Department>();
+  expectRefused(subject, subject.Delete("nowhere"), 1001);
+  expectRefused(subject, subject.Delete("E"), 1004);
+  expectRefused(subject, subject.Delete("H"), 1006);
+
+  // Job 5 is the one of the department that goes, job 1 one that stays.
+  tables_.run("delete from users where userLogin='ben' insert into jobs(roleId,deptId) values(1,5)");
+  for (const char* hanging : {"userJob(jobId,userId) select jobId,9", "repAcl(jobId,repId) select jobId,1",
+                              "userMgr(jobId,flag,UserId) select jobId,1,9", "fldAcl(jobId,fldId) select jobId,1",
+                              "cftJob(jobId,tId) select jobId,1"})
+    tables_.run(String("insert into ") + hanging + " from jobs where jobId in (1,5)");
+  EXPECT_TRUE(subject.Delete("H")) << subject.errDescription();
+  for (const char* table : {"jobs", "userJob", "userMgr", "repAcl", "fldAcl", "cftJob"})
+    EXPECT_EQ(tables_.text(String("select distinct jobId from ") + table + " where jobId in (1,5)"), "1") << table;
+  EXPECT_EQ(tree().size(), 3U);
+}
+
+TEST_F(DepartmentTree, ADepartmentTooDeepForItsPathIsNotInserted) {
+  tables_.run("update departments set path=replicate('.1',424)+'.' where deptNo='H'");
+  auto deep = connected<Department>();
+  deep.Id("D");
+  deep.Name("Deep");
+  deep.Super("H");
+  EXPECT_FALSE(deep.Save());
+  EXPECT_EQ(deep.errNumber(), number::range);
+  EXPECT_EQ(deep.InnerId(), 0);
 }
 
 template <class Object>
-Object refusedNew(Long errNumber, const Log& lastOfLog, FakeServer& server) {
+Object refusedNew(Long errNumber) {
   Object object;
   object.connect("host");
   if constexpr (std::is_same_v<Object, Department>) object.Id("N");
+  if constexpr (std::is_same_v<Object, User>) object.Login("n");
   object.Name("N");
   EXPECT_FALSE(object.Save());
   EXPECT_EQ(object.errNumber(), errNumber);
-  EXPECT_EQ(Log(server.log.end() - static_cast<int>(lastOfLog.size()), server.log.end()), lastOfLog);
   return object;
 }
 
-TEST_F(DepartmentTest, ARowWhoseIdCantBeReadOrThatIsNotCommittedHasNone) {
+TEST(ANewRow, WhoseIdCantBeReadOrThatIsNotCommittedHasNone) {
   const String identity = "select scope_identity()";
-  server_.answer("select count(*) from roles where roleName=N'N'", {{{""}}, {{Long{0}}}});
-  server_.answer("select count(*) from ItemGroups where gName=N'N'", {{{""}}, {{Long{0}}}});
-  server_.answer(identity, {{{""}}, {}});
-  EXPECT_EQ(refusedNew<Department>(messageNumber(1103), {identity, "close"}, server_).InnerId(), 0);
-  EXPECT_EQ(refusedNew<Role>(messageNumber(1203), {identity, "rollback", "close"}, server_).Id(), 0);
-  EXPECT_EQ(refusedNew<userGroup>(messageNumber(1802), {identity, "rollback", "close"}, server_).Id(), 0);
+  test::FakeServer server;
+  server.answer("select count(*) from roles where roleName=N'N'", {{{""}}, {{Long{0}}}});
+  server.answer("select count(*) from ItemGroups where gName=N'N'", {{{""}}, {{Long{0}}}});
+  server.answer("select * from saferule where id=1", {{{"minLen"}}, {}});
+  server.answer("select * from departments where deptNo=N'_root'",
+                {{{"deptId"}, {"deptName"}, {"fullName"}}, {{Long{1}, "Us", "Us"}}});
+  server.answer(identity, {{{""}}, {}});
+  EXPECT_EQ(refusedNew<Department>(messageNumber(1103)).InnerId(), 0);
+  EXPECT_EQ(refusedNew<User>(messageNumber(1103)).Id(), 0);
+  EXPECT_EQ(refusedNew<Role>(messageNumber(1203)).Id(), 0);
+  EXPECT_EQ(refusedNew<userGroup>(messageNumber(1802)).Id(), 0);
+  EXPECT_EQ(std::count(server.log.begin(), server.log.end(), "commit"), 0);
 
-  server_.answer(identity, {{{""}}, {{9.0}}});
-  server_.fail("commit", Failure(number::timeout, "server", "late."));
-  EXPECT_EQ(refusedNew<Role>(number::timeout, {"commit", "rollback", "close"}, server_).Id(), 0);
-  EXPECT_EQ(refusedNew<userGroup>(number::timeout, {"commit", "rollback", "close"}, server_).Id(), 0);
-}
-
-TEST_F(DepartmentTest, ADepartmentWithChildrenOrUsersStaysAndAnEmptyOneTakesItsJobsAlong) {
-  const String children = "select count(*) from departments where superDept=7";
-  const String users = "select count(*) from users where deptId=7";
-  server_.answer("select deptId from departments where deptNo=N'E'", {{{"deptId"}}, {{Long{7}}}});
-  server_.answer(children, {{{""}}, {{Long{1}}}});
-  server_.answer(users, {{{""}}, {{Long{1}}}});
-  server_.answer("select jobId from jobs where deptId=7", {{{"jobId"}}, {{Long{11}}, {Long{12}}}});
-  EXPECT_FALSE(east_.Delete("E"));
-  EXPECT_EQ(east_.errNumber(), messageNumber(1004));
-  server_.answer(children, {{{""}}, {{Long{0}}}});
-  EXPECT_FALSE(east_.Delete("E"));
-  EXPECT_EQ(east_.errNumber(), messageNumber(1006));
-
-  server_.answer(users, {{{""}}, {{Long{0}}}});
-  server_.log.clear();
-  EXPECT_TRUE(east_.Delete("E"));
-  EXPECT_EQ(Log(server_.log.begin() + 5, server_.log.end()),
-            (Log{"select jobId from jobs where deptId=7", "delete from fldAcl where jobId in (11,12)",
-                 "delete from cftJob where jobId in (11,12)", "delete from userJob where jobId in (11,12)",
-                 "delete from repAcl where jobId in (11,12)", "delete from userMgr where jobId in (11,12)",
-                 "delete from jobs where jobId in (11,12)", "delete from departments where deptId=7", "close"}));
-
-  server_.fail("delete from repAcl where jobId in (11,12)", Failure(number::timeout, "server", "late."));
-  server_.log.clear();
-  EXPECT_FALSE(east_.Delete("E"));
-  EXPECT_EQ(east_.errDescription(), "late.");
-  EXPECT_EQ(server_.log[server_.log.size() - 2], "delete from repAcl where jobId in (11,12)");
+  server.answer(identity, {{{""}}, {{9.0}}});
+  server.fail("commit", Failure(number::timeout, "server", "late."));
+  EXPECT_EQ(refusedNew<User>(number::timeout).Id(), 0);
+  EXPECT_EQ(refusedNew<Role>(number::timeout).Id(), 0);
+  EXPECT_EQ(refusedNew<userGroup>(number::timeout).Id(), 0);
 }
 
 }  // namespace

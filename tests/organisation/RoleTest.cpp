@@ -107,37 +107,15 @@ TEST_F(RoleTest, JobsAreMadeAndRemovedWithAllThatHangsOnThem) {
 
   EXPECT_EQ(manager_.GetJobIdOfTheDept(idOf("H")), 0);
   EXPECT_EQ(manager_.errNumber(), messageNumber(1210));
-  tables_.run("drop synonym jobs");
-  EXPECT_EQ(manager_.GetJobIdOfTheDept(idOf("H")), -1);
 }
 
-TEST_F(RoleTest, AFailedSettingOfJobsLeavesAllAsItWasAndHasOneNumber) {
-  ASSERT_TRUE(manager_.setJobs(idOf("E")));
-  tables_.run("drop synonym fldAcl");
-  EXPECT_FALSE(manager_.setJobs(idOf("W"), idOf("E")));
-  EXPECT_EQ(manager_.errNumber(), messageNumber(1208));
-  EXPECT_EQ(manager_.errDescription().substr(0, 72),
-            "Error in setting jobs of the role in departments.Invalid object name 'fl");
-  EXPECT_EQ(jobsOf(manager_), (Lines{"E"}));
-  EXPECT_FALSE(manager_.setJobs("seven"));
-  EXPECT_EQ(manager_.errNumber(), messageNumber(1208));
-}
-
-TEST_F(RoleTest, ADeletedRoleTakesItsJobsAlongAndGoesOnWhereTheyCantBeCleared) {
+TEST_F(RoleTest, ADeletedRoleTakesItsJobsAlong) {
   hang(job(manager_, "E"));
   ASSERT_TRUE(manager_.Delete());
   EXPECT_EQ(hanging(), Lines{});
   EXPECT_EQ(tables_.text("select count(*) from roles where roleName='Manager'"), "0");
   EXPECT_EQ(tables_.text("select count(*) from jobs where jobId>4"), "0");
   EXPECT_TRUE(manager_.Delete(4711));
-
-  auto clerk = addRole("Clerk");
-  const Long clerkJob = job(clerk, "E");
-  hang(clerkJob);
-  tables_.run("drop synonym fldAcl");
-  ASSERT_TRUE(clerk.Delete());
-  EXPECT_EQ(tables_.text("select count(*) from jobs where jobId>4"), "0");
-  EXPECT_EQ(tables_.text("select count(*) from cftJob"), "1") << "what hung on the job stays";
 }
 
 TEST_F(RoleTest, HoldersComeDirectlyOrThroughAGroup) {
@@ -163,9 +141,6 @@ TEST_F(RoleTest, HoldersComeDirectlyOrThroughAGroup) {
   EXPECT_EQ(manager_.GetUsersOfRole("40000"), nullptr);
   EXPECT_EQ(manager_.errNumber(), number::overflow);
   EXPECT_EQ(manager_.errDescription(), "Error in listing users who have the role [Manager]. Overflow");
-  tables_.run("drop synonym users");
-  EXPECT_EQ(manager_.GetUsers(), nullptr);
-  EXPECT_EQ(manager_.errDescription().substr(0, 30), "Error in listing users Invalid");
 }
 
 TEST_F(RoleTest, HoldersAreAddedAndRemovedByPairsAndTellTheirJobsAsXml) {
@@ -173,7 +148,7 @@ TEST_F(RoleTest, HoldersAreAddedAndRemovedByPairsAndTellTheirJobsAsXml) {
   ASSERT_TRUE(manager_.GetUsers2(xml));
   EXPECT_EQ(xml, "<users/>");
   const String hub = text(job(manager_, "H")), works = text(job(manager_, "W"));
-  const String ann = text(addUser("A <&> \"B\"\n", "E"));
+  const String ann = text(addUser("A <&> \"B\"\x07\n", "E"));
   ASSERT_TRUE(manager_.UpdateUsers(ann + "," + hub + "|" + ann + "," + works, ""));
   ASSERT_TRUE(manager_.GetUsers2(xml));
   const String start = "<user id=\"" + ann + "\" name=\"A &lt;&amp;> &quot;B&quot;&#10;\" deptid=\"" + idOf("E") +

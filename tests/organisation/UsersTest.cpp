@@ -148,8 +148,6 @@ TEST_F(UsersTest, TheGridStandsByItselfUntilTheNextOneReplacesIt) {
   EXPECT_EQ(users_.GetDataMember("").RecordCount(), 3);
   grid.MoveFirst();
   EXPECT_EQ(grid["Remark"].asText(), "BuiltIn");
-  tables_.run("drop synonym users");
-  EXPECT_EQ(users_.GetList(0), -1);
 }
 
 TEST_F(UsersTest, AUserInMemoryHoldsWhatHeWasGiven) {
@@ -204,19 +202,6 @@ TEST_F(UsersTest, ASupervisorThatIsNotNamedIsRefusedAndNothingChanges) {
   EXPECT_EQ(ann.errNumber(), messageNumber(1113));
   ASSERT_TRUE(bob.GetOne(3, "bob"));
   EXPECT_EQ(bob.getSubUsers()->Count(), 1);
-
-  tables_.run(
-      "insert into users(userName,userLogin) values('ann','ann2')"
-      "insert into userMgr(UserId,flag,mgrId) select userId,2," +
-      text(bob_) + " from users where userLogin='ann2'");
-  EXPECT_EQ(bob.getSubUsers(), nullptr);
-  EXPECT_EQ(bob.errNumber(), number::keyExists);
-  EXPECT_EQ(bob.errDescription().substr(0, 47), "Error in listing user's subordinates.This key i");
-  tables_.run("drop synonym userMgr");
-  Integer flag = 0;
-  Long id = 0;
-  EXPECT_FALSE(ann.getManager(flag, id, id));
-  EXPECT_EQ(ann.errDescription().substr(0, 44), "Error in getting user's supervisor.Invalid o");
 }
 
 }  // namespace

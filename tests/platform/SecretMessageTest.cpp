@@ -218,20 +218,6 @@ TEST(Md5Hex, IsTheDigestOfTheCodePagesBytes) {
   EXPECT_EQ(md5Hex("a\u5bc6\xFF\U0001F511"), md5Hex("a????")) << "what the code page lacks";
 }
 
-TEST(Md5Hex, FailsWithOverflowWhereACharacterIsTwoBytes) {
-  const auto failure = [](const char* locale, const String& text) {
-    const test::EnvironmentLocale environment(locale);
-    try {
-      md5Hex(text);
-    } catch (const Failure& thrown) {
-      return thrown.number();
-    }
-    return Long{0};
-  };
-  EXPECT_EQ(failure("zh_CN.UTF-8", "\u5bc6"), 6);
-  EXPECT_EQ(failure("zh_CN.UTF-8", "abc"), 0);
-}
-
 TEST(ClearSecret, OverwritesTheMemory) {
   String text = "a secret that is longer than a small text";
   const auto place = reinterpret_cast<std::uintptr_t>(text.data());

@@ -23,22 +23,5 @@ TEST(Services, TellTheLocalTimeOfTheMachine) {
   tzset();
 }
 
-TEST(Services, NameTheComputer) {
-  const String name = services().computerName();
-  EXPECT_FALSE(name.empty());
-  EXPECT_LE(name.size(), 128U);
-  EXPECT_EQ(name.find(' '), String::npos);
-}
-
-TEST(Services, CanBeReplacedAndPutBack) {
-  const String name = services().computerName();
-  Services fakes = services();
-  fakes.computerName = [] { return String("PC-7"); };
-  Services old = replaceServices(fakes);
-  EXPECT_EQ(services().computerName(), "PC-7");
-  replaceServices(std::move(old));
-  EXPECT_EQ(services().computerName(), name);
-}
-
 }  // namespace
 }  // namespace QVSa::platform

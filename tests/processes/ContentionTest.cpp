@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <chrono>
+#include <future>
 #include <random>
 #include <set>
 #include <thread>
@@ -129,6 +130,37 @@ TEST_F(Contention, WhoHoldsARowIsNotWaitedForAndItsDeathFreesTheRow) {
   ASSERT_EQ(writer.front().line(), "holding");
   writer.front().kill();
   EXPECT_EQ(rule.newId("inv"), "2024030700003") << rule.errDescription();
+}
+
+TEST_F(Contention, ASignOnWhileTheLogIsClearedWaitsAndSucceeds) {
+  addUser("ann");
+  const PlainSession system(server(), "QVSys");
+  system.run("insert into syslog(logId,logtype,OpDesc) values('1',1,replicate('x',100))");
+  for (int doubling = 0; doubling < 18; ++doubling)
+    system.run("insert into syslog(logId,logtype,OpDesc) select logId,1,OpDesc from syslog");
+  auto clearing = std::async(std::launch::async, [&] {
+    LogRecords log;
+    log.connect(server(), "QVSys");
+    return log.clearLog();
+  });
+  // One after the other until the rows are gone: the deletion goes in one statement.
+  int signedOn = 0;
+  do {
+    auto ann = connected<User>();
+    String session;
+    ASSERT_TRUE(ann.loginAuth("ann", "right", &session)) << ann.errDescription();
+    ++signedOn;
+  } while (clearing.wait_for(std::chrono::seconds(0)) != std::future_status::ready);
+  EXPECT_TRUE(clearing.get());
+  EXPECT_EQ(system.text("select count(*) from syslog"), "0");
+  EXPECT_EQ(system.text("select count(*) from seslog"), std::to_string(signedOn));
+}
+
+TEST_F(Contention, AHostMayCallWhileItsStaticsAreDestroyed) {
+  addUser("ann");
+  auto worker = start(1, "call-last", {});
+  go(worker);
+  EXPECT_EQ(worker.front().lines(), Lines{"done"});
 }
 
 }  // namespace

@@ -126,22 +126,5 @@ TEST_F(BackupsAmongProcesses, KilledOrWithoutRoomLeaveTheOldFilesWhole) {
   EXPECT_EQ(files(), 2) << "what the killed ones left is gone";
 }
 
-TEST_F(BackupsAmongProcesses, AreNotRestoredWhileAnotherProcessUsesTheDatabase) {
-  makeWords();
-  say("old");
-  backUp("old");
-  say("new");
-  Worker user("stay", {server(), "QVSys"});
-  user.go();
-  ASSERT_EQ(user.line(), "staying");
-  Worker worker = restoring("old");
-  worker.go();
-  std::this_thread::sleep_for(std::chrono::milliseconds(200));
-  EXPECT_EQ(system_.text("select distinct w from word"), "new") << "others still come and go";
-  user.kill();
-  EXPECT_EQ(worker.line(), "done");
-  EXPECT_EQ(system_.text("select distinct w from word"), "old");
-}
-
 }  // namespace
 }  // namespace QVSa::test

@@ -69,30 +69,6 @@ void hold(const Words& words) {
   ::pause();
 }
 
-void loadAsNobody(const Words& words) {
-  constexpr uid_t nobody = 65534;
-  if (::setgid(nobody) != 0 || ::setuid(nobody) != 0) return;
-  User user;
-  user.connect(words.at(0));
-  user.GetOne(3, "Admin");
-  writeLine(failureText(user.errNumber(), user.errDescription()));
-}
-
-void clearLog(const Words& words) {
-  LogRecords log;
-  log.connect(words.at(0), "QVSys");
-  const Long type = 1;
-  writeLine("clearing");
-  writeLine(log.clearLog(&type) ? "cleared" : failureText(log.errNumber(), log.errDescription()));
-}
-
-void stay(const Words& words) {
-  Connection connection;
-  connection.Open(buildConnString(words.at(0), words.at(1), false));
-  writeLine("staying");
-  ::pause();
-}
-
 void restore(const Words& words) {
   DBMgr manager;
   const bool done = manager.RestoreDB(words.at(0), words.at(1), words.at(2), words.at(3));
@@ -167,9 +143,6 @@ int doWork(const Words& words) {
   if (words.at(0) == "wrong-passwords") wrongPasswords(arguments);
   if (words.at(0) == "issue") issue(arguments);
   if (words.at(0) == "hold") hold(arguments);
-  if (words.at(0) == "clear-log") clearLog(arguments);
-  if (words.at(0) == "load-as-nobody") loadAsNobody(arguments);
-  if (words.at(0) == "stay") stay(arguments);
   if (words.at(0) == "restore") restore(arguments);
   if (words.at(0) == "back-up") backUp(arguments);
   if (words.at(0) == "write") write(arguments);

@@ -12,10 +12,6 @@ namespace QVSa::test {
 //                                   their count at the end, and one for each failure that is no clean collision
 //   hold SERVER RULE [written]      locks the rule's row as an issuer does, or has written to it too, without a
 //                                   commit; then "holding", and stays
-//   clear-log SERVER                clears type 1 of the log of QVSys: "clearing", then "cleared" or the failure
-//   load-as-nobody SERVER           gives up the rights of root and loads the administrator; the failure's number in
-//                                   hexadecimal and its text
-//   stay SERVER DATABASE            opens a connection to the database; "staying", and stays
 //   restore SERVER SYS APP PASSWORD restores the two files; "done", or the failure's number and text
 //   back-up SERVER SYS APP [SIZE]   backs up into the two files, on a disk that takes none above so many bytes; "done",
 //                                   or the failure's number and text

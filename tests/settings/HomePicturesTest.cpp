@@ -22,7 +22,7 @@ class HomePicturesTest : public test::SettingsScene {
   bool exists(const char* name) const { return std::filesystem::exists(local(name)); }
   Home fetched() {
     Home home;
-    EXPECT_TRUE(home.getImage(installation_.server())) << home.errDescription();
+    EXPECT_TRUE(home.getImage(server())) << home.errDescription();
     return home;
   }
 
@@ -71,7 +71,7 @@ TEST_F(HomePicturesTest, AHomeThatFetchedThePicturesSendsThemBack) {
   ASSERT_TRUE(home.Save());
 
   Home kept = fetched();
-  ASSERT_TRUE(kept.connect(installation_.server()));
+  ASSERT_TRUE(kept.connect(server()));
   kept.Fax("1");
   ASSERT_TRUE(kept.Save());
   EXPECT_EQ(platform::readFile(fetched().LoginImageFile()).size(), 5000U);
@@ -122,7 +122,7 @@ TEST_F(HomePicturesTest, APictureThatCannotBeMovedIsNoFailureAndToldToTheEventLo
 
   replace(&platform::Services::programFolder, {[this] { return (files_.path() / "nowhere").string(); }});
   Home other;
-  EXPECT_TRUE(other.getImage(installation_.server()));
+  EXPECT_TRUE(other.getImage(server()));
   EXPECT_EQ(other.LoginImageFile(), "");
   EXPECT_EQ(other.errDescription(), "Path not found");
 
@@ -130,7 +130,7 @@ TEST_F(HomePicturesTest, APictureThatCannotBeMovedIsNoFailureAndToldToTheEventLo
   std::filesystem::create_directories(files_.path() / "local" / "LoginImage");
   for (const char* image : {"LoginImage", "null"}) {
     store("UpdTime='20200101',LoginImage=" + String(image));
-    EXPECT_TRUE(other.getImage(installation_.server())) << "a folder is no picture, however new";
+    EXPECT_TRUE(other.getImage(server())) << "a folder is no picture, however new";
     EXPECT_EQ(other.LoginImageFile(), "");
     EXPECT_EQ(other.errDescription(), "Path/File access error");
   }
@@ -138,7 +138,7 @@ TEST_F(HomePicturesTest, APictureThatCannotBeMovedIsNoFailureAndToldToTheEventLo
 }
 
 TEST_F(HomePicturesTest, WithoutARowNothingIsFetched) {
-  plain_.run("delete from homeinfo");
+  tables_.run("delete from homeinfo");
   platform::writeFile(local("LoginImage"), Bytes{1});
   fetched();
   EXPECT_TRUE(exists("LoginImage"));

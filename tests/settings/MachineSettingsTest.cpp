@@ -24,7 +24,7 @@ class MachineSettingsTest : public test::SettingsScene {
   std::optional<String> value(const char* name) { return platform::openSettings(machineSettingsKey)->value(name); }
   void fetch() {
     Home home;
-    ASSERT_TRUE(home.getImage(installation_.server())) << home.errDescription();
+    ASSERT_TRUE(home.getImage(server())) << home.errDescription();
   }
 
   test::TestFolder root_;
@@ -79,7 +79,7 @@ TEST_F(MachineSettingsTest, ADirectoryIsNotAskedWhereItIsNotKnownHow) {
   home.ldEnabled(true);
   String items;
   EXPECT_EQ(home.getUsersFromLDS(items), platform::directoryUnreachable);
-  plain_.run("update users set uType=3,ldDn='cn=admin',accstate=0 where userLogin='Admin'");
+  tables_.run("update users set uType=3,ldDn='cn=admin',accstate=0 where userLogin='Admin'");
   User admin = connected<User>();
   EXPECT_FALSE(admin.GetOne(3, "Admin", true, "secret"));
   EXPECT_EQ(admin.errNumber(), messageNumber(1131));

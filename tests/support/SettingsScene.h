@@ -1,18 +1,13 @@
 #pragma once
 
-#include <gtest/gtest.h>
-
-#include "QVSa/settings/Home.h"
-#include "platform/Services.h"
-#include "tests/support/PlainSession.h"
-#include "tests/support/TestInstallation.h"
+#include "tests/support/Scene.h"
 
 namespace QVSa::test {
 
 // An installation with its settings, and a machine of its own: the program's folder, and no settings store.
-class SettingsScene : public ::testing::Test {
+class SettingsScene : public Scene {
  protected:
-  SettingsScene() : services_(platform::services()), plain_(installation_.server()) {
+  SettingsScene() : services_(platform::services()) {
     platform::Services services = services_;
     services.programFolder = [this] { return programFolder_.path().string(); };
     services.openSettings = [](const String&) { return nullptr; };
@@ -27,19 +22,11 @@ class SettingsScene : public ::testing::Test {
     platform::replaceServices(services);
   }
 
-  template <class Object>
-  Object connected() {
-    Object object;
-    EXPECT_TRUE(object.connect(installation_.server(), "QVApp")) << object.errDescription();
-    return object;
-  }
-  String stored(const String& column) { return plain_.text("select " + column + " from homeinfo where id=1"); }
-  void store(const String& assignments) { plain_.run("update homeinfo set " + assignments + " where id=1"); }
+  String stored(const String& column) { return tables_.text("select " + column + " from homeinfo where id=1"); }
+  void store(const String& assignments) { tables_.run("update homeinfo set " + assignments + " where id=1"); }
 
   platform::Services services_;
-  TestInstallation installation_;
   TestFolder programFolder_;
-  PlainSession plain_;
 };
 
 }  // namespace QVSa::test

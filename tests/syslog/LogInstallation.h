@@ -1,21 +1,17 @@
 #pragma once
 
-#include <gtest/gtest.h>
-
-#include "QVSa/syslog/LogRecords.h"
 #include "tests/support/EnvironmentLocale.h"
-#include "tests/support/FakeClock.h"
-#include "tests/support/PlainSession.h"
-#include "tests/support/TestInstallation.h"
+#include "tests/support/Scene.h"
 
 namespace QVSa::test {
 
 // An empty log of QVApp in an English system; it is 7 March 2024, 14:05:09.
-class LogInstallation : public testing::Test {
+class LogInstallation : public Scene {
  protected:
   LogInstallation() {
-    log_.connect(installation_.server(), "QVApp");
-    db_.run(
+    clock_.set(Date(2024, 3, 7, 14, 5, 9));
+    log_.connect(server(), "QVApp");
+    tables_.run(
         "insert into repTmps(rtUid,fullName) values('t1','Finance,Sales') insert into repTmps(rtUid,fullName) "
         "values('t2','Stock')");
   }
@@ -23,8 +19,8 @@ class LogInstallation : public testing::Test {
   // An entry with its id, as any other program may write one.
   void write(const String& logId, const String& time, const String& more = "", const String& values = "",
              Long type = 0) const {
-    db_.run("insert into syslog(logId,logtype,LogTime" + more + ") values('" + logId + "'," + text(type) + ",'" + time +
-            "'" + values + ")");
+    tables_.run("insert into syslog(logId,logtype,LogTime" + more + ") values('" + logId + "'," + text(type) + ",'" +
+                time + "'" + values + ")");
   }
 
   // The ids of the last query's rows, in order.
@@ -36,9 +32,6 @@ class LogInstallation : public testing::Test {
   }
 
   EnvironmentLocale locale_{"en_US.UTF-8"};
-  FakeClock clock_{Date(2024, 3, 7, 14, 5, 9)};
-  TestInstallation installation_;
-  PlainSession db_{installation_.server()};
   LogRecords log_;
 };
 

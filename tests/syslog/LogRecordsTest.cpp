@@ -30,26 +30,26 @@ TEST_F(LogWriting, AnEntryCarriesTheUsersNameAndLoginAndTheServersTime) {
   const String report = "t1";
   EXPECT_TRUE(log_.Add(1, 7, "Print's", "It's \"so\"", "s1", &record, &place, &report));
   EXPECT_TRUE(log_.Add(1, 2, "f", ""));
-  EXPECT_EQ(db_.rows("select logId,logtype,UserId,LogTime,UserLogin,FuncName,OpDesc,rcId,wiId,rtId,application,"
-                     "replacerName from syslog order by logId"),
+  EXPECT_EQ(tables_.rows("select logId,logtype,UserId,LogTime,UserLogin,FuncName,OpDesc,rcId,wiId,rtId,application,"
+                         "replacerName from syslog order by logId"),
             (Lines{"24030700000001|7|1|2024-03-07 14:05:09|Admin|Print's|It's \"so\"|r1|w1|t1|0|-",
                    "24030700000002|2|1|2024-03-07 14:05:09|Admin|f|||||0|-"}));
-  EXPECT_EQ(db_.text("select count(*) from syslog l,users u where l.UserId=u.userId and l.UserName=u.userName"
-                     " and computer=N'" +
-                     log_.computerName() + "'"),
+  EXPECT_EQ(tables_.text("select count(*) from syslog l,users u where l.UserId=u.userId and l.UserName=u.userName"
+                         " and computer=N'" +
+                         log_.computerName() + "'"),
             "2");
   EXPECT_EQ(log_.computerName(), platform::services().computerName());
 }
 
 TEST_F(LogWriting, AnEntryOfNobodyIsNotWrittenAndUsesANumberUp) {
   EXPECT_TRUE(log_.Add(99, 1, "f", "d"));
-  EXPECT_EQ(db_.text("select count(*) from syslog"), "0");
+  EXPECT_EQ(tables_.text("select count(*) from syslog"), "0");
   EXPECT_TRUE(log_.Add(1, 1, "f", "d"));
-  EXPECT_EQ(db_.text("select right(logId,1) from syslog"), "2");
+  EXPECT_EQ(tables_.text("select right(logId,1) from syslog"), "2");
 }
 
 TEST_F(LogWriting, AFailureIsToldBehindTheLogsOwnSentence) {
-  db_.run("delete from idRule where idName='_log'");
+  tables_.run("delete from idRule where idName='_log'");
   EXPECT_FALSE(log_.Add(1, 1, "f", "d"));
   EXPECT_EQ(log_.errNumber(), messageNumber(1502));
   EXPECT_EQ(log_.errDescription(), "Error in recording system log. " + LoadResString(1502));
@@ -57,16 +57,6 @@ TEST_F(LogWriting, AFailureIsToldBehindTheLogsOwnSentence) {
   LogRecords unconnected;
   EXPECT_FALSE(unconnected.Add(1, 1, "f", "d"));
   EXPECT_NE(unconnected.errNumber(), 0);
-}
-
-TEST_F(LogQueries, AFreshObjectHasNothingToShow) {
-  EXPECT_EQ(log_.dateCols() + log_.hiddenCols(), "");
-  EXPECT_EQ(log_.Count(), 0);
-  EXPECT_EQ(log_.recordset().State(), 0);
-  EXPECT_EQ(failureOf([&] { log_.Item(1); }), number::position);
-  EXPECT_FALSE(log_.Clear());
-  EXPECT_EQ(log_.GetDataMember("logs"), &log_.recordset());
-  EXPECT_EQ(log_.GetDataMember("users"), nullptr);
 }
 
 TEST_F(LogQueries, TheRowsStayBehindUnderCaptionsOfTheLanguage) {
@@ -87,7 +77,7 @@ TEST_F(LogQueries, TheRowsStayBehindUnderCaptionsOfTheLanguage) {
   for (const char* language : {"zh_CN.UTF-8", "zh_TW.UTF-8"}) {
     const test::EnvironmentLocale chinese{language};
     LogRecords log;
-    log.connect(installation_.server(), "QVApp");
+    log.connect(server(), "QVApp");
     ASSERT_TRUE(log.GetAll()) << log.errDescription();
     EXPECT_EQ(log.recordset()[2].Name(), LoadResString(1706));
     EXPECT_EQ(log.recordset()[4].asText(), LoadResString(1712));
