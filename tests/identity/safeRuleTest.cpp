@@ -34,7 +34,7 @@ TEST(SafeRule, TellsEachThingThatAPasswordLacks) {
     rule.hasSpecialChar(hasSpecialChar);
     EXPECT_EQ(rule.checkPwd(password), problems.empty()) << password;
     EXPECT_EQ(rule.errDescription(), problems) << password;
-    EXPECT_EQ(rule.errNumber(), problems.empty() ? 0 : messageNumber(3000));
+    EXPECT_TRUE(problems.empty() || rule.errNumber() == messageNumber(3000)) << password;
   }
 }
 
