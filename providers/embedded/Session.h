@@ -68,7 +68,9 @@ class EmbeddedSession : public ProviderSession {
   void backUpDatabase(const tsql::BackupDatabase& backup);
   void restoreDatabase(const tsql::RestoreDatabase& restore);
   void verifyBackup(const tsql::VerifyBackup& verify);
+  bool callProcedure(const tsql::Call& call);
   void changeOwner(const tsql::Call& call);
+  void takeApplicationLock(const tsql::Call& call);
   void requireNoTransaction() const;
 
   PooledHandle handle_;

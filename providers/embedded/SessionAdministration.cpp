@@ -62,9 +62,13 @@ bool EmbeddedSession::administer(const tsql::Statement& statement) {
   if (const auto* restore = std::get_if<tsql::RestoreDatabase>(&statement)) return restoreDatabase(*restore), true;
   if (const auto* verify = std::get_if<tsql::VerifyBackup>(&statement)) return verifyBackup(*verify), true;
   const auto* call = std::get_if<tsql::Call>(&statement);
-  if (!call || !sameName(call->procedure.name, "sp_changedbowner")) return false;
-  changeOwner(*call);
-  return true;
+  return call && callProcedure(*call);
+}
+
+bool EmbeddedSession::callProcedure(const tsql::Call& call) {
+  if (sameName(call.procedure.name, "sp_changedbowner")) return changeOwner(call), true;
+  if (sameName(call.procedure.name, "sp_getapplock")) return takeApplicationLock(call), true;
+  return false;
 }
 
 void EmbeddedSession::requireNoTransaction() const {
@@ -125,6 +129,18 @@ void EmbeddedSession::changeOwner(const tsql::Call& call) {
   const std::string login = call.arguments.size() == 1 ? call.arguments.front()->token.text : std::string();
   if (handle_->loginDigest(login).empty())
     throw sqlFailure(15007, "'" + login + "' is not a valid login or you do not have permission.");
+}
+
+// Of the modes and owners the exclusive lock of the transaction alone: it is let go at the transaction's end. A name
+// takes a table's place among the row locks, so that two names with one hash wait for each other.
+void EmbeddedSession::takeApplicationLock(const tsql::Call& call) {
+  const auto& arguments = call.arguments;
+  if (arguments.size() != 2 || !sameName(arguments[1]->token.text, "Exclusive"))
+    throw sqlFailure(15600, "An invalid parameter or option was specified for procedure 'sp_getapplock'.");
+  if (!marked_)
+    throw sqlFailure(15626, "You attempted to acquire a transactional application lock without an active transaction.");
+  RowLocks& locks = handle_->locks(database_);
+  while (!locks.tryLock("application lock " + arguments[0]->token.text, 0)) handle_->waitShortly();
 }
 
 }  // namespace QVSa::embedded

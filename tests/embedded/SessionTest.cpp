@@ -100,6 +100,16 @@ TEST_F(Sessions, AClaimedRowIsPassedOverWaitedForOrRefused) {
   EXPECT_EQ(all(*second_, "select n from t order by no"), "1 0 3");
 }
 
+TEST_F(Sessions, AnApplicationLockIsWaitedForAndEndsWithItsTransaction) {
+  const std::string lock = "begin transaction exec sp_getapplock N'a','Exclusive'";
+  first_->run({lock});
+  EXPECT_EQ(numberOf(*second_, lock), number::timeout);
+  second_->rollback();
+  second_->run({"begin transaction exec sp_getapplock N'b','Exclusive' update t set n=0 where no='b'"});
+  first_.reset();
+  second_->run({"exec sp_getapplock N'a','Exclusive'", false, std::chrono::seconds(1)});
+}
+
 TEST_F(Sessions, AWaitingWriteSeesWhatItWaitedFor) {
   first_->begin();
   EXPECT_EQ(all(*first_, claim), "1");
