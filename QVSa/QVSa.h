@@ -1,8 +1,10 @@
 #pragma once
 
-// Every public class of the library.
+// Every public class of the library, and what hosts need beside them.
 #include "QVSa/classification/AclRule.h"
 #include "QVSa/classification/Directory.h"
+#include "QVSa/hosting/Collisions.h"
+#include "QVSa/hosting/SignOn.h"
 #include "QVSa/identity/Session.h"
 #include "QVSa/identity/Sessions.h"
 #include "QVSa/identity/User.h"

@@ -1,7 +1,8 @@
+#include "QVSa/hosting/SignOn.h"
+
 #include <memory>
 
 #include "QVSa/identity/Sessions.h"
-#include "QVSa/identity/User.h"
 #include "console/Commands.h"
 #include "console/Passwords.h"
 #include "console/Table.h"
@@ -17,16 +18,16 @@ struct Options {
 };
 
 Answer signOn(const Console& console, const Options& options) {
-  User user;
-  console.connect(user);
-  String session;
-  require(user.loginAuth(options.login, askPassword("Password of " + options.login), &session, false, options.address,
-                         options.computer),
-          user);
+  SignOn entrance;
+  console.connect(entrance);
+  const String password = askPassword("Password of " + options.login);
+  require(entrance.signOn(options.login, password, false, options.address, options.computer), entrance);
+  const String& session = entrance.sessionId();
   // The library lets an expired password in without a session, for its change alone.
   if (session.empty())
-    throw Refusal(user.errDescription() + " Change it with: qvsa password " + options.login, user.errNumber());
+    throw Refusal(entrance.errDescription() + " Change it with: qvsa password " + options.login, entrance.errNumber());
 
+  const User& user = entrance.user();
   Sheet sheet;
   sheet.line("Session", "session", session).line("Login", "login", user.Login()).line("Name", "name", user.Name());
   sheet.line("Department", "department", user.deptFullName()).line("Organisation", "organisation", user.orgFullName());
@@ -43,12 +44,12 @@ void endSession(const Console& console, const String& session) {
 
 // The old password goes through a sign-on, so that wrong ones are counted and a locked account stays closed.
 Answer changePassword(const Console& console, const String& login) {
-  User user;
-  console.connect(user);
+  SignOn entrance;
+  console.connect(entrance);
   const String oldPassword = askPassword("Present password of " + login);
-  String session;
-  require(user.loginAuth(login, oldPassword, &session), user);
-  if (!session.empty()) endSession(console, session);
+  require(entrance.signOn(login, oldPassword), entrance);
+  if (!entrance.sessionId().empty()) endSession(console, entrance.sessionId());
+  User& user = entrance.user();
   if (user.PwdNoChange()) throw Refusal(login + " may not change the password.");
   require(user.chgPwd(oldPassword, askNewPassword("New password")), user);
   return {"The password of " + login + " is changed.\n", {{"login", login}, {"changed", true}}};

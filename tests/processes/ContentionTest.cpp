@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <chrono>
+#include <cstdlib>
 #include <random>
 #include <set>
 #include <thread>
@@ -28,6 +29,8 @@ class Contention : public Scene {
   static void go(std::vector<Worker>& workers) {
     for (Worker& worker : workers) worker.go();
   }
+  // With QVSA_LONG_TESTS set, the contention is that of a large installation.
+  static bool isLong() { return std::getenv("QVSA_LONG_TESTS") != nullptr; }
   // The numbers from 1 on, as a rule without prefix issues them on the day of the scene.
   static std::set<String> numbersUpTo(Long last) {
     std::set<String> result;
@@ -52,6 +55,36 @@ TEST_F(Contention, AThousandWrongPasswordsFromEightProcessesAreAllCounted) {
   EXPECT_FALSE(ann.loginAuth("ann", "right"));
   EXPECT_EQ(ann.errDescription(), "The account has been locked.");
   EXPECT_EQ(tables_.text("select lgts,accstate from users where userLogin='ann'"), "0|1");
+}
+
+TEST_F(Contention, ASignOnOfPeopleIsNotRefusedForTheOthersOfTheMoment) {
+  const int clients = isLong() ? 16 : 6;
+  std::vector<Worker> workers;
+  for (int i = 0; i < clients; ++i) {
+    const String login = "user" + std::to_string(i);
+    addUser(login);
+    workers.push_back(std::move(start(1, "sign-on", {login, isLong() ? "200" : "10"}).front()));
+  }
+  go(workers);
+  for (Worker& worker : workers) EXPECT_EQ(worker.lines(), Lines{"done"});
+}
+
+TEST_F(Contention, GuessesThatComeAtOnceAreNotAnsweredBeyondTheLimit) {
+  constexpr int clients = 8, limit = 3;
+  addUser("ann");
+  savePolicy([](safeRule& rule) {
+    rule.lockErr(true);
+    rule.errTimes(limit);
+  });
+  auto workers = start(clients, "guess", {isLong() ? "125" : "10"});
+  go(workers);
+  int told = 0;
+  for (Worker& worker : workers) {
+    const Lines lines = worker.lines();
+    ASSERT_EQ(lines.size(), 1U) << lines.front();
+    told += std::stoi(lines[0].substr(5));
+  }
+  EXPECT_EQ(told, limit - 1) << "the one that reaches the limit is told of the lock";
 }
 
 TEST_F(Contention, NoNumberIsIssuedTwiceAndNoneIsLost) {

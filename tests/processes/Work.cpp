@@ -34,6 +34,29 @@ void wrongPasswords(const Words& words) {
   writeLine("done");
 }
 
+void signOn(const Words& words) {
+  for (int left = std::stoi(words.at(2)); left > 0; --left) {
+    SignOn entrance;
+    entrance.connect(words.at(0), "QVApp");
+    if (!entrance.signOn(words.at(1), "right") || entrance.sessionId().empty())
+      writeLine(failureText(entrance.errNumber(), entrance.errDescription()));
+  }
+  writeLine("done");
+}
+
+void guess(const Words& words) {
+  int told = 0;
+  for (int left = std::stoi(words.at(1)); left > 0; --left) {
+    SignOn entrance;
+    entrance.connect(words.at(0), "QVApp");
+    if (entrance.signOn("ann", "wrong") || entrance.errNumber() == messageNumber(1106))
+      ++told;
+    else if (entrance.errNumber() != messageNumber(1118))
+      writeLine(failureText(entrance.errNumber(), entrance.errDescription()));
+  }
+  writeLine("told " + std::to_string(told));
+}
+
 bool isCollision(const IdMgr& rule) {
   return rule.errNumber() == number::integrity &&
          rule.errDescription().rfind("Error in creating new table ID.", 0) == 0;
@@ -165,6 +188,8 @@ int doWork(const Words& words) {
   std::cin.get();
   const Words arguments(words.begin() + 1, words.end());
   if (words.at(0) == "wrong-passwords") wrongPasswords(arguments);
+  if (words.at(0) == "sign-on") signOn(arguments);
+  if (words.at(0) == "guess") guess(arguments);
   if (words.at(0) == "issue") issue(arguments);
   if (words.at(0) == "hold") hold(arguments);
   if (words.at(0) == "clear-log") clearLog(arguments);
