@@ -4,6 +4,7 @@
 #include "QVSa/classification/AclRule.h"
 #include "QVSa/classification/Directory.h"
 #include "QVSa/hosting/Collisions.h"
+#include "QVSa/hosting/Installation.h"
 #include "QVSa/hosting/SignOn.h"
 #include "QVSa/identity/Session.h"
 #include "QVSa/identity/Sessions.h"

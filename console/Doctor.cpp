@@ -1,4 +1,4 @@
-#include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/hosting/Installation.h"
 #include "QVSa/identity/Sessions.h"
 #include "QVSa/identity/User.h"
 #include "QVSa/identity/safeRule.h"
@@ -116,7 +116,7 @@ Answer doctor(const Console& console) {
   checkRule(server, "QVSys", findings, "_ses");
   for (const char* name : {"_log", "_RC"}) checkRule(server, console.place().database, findings, name);
   checkAdministrator(console, findings);
-  if (secrets::builtInSecrets)
+  if (Installation::hasBuiltInSecrets())
     findings.warn("Deployment secrets", "the built-in ones, which everybody knows");
   else
     findings.good("Deployment secrets");

@@ -1,20 +1,14 @@
+#include <filesystem>
 #include <memory>
 
-#include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/identity/User.h"
+#include "QVSa/hosting/Installation.h"
 #include "console/Commands.h"
 #include "console/Passwords.h"
 #include "console/Table.h"
-#include "database/Scripts.h"
-#include "providers/embedded/Installation.h"
 
 namespace QVSa::console {
 
 namespace {
-
-constexpr const char* administrator = "Admin";
-constexpr const char* administratorsJob = "1";
 
 struct Options {
   String folder;
@@ -33,33 +27,12 @@ Chosen choose(const String& whose, bool makeUp) {
   return {given, false};
 }
 
-std::filesystem::path targetFolder(const Console& console, const Options& options) {
-  if (!options.folder.empty()) return std::filesystem::absolute(options.folder).lexically_normal();
+String targetFolder(const Console& console, const Options& options) {
+  if (!options.folder.empty()) return std::filesystem::absolute(options.folder).lexically_normal().string();
   const auto folder = folderOf(console.place().server);
   if (!folder)
     throw Misuse("An installation is made in a folder: name one, or a --server of the form \"file:FOLDER\".");
   return *folder;
-}
-
-void install(const std::filesystem::path& folder, const String& saPassword) {
-  embedded::InstallationPlan plan;
-  plan.folder = folder;
-  plan.userPassword = defaultDbPwd();
-  plan.adminPassword = saPassword;
-  plan.scripts = {
-      {"QVSys", String(database::qvSys)}, {"QVApp", String(database::qvApp)}, {"QVUpdate", String(database::qvUpdate)}};
-  embedded::createInstallation(plan);
-}
-
-// The first row of the administrator is locked and without a password; his first save opens it.
-void setAdministratorsPassword(const String& server, const Console& console, const String& password) {
-  User user;
-  require(user.connect(server, console.place().database), user);
-  require(user.GetOne(3, administrator), user);
-  user.Pwd(password);
-  user.regState(0);
-  user.setJobs(administratorsJob);
-  require(user.Save(), user);
 }
 
 Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
@@ -69,10 +42,10 @@ Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
   if (sa.madeUp) sheet.line("Password of sa", "saPassword", sa.password);
   Answer answer;
   answer.document = sheet.document();
-  answer.document["builtInSecrets"] = secrets::builtInSecrets;
+  answer.document["builtInSecrets"] = Installation::hasBuiltInSecrets();
   answer.text = "The installation is made.\n\n" + sheet.text();
   if (admin.madeUp || sa.madeUp) answer.text += "\nMade-up passwords are shown this once: note them down.\n";
-  if (secrets::builtInSecrets)
+  if (Installation::hasBuiltInSecrets())
     answer.text +=
         "\nThis build uses the deployment secrets that come with the source, which everybody knows. Build with a "
         "header of\n"
@@ -82,19 +55,14 @@ Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
 }
 
 Answer init(const Console& console, const Options& options) {
-  const auto folder = targetFolder(console, options);
-  // The first two end a server text, the third the name of a file in the statement of a restore, and the last one parts
-  // folders in the paths of backups.
-  if (folder.string().find_first_of(";|'\\") != String::npos)
-    throw Misuse("The path of an installation must hold none of ; | ' and \\.");
-  if (embedded::isInstallation(folder)) throw Refusal("There is an installation in " + folder.string() + " already.");
-  const Chosen admin = choose(administrator, options.makePasswords);
+  const String folder = targetFolder(console, options);
+  if (!Installation::canLieIn(folder)) throw Misuse("The path of an installation must hold none of ; | ' and \\.");
+  if (Installation::isThere(folder)) throw Refusal("There is an installation in " + folder + " already.");
+  const Chosen admin = choose("Admin", options.makePasswords);
   const Chosen sa = choose("sa, the log-in that restores backups", options.makePasswords);
-  if (sa.password.find(';') != String::npos) throw Misuse("The password of sa must hold no semicolon.");
-  const String server = "file:" + folder.string();
-  install(folder, sa.password);
-  setAdministratorsPassword(server, console, admin.password);
-  return answerOf(server, admin, sa);
+  Installation installation;
+  require(installation.make(folder, admin.password, sa.password), installation);
+  return answerOf(Installation::serverOf(folder), admin, sa);
 }
 
 }  // namespace

@@ -196,6 +196,7 @@ void fill(const fs::path& folder, const InstallationPlan& plan) {
     addLogin(*handle, "sa", plan.adminPassword);
   }
   for (const auto& script : plan.scripts) runScript(folder, script.database, script.script);
+  if (plan.lastStep) plan.lastStep(folder);
 }
 
 void makeParent(const fs::path& folder) {
