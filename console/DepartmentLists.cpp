@@ -2,6 +2,7 @@
 #include <map>
 #include <memory>
 
+#include "QVSa/hosting/SafeTexts.h"
 #include "QVSa/organisation/Departments.h"
 #include "console/Commands.h"
 #include "console/Lookup.h"
@@ -21,7 +22,7 @@ void read(const Console& console, const Options& options, Departments& departmen
   if (options.byLevel) {
     require(departments.GetAllWithLevel(), departments);
   } else {
-    const String ids = options.top.empty() ? "" : text(departmentOf(console, options.top).InnerId());
+    const String ids = options.top.empty() ? "" : idList({departmentOf(console, options.top).InnerId()});
     require(departments.GetAll(-1, ids), departments);
   }
 }

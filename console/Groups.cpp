@@ -1,5 +1,6 @@
 #include <memory>
 
+#include "QVSa/hosting/SafeTexts.h"
 #include "QVSa/organisation/userGroups.h"
 #include "console/Commands.h"
 #include "console/Lookup.h"
@@ -56,12 +57,12 @@ Answer add(const Console& console, const Options& options) {
 // Both settings are by the whole list: what is not named is left out.
 Answer set(const Console& console, const Options& options) {
   userGroup group = groupOf(console, options.name);
-  std::vector<String> ids;
-  for (const String& login : options.members) ids.push_back(text(userOf(console, login).Id()));
+  std::vector<Long> ids;
+  for (const String& login : options.members) ids.push_back(userOf(console, login).Id());
   for (const String& role : options.roles) roleOf(console, role);
   const bool setsMembers = options.clearsMembers || !ids.empty();
   const bool setsRoles = options.clearsRoles || !options.roles.empty();
-  if (setsMembers) require(group.SetUsers(join(ids, ",")), group);
+  if (setsMembers) require(group.SetUsers(idList(ids)), group);
   if (setsRoles && !group.SetRoles(join(options.roles, ",")))
     throw Refusal((setsMembers ? "The members are set, the roles are not: " : "") + group.errDescription(),
                   group.errNumber());

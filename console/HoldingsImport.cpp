@@ -2,6 +2,7 @@
 
 #include <set>
 
+#include "QVSa/hosting/SafeTexts.h"
 #include "QVSa/organisation/Jobs.h"
 #include "QVSa/organisation/Role.h"
 #include "console/Progress.h"
@@ -25,10 +26,10 @@ void HoldingsImport::run() {
   }
 }
 
-String HoldingsImport::departmentId(const String& number) const {
+Long HoldingsImport::departmentId(const String& number) const {
   const auto department = departments_.Item(number);
   if (!department) throw Refusal("There is no department " + number + ".");
-  return text(department->InnerId());
+  return department->InnerId();
 }
 
 void HoldingsImport::importRole(const Rows& rows) {
@@ -45,7 +46,7 @@ void HoldingsImport::importRole(const Rows& rows) {
 
   readJobs(name);
   std::set<Job> seen;
-  std::vector<String> missing;
+  std::vector<Long> missing;
   for (const HoldingRow* row : rows) {
     const Job job = jobOf(row->role, row->department);
     if (!seen.insert(job).second) continue;
@@ -54,7 +55,7 @@ void HoldingsImport::importRole(const Rows& rows) {
     if (!isThere && !dryRun_) missing.push_back(departmentId(row->department));
   }
   if (missing.empty()) return;
-  require(role.setJobs(join(missing, ",")), role);
+  require(role.setJobs(idList(missing)), role);
   readJobs(name);
 }
 
@@ -74,18 +75,18 @@ void HoldingsImport::importHolder(const String& login, const Rows& rows) {
     require(jobs.GetAll("", "", userId), jobs);
     for (const auto& job : jobs) held.insert(job->Id());
   }
-  std::vector<String> pairs;
+  std::vector<std::pair<Long, Long>> pairs;
   for (const HoldingRow* row : rows) {
     const auto job = jobIds_.find(jobOf(row->role, row->department));
     const bool isThere = job != jobIds_.end();
     if (!isThere && !dryRun_) throw Refusal("The job " + row->role + " could not be made in " + row->department + ".");
     const bool holds = isThere && !held.insert(job->second).second;
     ++(holds ? holders_.unchanged : holders_.added);
-    if (!holds && !dryRun_) pairs.push_back(text(userId) + "," + text(job->second));
+    if (!holds && !dryRun_) pairs.emplace_back(userId, job->second);
   }
   Role role;
   console_.connect(role);
-  if (!role.UpdateUsers(join(pairs, "|"), "")) throw Refusal(login + ": " + role.errDescription(), role.errNumber());
+  if (!role.UpdateUsers(idPairs(pairs), "")) throw Refusal(login + ": " + role.errDescription(), role.errNumber());
 }
 
 }  // namespace QVSa::console

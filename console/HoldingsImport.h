@@ -41,7 +41,7 @@ class HoldingsImport {
   void importRole(const Rows& rows);
   void importHolder(const String& login, const Rows& rows);
   void readJobs(const String& role);
-  String departmentId(const String& number) const;
+  Long departmentId(const String& number) const;
 
   const Console& console_;
   const std::vector<HoldingRow>& holdings_;

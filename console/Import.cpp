@@ -2,6 +2,7 @@
 #include <memory>
 #include <optional>
 
+#include "QVSa/hosting/UserKeeping.h"
 #include "QVSa/identity/User.h"
 #include "QVSa/identity/safeRule.h"
 #include "QVSa/organisation/Department.h"
@@ -10,7 +11,6 @@
 #include "console/Passwords.h"
 #include "console/Progress.h"
 #include "console/Table.h"
-#include "console/UserKeeping.h"
 
 namespace QVSa::console {
 
@@ -152,7 +152,9 @@ void Import::changeUser(const UserRow& row, User& user) {
   require(department.GetOne(1, row.department), department);
   user.Name(row.name);
   user.setDept(department);
-  saveKept(console_, user);
+  UserKeeping keeping;
+  console_.connect(keeping);
+  save(row.login, keeping.save(user), keeping);
 }
 
 void Import::choosePassword() {

@@ -3,6 +3,7 @@
 #include <memory>
 #include <optional>
 
+#include "QVSa/hosting/SafeTexts.h"
 #include "QVSa/organisation/Departments.h"
 #include "console/Commands.h"
 #include "console/Lookup.h"
@@ -36,11 +37,9 @@ Answer list(const Console& console, const Options& options) {
 
 // By level, since names repeat in different branches.
 Answer chain(const Console& console, const Options& options) {
-  std::vector<String> ids;
-  for (const Long id : options.jobs) ids.push_back(text(id));
   Departments departments;
   console.connect(departments);
-  require(departments.getAllSuperWithLevel(join(ids, ",")), departments);
+  require(departments.getAllSuperWithLevel(idList(options.jobs)), departments);
   Table table({{"Department", "department"}, {"Full name", "fullName"}});
   for (const auto& department : departments) table.row({department->Id(), department->fullName()});
   return {table.text(), {{"departments", table.document()}}};

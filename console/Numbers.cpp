@@ -1,5 +1,8 @@
 #include <memory>
+#include <optional>
 
+#include "QVSa/hosting/Collisions.h"
+#include "QVSa/hosting/RuleKeeping.h"
 #include "QVSa/numbering/IdMgrs.h"
 #include "console/Commands.h"
 #include "console/Table.h"
@@ -18,6 +21,16 @@ struct Options {
   Integer reuse = noReuse;
   bool whenSaved = false;
   Long start = 0;
+};
+
+// What is not given stays as it is.
+struct Changes {
+  String rule;
+  std::optional<String> prefix;
+  std::optional<Integer> date;
+  std::optional<Integer> digits;
+  std::optional<Integer> reuse;
+  bool withNumbers = false;
 };
 
 const std::map<String, Integer> dates{{"none", noDate},       {"yymm", yymm}, {"yyyymm", yyyymm}, {"yymmdd", yymmdd},
@@ -41,7 +54,8 @@ IdMgr load(const Console& console, const String& name) {
 Answer issue(const Console& console, const Options& options) {
   IdMgr rule;
   console.connect(rule);
-  const String number = rule.newId(options.rule, "", -1, options.record, options.session);
+  const String number =
+      repeatCollided(rule, [&] { return rule.newId(options.rule, "", -1, options.record, options.session); });
   require(!number.empty(), rule);
   return {number + "\n", {{"rule", options.rule}, {"number", number}}};
 }
@@ -88,9 +102,24 @@ Answer add(const Console& console, const Options& options) {
   return answer;
 }
 
+// Changes what is named.
+Answer set(const Console& console, const Changes& changes) {
+  IdMgr rule = load(console, changes.rule);
+  if (changes.prefix) rule.preFix(*changes.prefix);
+  if (changes.date) rule.DateFormat(*changes.date);
+  if (changes.digits) rule.numPlace(*changes.digits);
+  if (changes.reuse) rule.reuseStyle(*changes.reuse);
+  RuleKeeping keeping;
+  console.connect(keeping);
+  require(keeping.save(rule, changes.withNumbers), keeping);
+  Answer answer = show(console, changes.rule);
+  answer.text = "The rule is changed.\n\n" + answer.text;
+  return answer;
+}
+
 Answer start(const Console& console, const Options& options) {
   IdMgr rule = load(console, options.rule);
-  require(rule.setStartNo(options.start), rule);
+  require(repeatCollided(rule, [&] { return rule.setStartNo(options.start); }), rule);
   return {"The next number of " + options.rule + " is " + std::to_string(options.start) + ", in the present period.\n",
           {{"rule", options.rule}, {"next", options.start}}};
 }
@@ -117,6 +146,20 @@ void addRules(Console& console, CLI::App* number, const std::shared_ptr<Options>
       ->transform(CLI::CheckedTransformer(reuses, CLI::ignore_case));
   addCommand->add_flag("--when-saved", options->whenSaved, "For the hosts: give the number at saving time");
   console.command(addCommand, [&console, options] { return add(console, *options); });
+
+  const auto changes = std::make_shared<Changes>();
+  CLI::App* setCommand = group->add_subcommand("set", "Change a rule; what is not named stays");
+  setCommand->add_option("rule", changes->rule)->required();
+  setCommand->add_option("--prefix", changes->prefix);
+  setCommand->add_option("--date", changes->date, "The date part, and with it the period of the sequence")
+      ->transform(CLI::CheckedTransformer(dates, CLI::ignore_case));
+  setCommand->add_option("--digits", changes->digits, "Digits of the sequence; they can only grow once numbers exist")
+      ->check(CLI::Range(1, 14));
+  setCommand->add_option("--reuse", changes->reuse, "Which released numbers may come again")
+      ->transform(CLI::CheckedTransformer(reuses, CLI::ignore_case));
+  setCommand->add_flag("--with-numbers", changes->withNumbers,
+                       "Change the date part though the present period has numbers: some may come twice");
+  console.command(setCommand, [&console, changes] { return set(console, *changes); });
 }
 
 }  // namespace

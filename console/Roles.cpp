@@ -2,6 +2,7 @@
 
 #include <memory>
 
+#include "QVSa/hosting/SafeTexts.h"
 #include "QVSa/organisation/Jobs.h"
 #include "QVSa/organisation/Users.h"
 #include "console/Commands.h"
@@ -51,10 +52,10 @@ Answer add(const Console& console, const Options& options) {
 }
 
 String innerIds(const Console& console, const std::vector<String>& numbers) {
-  std::vector<String> ids;
+  std::vector<Long> ids;
   ids.reserve(numbers.size());
-  for (const String& number : numbers) ids.push_back(text(departmentOf(console, number).InnerId()));
-  return join(ids, ",");
+  for (const String& number : numbers) ids.push_back(departmentOf(console, number).InnerId());
+  return idList(ids);
 }
 
 Answer set(const Console& console, const Options& options) {
@@ -63,16 +64,16 @@ Answer set(const Console& console, const Options& options) {
   return jobs(console, options.role);
 }
 
-String jobOf(Role& role, const Department& department) {
+Long jobOf(Role& role, const Department& department) {
   const Long job = role.GetJobIdOfTheDept(text(department.InnerId()));
   if (job < 1) throw Refusal(role.errDescription() + " (" + department.Id() + ")", role.errNumber());
-  return text(job);
+  return job;
 }
 
 Answer hold(const Console& console, const Options& options, bool gives) {
   Role role = roleOf(console, options.role);
-  const String pair =
-      text(userOf(console, options.login).Id()) + "," + jobOf(role, departmentOf(console, options.department));
+  const Long user = userOf(console, options.login).Id();
+  const String pair = idPairs({{user, jobOf(role, departmentOf(console, options.department))}});
   require(gives ? role.UpdateUsers(pair, "") : role.UpdateUsers("", pair), role);
   return {
       options.login + (gives ? " holds " : " no longer holds ") + options.role + " in " + options.department + ".\n",

@@ -1,13 +1,10 @@
-#include <algorithm>
 #include <filesystem>
 #include <map>
 #include <memory>
 #include <optional>
 
-#include "QVSa/frame/Connection.h"
-#include "QVSa/frame/ConnectionString.h"
+#include "QVSa/hosting/HomeKeeping.h"
 #include "console/Commands.h"
-#include "console/LoginFolder.h"
 #include "console/Passwords.h"
 #include "console/SettingsList.h"
 #include "console/Switch.h"
@@ -33,13 +30,11 @@ struct Options {
   String folder = ".";
 };
 
-// The settings with the pictures in `folder`, so that a save sends back what it does not change.
-Home load(const Console& console) {
+// The settings, with what has to come back unchanged from a save.
+Home load(const Console& console, HomeKeeping& keeping) {
+  console.connect(keeping);
   Home home;
-  require(home.getImage(console.place().server, console.place().database), home);
-  // A picture that did not come would be cleared by the next save.
-  if (!home.errDescription().empty()) throw Refusal("A picture can't be fetched: " + home.errDescription());
-  console.connect(home);
+  require(keeping.load(home), keeping);
   return home;
 }
 
@@ -56,9 +51,8 @@ Answer shown(const Home& home) {
 }
 
 Answer show(const Console& console) {
-  const PrivateFolder folder;
-  const LoginFolder there(folder.path());
-  return shown(load(console));
+  HomeKeeping keeping;
+  return shown(load(console, keeping));
 }
 
 template <class Value>
@@ -83,72 +77,57 @@ void requireDirectoryOn(const Home& home, const Options& options) {
     throw Misuse("The settings of the directory are kept only while it is on: add --directory.");
 }
 
-void save(Home& home, const Options& options) {
-  if (home.Save()) return;
+void save(HomeKeeping& keeping, Home& home, const Options& options) {
+  if (keeping.save(home)) return;
   constexpr Long cannotBeScrambled = 5;
-  if (options.directoryPassword && home.errNumber() == cannotBeScrambled)
+  if (options.directoryPassword && keeping.errNumber() == cannotBeScrambled)
     throw Refusal("This password for the directory can't be stored (not every one can): choose another.", 5);
-  require(false, home);
+  require(false, keeping);
 }
 
-// The class has no way to set it: only the row decides.
-void setDirectoryPort(const Console& console, Long port) {
-  try {
-    Connection connection;
-    connection.Open(buildConnString(console.place().server, console.place().database, false));
-    connection.Execute("update homeinfo set LDport=" + std::to_string(port) + " where id=1");
-  } catch (const Failure& failure) {
-    throw Refusal("The settings are stored, the port is not: " + failure.description(), failure.number());
-  }
+void setDirectoryPort(HomeKeeping& keeping, Long port) {
+  if (!keeping.setDirectoryPort(port))
+    throw Refusal("The settings are stored, the port is not: " + keeping.errDescription(), keeping.errNumber());
 }
 
 Answer set(const Console& console, const Options& options) {
-  const PrivateFolder folder;
-  const LoginFolder there(folder.path());
-  Home home = load(console);
+  HomeKeeping keeping;
+  Home home = load(console, keeping);
   apply(home, textSettings(), options.texts);
   apply(home, flagSettings(), options.flags);
   apply(home, shortSettings(), options.shorts);
   apply(home, longSettings(), options.longs);
   requireDirectoryOn(home, options);
   askPasswords(home, options);
-  save(home, options);
-  if (options.directoryPort) setDirectoryPort(console, *options.directoryPort);
-  Answer answer = shown(load(console));
+  save(keeping, home, options);
+  if (options.directoryPort) setDirectoryPort(keeping, *options.directoryPort);
+  Answer answer = shown(load(console, keeping));
   answer.text = "The settings are stored.\n\n" + answer.text;
   return answer;
 }
 
-String localFile(const String& path) {
-  if (!std::filesystem::is_regular_file(path)) throw Refusal("There is no file " + path + ".");
-  return std::filesystem::absolute(path).string();
-}
+String localFile(const String& path) { return std::filesystem::absolute(path).string(); }
 
 Answer setPictures(const Console& console, const Options& options) {
-  const PrivateFolder folder;
-  const LoginFolder there(folder.path());
-  Home home = load(console);
+  HomeKeeping keeping;
+  Home home = load(console, keeping);
   if (!options.loginImage.empty()) home.LoginImageFile(localFile(options.loginImage));
   if (!options.icon.empty()) home.customFormIcon(localFile(options.icon));
   if (options.noLoginImage) home.LoginImageFile("");
   if (options.noIcon) home.customFormIcon("");
-  require(home.Save(), home);
-  if (!home.errDescription().empty()) throw Refusal("A picture can't be sent: " + home.errDescription());
+  require(keeping.save(home), keeping);
   const Json document = {{"login-image", !home.LoginImageFile().empty()}, {"icon", !home.customFormIcon().empty()}};
   return {"The pictures are stored.\n", document};
 }
 
-String slashed(String path) {
-  std::replace(path.begin(), path.end(), '\\', '/');
-  return path;
-}
-
 Answer fetchPictures(const Console& console, const String& folder) {
-  const LoginFolder there(std::filesystem::absolute(folder).lexically_normal());
-  const Home home = load(console);
+  HomeKeeping keeping;
+  console.connect(keeping);
+  String loginImage, icon;
+  require(keeping.fetchPictures(std::filesystem::absolute(folder).lexically_normal().string(), loginImage, icon),
+          keeping);
   Sheet sheet;
-  sheet.line("Picture of the login screen", "login-image", slashed(home.LoginImageFile()));
-  sheet.line("Icon", "icon", slashed(home.customFormIcon()));
+  sheet.line("Picture of the login screen", "login-image", loginImage).line("Icon", "icon", icon);
   return {sheet.text(), sheet.document()};
 }
 
@@ -175,7 +154,7 @@ void addSet(Console& console, CLI::App* group, const std::shared_ptr<Options>& o
 
 void addPictures(Console& console, CLI::App* group, const std::shared_ptr<Options>& options) {
   CLI::App* pictures = group->add_subcommand("pictures", "The pictures of the login screen")->require_subcommand(1);
-  CLI::App* fetch = pictures->add_subcommand("fetch", "Bring LoginImage and formicon.ico to a folder, as far as newer");
+  CLI::App* fetch = pictures->add_subcommand("fetch", "Bring LoginImage and formicon.ico to a folder");
   fetch->add_option("folder", options->folder)->check(CLI::ExistingDirectory);
   console.command(fetch, [&console, options] { return fetchPictures(console, options->folder); });
 

@@ -1,10 +1,10 @@
 #include <memory>
 
+#include "QVSa/hosting/UserKeeping.h"
 #include "console/Commands.h"
 #include "console/Lookup.h"
 #include "console/Passwords.h"
 #include "console/Table.h"
-#include "console/UserKeeping.h"
 
 namespace QVSa::console {
 
@@ -95,11 +95,12 @@ Answer add(const Console& console, const Options& options) {
 }
 
 Answer unlock(const Console& console, const String& login) {
-  User user = userOf(console, login);
+  const User user = userOf(console, login);
   if (!user.locked()) throw Refusal(login + " is not locked; the state of the account is: " + stateOf(user) + ".");
-  user.regState(0);
-  saveKept(console, user);
-  return {login + " is unlocked; the validity of the password begins anew.\n", {{"login", login}, {"unlocked", true}}};
+  UserKeeping keeping;
+  console.connect(keeping);
+  require(keeping.unlock(user.Id()), keeping);
+  return {login + " is unlocked.\n", {{"login", login}, {"unlocked", true}}};
 }
 
 }  // namespace

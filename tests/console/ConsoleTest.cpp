@@ -59,8 +59,9 @@ TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   EXPECT_EQ(wrong.exitCode, 1);
   EXPECT_EQ(wrong.error(), "0x80040452");
   EXPECT_EQ(run("sign-on nobody", "x\n").error(), "0x8004044D");
-  for (const char* misuse : {"", "dept show", "sign-on Admin --password x", "no-such-command",
-                             "number rule add x --reuse often", "init \"it's\"", "init 'a\\b'"})
+  for (const char* misuse :
+       {"", "dept show", "sign-on Admin --password x", "no-such-command", "number rule add x --reuse often",
+        "init \"it's\"", "doctor --database 'a b'", "init 'a\\b'"})
     EXPECT_EQ(run(misuse, "x\n").exitCode, 2) << misuse;
   EXPECT_EQ(run("sign-on Admin", "").exitCode, 2);
   name_ = "missing";
@@ -133,6 +134,9 @@ TEST_F(Program, NumbersFollowTheirRuleAndItsStart) {
   run("number start order 50");
   EXPECT_EQ(run("number issue order").document["number"], "O-0050");
   EXPECT_EQ(run("number rule list").document["rules"].size(), 1U);
+  EXPECT_EQ(run("number rule set order --date yymm").error(), "5") << "there are numbers";
+  EXPECT_EQ(run("number rule set order --prefix P- --digits 5").document["sample"], "P-00001");
+  EXPECT_EQ(run("number rule set order --date yymm --with-numbers").document["date"], "yymm");
   EXPECT_EQ(run("number rule add order").error(), "0x80040E2F");
   EXPECT_EQ(run("number issue nothing").error(), "0x800405DE");
 }
