@@ -5,10 +5,10 @@
 #include <optional>
 #include <set>
 
+#include "QVSa/hosting/PlanRuns.h"
 #include "QVSa/maintenance/BKPlans.h"
 #include "QVSa/maintenance/QVAgent.h"
 #include "console/Commands.h"
-#include "console/SystemRows.h"
 #include "console/Table.h"
 #include "console/Waiting.h"
 #include "platform/Services.h"
@@ -99,20 +99,20 @@ class Agent {
   // where that stays pending: a task of another type, or a plan that could not be run. Each is tried once.
   void runAllOf(Date due) {
     const Date end = due.addDays(1 / secondsOfDay);
-    const auto rows = systemRows(console_,
-                                 "select a.taskId,b.schNo from tasks a,QVTaskSche b where a.taskId=b.taskId and "
-                                 "a.taskType=2 and b.state=0 and b.pTime>='" +
-                                     due.sqlText() + "' and b.pTime<'" + end.sqlText() + "' order by b.pTime,a.taskId");
+    PlanRuns runs;
+    console_.connect(runs);
+    require(runs.GetDue(due, end), runs);
     from_ = end;
-    for (const auto& row : rows) runPlan(row[0].toLong(), row[1].toLong());
+    for (const PlanRun& run : std::vector<PlanRun>(runs.runs())) runPlan(runs, run);
   }
 
   // A plan whose run died has no run ahead of it. One that is due still has: by now it may lie in the past.
   void mendChains() const {
+    PlanRuns runs;
+    console_.connect(runs);
+    require(runs.GetPending(from_), runs);
     std::set<Long> pending;
-    for (const auto& row :
-         systemRows(console_, "select taskId from QVTaskSche where state=0 and pTime>='" + from_.sqlText() + "'"))
-      pending.insert(row[0].toLong());
+    for (const PlanRun& run : runs.runs()) pending.insert(run.planId);
     BKPlans plans;
     console_.connect(plans);
     require(plans.GetAll(), plans);
@@ -124,16 +124,18 @@ class Agent {
     }
   }
 
-  void runPlan(Long task, Long run) {
+  void runPlan(PlanRuns& runs, PlanRun run) {
     BKPlan plan;
     console_.connect(plan);
-    bool done = plan.GetOne(1, std::to_string(task));
-    if (done) {
-      const Waiting waiting(localTime().text() + " " + plan.Name() + ", run " + std::to_string(run));
-      done = plan.exec(run);
+    bool done = plan.GetOne(1, std::to_string(run.planId));
+    if (!done) {
+      complain(plan.errDescription());
+    } else {
+      const Waiting waiting(localTime().text() + " " + plan.Name() + ", run " + std::to_string(run.number));
+      done = runs.runPlan(plan, run);
+      if (!done) complain(runs.errDescription());
     }
     ++(done ? done_ : failed_);
-    if (!done) complain(plan.errDescription());
   }
 
   const Console& console_;

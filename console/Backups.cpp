@@ -1,11 +1,11 @@
-#include <filesystem>
+#include "QVSa/hosting/Backups.h"
+
 #include <memory>
 
 #include "QVSa/maintenance/DBMgr.h"
 #include "console/Commands.h"
 #include "console/Passwords.h"
 #include "console/ServerPath.h"
-#include "console/SystemRows.h"
 #include "console/Waiting.h"
 
 namespace QVSa::console {
@@ -18,33 +18,19 @@ struct Options {
   bool lock = false;
 };
 
-struct Files {
-  String sys;
-  String app;
-};
-
-Files filesIn(const Console& console, const String& folder) {
-  const String place = serverPath(console, folder);
-  return {below(console, place, "sys.bak"), below(console, place, "app.bak")};
-}
-
-// The lock is written to the running system, where it stays and goes into every copy; without reports none is written.
-bool isLocked(const Console& console) {
-  return !systemRows(console, "select roleId from roles where roleId=4 and roleSpec like '_%'").empty();
-}
-
 Answer backUp(const Console& console, const Options& options) {
-  const Files files = filesIn(console, options.folder);
   const String lock = options.lock ? askNewPassword("Password that lifts the lock") : "";
   if (options.lock && lock.empty()) throw Misuse("A lock needs a password.");
-  DBMgr manager;
+  Backups backups;
+  console.connect(backups);
   {
     const Waiting waiting("Backing up");
-    require(manager.BackUpDB(console.place().server, files.sys, files.app, "", lock), manager);
+    require(backups.backUp(serverPath(console, options.folder), lock), backups);
   }
-  const bool locked = isLocked(console);
-  Answer answer{"Both databases are backed up and checked:\n  " + files.sys + "\n  " + files.app + "\n",
-                {{"system", files.sys}, {"application", files.app}, {"locked", locked}}};
+  bool locked = false;
+  require(backups.isLocked(locked), backups);
+  Answer answer{"Both databases are backed up and checked:\n  " + backups.sysFile() + "\n  " + backups.appFile() + "\n",
+                {{"system", backups.sysFile()}, {"application", backups.appFile()}, {"locked", locked}}};
   if (locked)
     answer.text +=
         "The reports of the copy are locked, and so are those of the running system: `qvsa backup unlock`.\n";
@@ -54,15 +40,15 @@ Answer backUp(const Console& console, const Options& options) {
 }
 
 Answer restore(const Console& console, const Options& options) {
-  const Files files = filesIn(console, options.folder);
   const String password = askPassword("Password of " + options.login);
-  DBMgr manager;
+  Backups backups;
+  console.connect(backups);
   {
     const Waiting waiting("Restoring, as soon as everybody has left");
-    require(manager.RestoreDB(console.place().server, files.sys, files.app, password, false, options.login), manager);
+    require(backups.restore(serverPath(console, options.folder), password, options.login), backups);
   }
   return {"Both databases are restored. Whoever was signed on has to sign on again.\n",
-          {{"system", files.sys}, {"application", files.app}, {"restored", true}}};
+          {{"system", backups.sysFile()}, {"application", backups.appFile()}, {"restored", true}}};
 }
 
 Answer unlock(const Console& console) {

@@ -1,6 +1,9 @@
 #include <filesystem>
 #include <memory>
 
+#include "QVSa/frame/Text.h"
+#include "QVSa/hosting/Collisions.h"
+#include "QVSa/hosting/LogPages.h"
 #include "QVSa/identity/User.h"
 #include "QVSa/syslog/LogRecords.h"
 #include "console/Commands.h"
@@ -20,7 +23,7 @@ struct Options {
   String computer;
   String templates;
   String words;
-  Long page = 1;
+  String after;
   Long pageSize = 25;
   String function;
   String description;
@@ -50,20 +53,19 @@ Answer add(const Console& console, const Options& options) {
   const Long user = idOf(console, options.user.empty() ? "Admin" : options.user);
   LogRecords log;
   console.connect(log);
-  require(log.Add(user, options.type, options.function, options.description, "", &options.record, &options.item,
-                  &options.templates),
+  require(repeatCollided(log,
+                         [&] {
+                           return log.Add(user, options.type, options.function, options.description, "",
+                                          &options.record, &options.item, &options.templates);
+                         }),
           log);
   return {"The entry is written.\n", {{"written", true}}};
 }
 
-// The record set's columns by their position, as their names follow the language.
-std::vector<Json> rowOf(Recordset& rows) {
-  std::vector<Json> values;
-  for (const int column : {0, 1, 2, 3, 4, 5, 6, 7, 8, 10, 11}) values.push_back(rows[column].asText());
-  return values;
-}
-
-Answer page(LogRecords& log, const Options& options) {
+Answer page(const Console& console, const LogFilter& filter, const Options& options) {
+  LogPages log;
+  console.connect(log);
+  require(log.read(filter, options.pageSize, options.after), log);
   Table table({{"Entry", "entry"},
                {"Time", "time"},
                {"User", "user"},
@@ -75,39 +77,36 @@ Answer page(LogRecords& log, const Options& options) {
                {"Agent", "agent"},
                {"Record", "record"},
                {"Item", "item"}});
-  const Long count = log.Count();
-  const Long pages = (count + options.pageSize - 1) / options.pageSize;
-  Recordset& rows = log.recordset();
-  const std::int64_t before = (std::int64_t{options.page} - 1) * options.pageSize;
-  for (std::int64_t i = 0; i < before && !rows.EOF_(); ++i) rows.MoveNext();
-  for (Long i = 0; i < options.pageSize && !rows.EOF_(); ++i, rows.MoveNext()) table.row(rowOf(rows));
-  const String place = "Page " + std::to_string(options.page) + " of " + std::to_string(pages) + ", " +
-                       std::to_string(count) + (count == 1 ? " entry" : " entries") + " in all.\n";
-  return {count == 0 ? "There are no such entries.\n" : table.text() + "\n" + place,
-          {{"entries", table.document()}, {"count", count}, {"page", options.page}, {"pages", pages}}};
+  for (const LogEntry& entry : log.entries())
+    table.row({entry.id, entry.time.text(), entry.user, entry.computer, entry.application, entry.operation,
+               entry.description, entry.templateName, entry.agent, entry.record, entry.item});
+  const String more = log.next().empty() ? "There are no more.\n" : "More: add  --after " + log.next() + "\n";
+  return {table.size() == 0 ? "There are no such entries.\n" : table.text() + "\n" + more,
+          {{"entries", table.document()}, {"next", log.next().empty() ? Json() : Json(log.next())}}};
+}
+
+LogFilter filterOf(const Options& options) {
+  LogFilter filter;
+  filter.type = options.type;
+  filter.from = day(options.from);
+  filter.to = day(options.to);
+  filter.words = options.words;
+  return filter;
 }
 
 Answer list(const Console& console, const Options& options) {
-  const Long user = options.user.empty() ? 0 : idOf(console, options.user);
-  LogRecords log;
-  console.connect(log);
-  require(log.GetAll(options.type, day(options.from), day(options.to), user, options.templates, options.words), log);
-  return page(log, options);
-}
-
-// The library puts the parts of users and templates into its statement as they are.
-String quoted(const String& parts) {
-  if (parts.rfind(',', 0) == 0) throw Misuse("A list can't begin with a comma.");
-  return replaceAll(parts, "'", "''");
+  LogFilter filter = filterOf(options);
+  if (!options.user.empty()) filter.userId = idOf(console, options.user);
+  filter.templateId = options.templates;
+  return page(console, filter, options);
 }
 
 Answer query(const Console& console, const Options& options) {
-  LogRecords log;
-  console.connect(log);
-  std::vector<Variant> values{day(options.from),    day(options.to),           options.computer,
-                              quoted(options.user), quoted(options.templates), options.words};
-  require(log.GetLogByQuery(values, options.type), log);
-  return page(log, options);
+  LogFilter filter = filterOf(options);
+  filter.computer = options.computer;
+  filter.users = split(options.user, ',');
+  filter.templates = split(options.templates, ',');
+  return page(console, filter, options);
 }
 
 void exportTo(LogRecords& log, const Options& options) {
@@ -142,7 +141,7 @@ void addPages(CLI::App* command, Options& options) {
   command->add_option("--from", options.from, "First day, yyyy-mm-dd");
   command->add_option("--to", options.to, "Last day");
   command->add_option("--words", options.words, "Part of the description");
-  command->add_option("--page", options.page)->check(CLI::PositiveNumber)->capture_default_str();
+  command->add_option("--after", options.after, "Go on behind a page, at the place that it ends with");
   command->add_option("--page-size", options.pageSize, "Entries a page")
       ->check(CLI::Range(1, 100000))
       ->capture_default_str();

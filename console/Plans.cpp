@@ -3,10 +3,11 @@
 #include <memory>
 
 #include "QVSa/frame/Text.h"
+#include "QVSa/hosting/PlanRuns.h"
+#include "QVSa/hosting/SafeTexts.h"
 #include "QVSa/maintenance/BKPlans.h"
 #include "console/Commands.h"
 #include "console/ServerPath.h"
-#include "console/SystemRows.h"
 #include "console/Table.h"
 #include "console/Waiting.h"
 #include "platform/Services.h"
@@ -69,11 +70,19 @@ String keptFor(BKPlan& plan) {
   return "for ever";
 }
 
-// The next pending run, or nothing: one that was missed stays pending for ever.
-Json nextOf(const Console& console, const BKPlan& plan) {
-  const auto rows = systemRows(
-      console, "select min(pTime) from QVTaskSche where state=0 and pTime>=getdate() and taskId=" + text(plan.Id()));
-  return rows[0][0].isNull() ? Json() : Json(rows[0][0].toText());
+// The next moment of each plan that has one; a run that was missed stays pending for ever.
+std::map<Long, Date> nextMoments(const Console& console) {
+  PlanRuns pending;
+  console.connect(pending);
+  require(pending.GetPending(platform::services().localTime()), pending);
+  std::map<Long, Date> moments;
+  for (const PlanRun& run : pending.runs()) moments.emplace(run.planId, run.due);
+  return moments;
+}
+
+Json nextOf(const std::map<Long, Date>& moments, const BKPlan& plan) {
+  const auto moment = moments.find(plan.Id());
+  return moment == moments.end() ? Json() : Json(moment->second.text());
 }
 
 Answer show(const Console& console, const String& name) {
@@ -81,7 +90,7 @@ Answer show(const Console& console, const String& name) {
   Sheet sheet;
   sheet.line("Plan", "plan", plan.Name()).line("Number", "id", plan.Id()).line("Folder", "folder", plan.bkPath());
   sheet.line("When", "schedule", replaceAll(plan.schedule()->description(), "\r\n", ", "));
-  sheet.line("Backups kept", "kept", keptFor(plan)).line("Next run", "next", nextOf(console, plan));
+  sheet.line("Backups kept", "kept", keptFor(plan)).line("Next run", "next", nextOf(nextMoments(console), plan));
   return {sheet.text(), sheet.document()};
 }
 
@@ -104,6 +113,7 @@ void requireOwnFolder(const Console& console, const String& folder) {
 
 Answer add(const Console& console, const Options& options) {
   requireWithinADay(options);
+  if (!isPlainPath(options.folder)) throw Misuse("The folder of a plan must hold no quote.");
   BKPlan plan;
   console.connect(plan);
   plan.Name(options.plan);
@@ -135,27 +145,24 @@ Answer list(const Console& console) {
   console.connect(plans);
   require(plans.GetAll(), plans);
   Table table({{"Plan", "plan"}, {"Folder", "folder"}, {"When", "schedule"}, {"Next run", "next"}});
+  const std::map<Long, Date> moments = nextMoments(console);
   for (const auto& plan : plans)
     table.row({plan->Name(), plan->bkPath(), replaceAll(plan->schedule()->description(), "\r\n", ", "),
-               nextOf(console, *plan)});
+               nextOf(moments, *plan)});
   return {table.size() == 0 ? "There are no backup plans.\n" : table.text(), {{"plans", table.document()}}};
 }
 
 Answer run(const Console& console, const String& name) {
   BKPlan plan = load(console, name);
-  plan.newSche();
-  const auto rows =
-      systemRows(console, "select max(schNo) from QVTaskSche where state=0 and taskId=" + text(plan.Id()));
-  const Long number = rows[0][0].toLong();
+  PlanRuns runs;
+  console.connect(runs);
+  PlanRun run;
   {
     const Waiting waiting("Backing up");
-    require(plan.exec(number), plan);
+    require(runs.runPlan(plan, run), runs);
   }
-  const auto folder = systemRows(console, "select msg from QVTaskSche where taskId=" + text(plan.Id()) +
-                                              " and schNo=" + text(number))[0][0]
-                          .toText();
-  return {"Run " + text(number) + " of " + plan.Name() + " is done: " + folder + "\n",
-          {{"plan", plan.Name()}, {"run", number}, {"folder", folder}}};
+  return {"Run " + text(run.number) + " of " + plan.Name() + " is done: " + run.folder + "\n",
+          {{"plan", plan.Name()}, {"run", run.number}, {"folder", run.folder}}};
 }
 
 Answer remove(const Console& console, const String& name) {
@@ -166,13 +173,16 @@ Answer remove(const Console& console, const String& name) {
 
 Answer history(const Console& console, const String& name) {
   const BKPlan plan = load(console, name);
-  static const std::map<Long, String> states{{0, "pending"}, {1, "done"}, {2, "failed"}};
+  static const std::map<Long, String> states{
+      {PlanRun::pending, "pending"}, {PlanRun::done, "done"}, {PlanRun::failed, "failed"}};
+  PlanRuns runs;
+  console.connect(runs);
+  require(runs.GetAll(plan.Id()), runs);
   Table table({{"Run", "run"}, {"Due", "due"}, {"State", "state"}, {"Folder", "folder"}});
-  for (const auto& row : systemRows(console, "select schNo,pTime,state,msg from QVTaskSche where taskId=" +
-                                                 text(plan.Id()) + " order by schNo")) {
-    const auto state = states.find(row[2].toLong());
-    table.row({row[0].toLong(), row[1].isNull() ? "" : row[1].toText(),
-               state == states.end() ? row[2].toText() : state->second, row[3].isNull() ? "" : row[3].toText()});
+  for (const PlanRun& run : runs.runs()) {
+    const auto state = states.find(run.state);
+    table.row({run.number, run.due == Date() ? "" : run.due.text(),
+               state == states.end() ? text(run.state) : state->second, run.folder});
   }
   return {table.text(), {{"plan", plan.Name()}, {"runs", table.document()}}};
 }

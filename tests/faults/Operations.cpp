@@ -2,6 +2,7 @@
 
 #include "QVSa/QVSa.h"
 #include "platform/SecretMessage.h"
+#include "tests/faults/HostingOperations.h"
 #include "tests/faults/LogAndClassOperations.h"
 #include "tests/faults/MaintenanceOperations.h"
 #include "tests/faults/OrganisationOperations.h"
@@ -221,7 +222,8 @@ const std::vector<Operation>& operations() {
   static const std::vector<Operation> all = [] {
     std::vector<Operation> result;
     for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations(),
-                      logAndClassOperations(), settingsOperations(), organisationOperations(), maintenanceOperations()})
+                      logAndClassOperations(), settingsOperations(), organisationOperations(), maintenanceOperations(),
+                      hostingOperations()})
       result.insert(result.end(), part.begin(), part.end());
     return result;
   }();
@@ -241,7 +243,7 @@ const std::vector<LetPass>& letPass() {
         {"User.regAudit", "select * from homeinfo", true, "without the settings no mail is queued"},
         {"User.regAudit", "select count(*) from reptmps", true, "without the settings no mail is queued"},
     };
-    for (const std::vector<LetPass>& more : {organisationLetPass(), maintenanceLetPass()})
+    for (const std::vector<LetPass>& more : {organisationLetPass(), maintenanceLetPass(), hostingLetPass()})
       result.insert(result.end(), more.begin(), more.end());
     return result;
   }();
