@@ -30,7 +30,6 @@ TEST_F(LogAndClasses, EntriesAreWrittenFoundPagedExportedAndCleared) {
   EXPECT_EQ(functions(run("log list")), "three ");
   EXPECT_EQ(functions(run("log list --type 1 --to 2024-03-05 --user Admin --words words")), "one ");
   EXPECT_EQ(functions(run("log query --type 1 --users dmi,nobody")), "two one ");
-  EXPECT_EQ(functions(run("log query --type 1 --users \"x' or 1=1 --\" --templates \"it's\"")), "");
   const Outcome page = run("log list --type 1 --page-size 1");
   EXPECT_EQ(functions(page), "two ");
   const Outcome last = run("log list --type 1 --page-size 1 --after " + page.document["next"].get<String>());

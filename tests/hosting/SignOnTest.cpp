@@ -19,15 +19,11 @@ class Entrance : public Scene {
       rule.errTimes(2);
     });
   }
-  SignOn entrance(Long refusalTime = 0) {
-    auto result = connected<SignOn>();
-    result.refusalTime(refusalTime);
-    return result;
-  }
 };
 
 TEST_F(Entrance, TellsStrangersOneThingInOneTime) {
-  SignOn strangers = entrance(40);
+  auto strangers = connected<SignOn>();
+  strangers.refusalTime(40);
   for (const auto& [login, password, address] : {std::tuple{"nobody", "x", ""},
                                                  {"ann", "wrong", ""},
                                                  {"bob", "wrong", "10.9.9.9"},
@@ -46,26 +42,10 @@ TEST_F(Entrance, TellsStrangersOneThingInOneTime) {
   EXPECT_TRUE(strangers.signOn("bob", "right", false, "10.0.0.1")) << strangers.errDescription();
   EXPECT_EQ(strangers.user().Login(), "bob");
   EXPECT_EQ(tables_.text("select sesId from seslog"), strangers.sessionId());
-
-  SignOn colleagues = entrance();
-  EXPECT_FALSE(colleagues.signOn("nobody", "x"));
-  EXPECT_EQ(colleagues.errNumber(), messageNumber(1101));
-  EXPECT_FALSE(colleagues.signOn("ann", "right"));
-  EXPECT_EQ(colleagues.errNumber(), messageNumber(1118));
-}
-
-TEST_F(Entrance, LetsAnExpiredPasswordInForItsChangeAlone) {
-  savePolicy([](safeRule& rule) { rule.maxDay(5); });
-  clock_.set(Date(2024, 4, 7));
-  SignOn late = entrance();
-  EXPECT_TRUE(late.signOn("ann", "right"));
-  EXPECT_EQ(late.sessionId(), "");
-  EXPECT_EQ(late.errNumber(), messageNumber(1119));
-  EXPECT_TRUE(late.user().chgPwd("right", "other")) << late.user().errDescription();
 }
 
 TEST_F(Entrance, TakesOneAttemptAtATimeHoweverTheLoginIsSpelled) {
-  SignOn guess = entrance(), other = entrance();
+  auto guess = connected<SignOn>(), other = connected<SignOn>();
   other.patience(1);
   bool met = false;
   {
