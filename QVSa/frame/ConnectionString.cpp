@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Provider.h"
 #include "QVSa/frame/Text.h"
 
 namespace QVSa {

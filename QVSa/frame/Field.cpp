@@ -1,5 +1,6 @@
 #include <algorithm>
 
+#include "QVSa/frame/Provider.h"
 #include "QVSa/frame/Recordset.h"
 
 namespace QVSa {

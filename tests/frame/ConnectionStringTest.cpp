@@ -3,6 +3,7 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Provider.h"
 #include "QVSa/frame/Text.h"
 #include "tests/support/Failures.h"
 

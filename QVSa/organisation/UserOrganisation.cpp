@@ -1,7 +1,19 @@
 #include "QVSa/identity/User.h"
+#include "QVSa/organisation/Department.h"
 #include "QVSa/organisation/Users.h"
 
 namespace QVSa {
+
+// What of a user speaks of departments and of other users lies here: the room of users knows nothing of the
+// organisation.
+
+Boolean User::setDept(const Department& dept) {
+  deptInnerId_ = dept.InnerId();
+  deptId_ = dept.Id();
+  deptName_ = dept.Name();
+  deptFullName_ = dept.fullName();
+  return true;
+}
 
 Boolean User::setManager(Integer flag, Long jobId, Long userId) {
   return operation(prefixed(1114), [&] {
