@@ -1,11 +1,15 @@
 #include <algorithm>
 
 #include "providers/embedded/Binder.h"
+#include "providers/embedded/TypeRules.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
 
 namespace {
+
+// Fewer than SQLite takes in one statement, 32,766 as it is built by default.
+constexpr std::size_t mostParameters = 32'000;
 
 bool fits(const Type& from, const Type& to) { return to.size < 0 || (from.size >= 0 && from.size <= to.size); }
 
@@ -15,13 +19,29 @@ bool sameForm(const Type& from, const Type& to, Purpose purpose) {
   if (from.base == Base::image && to.base == Base::image) return purpose == Purpose::compute || fits(from, to);
   if (from.isWhole() && to.isWhole()) return from.base <= to.base;
   if (from.base == Base::smalldatetime && to.base == Base::datetime) return true;
-  if (from.base == Base::decimal && to.base == Base::real) return true;
+  if (from.base == Base::decimal && to.base == Base::decimal) return from.scale == to.scale && from.size <= to.size;
   return from.base == to.base;
+}
+
+// Bytes become nothing else, and only a text becomes bytes.
+void requireConvertible(const Type& from, const Type& to, Purpose purpose) {
+  if (from.base == Base::unknown || from.base == to.base) return;
+  if (from.base != Base::image && (to.base != Base::image || from.isText())) return;
+  if (purpose == Purpose::cast)
+    throw tsql::sqlFailure(529, std::string("Explicit conversion from data type ") + nameOf(from.base) + " to " +
+                                    nameOf(to.base) + " is not allowed.");
+  throw tsql::sqlFailure(
+      206, std::string("Operand type clash: ") + nameOf(from.base) + " is incompatible with " + nameOf(to.base) + ".");
 }
 
 }  // namespace
 
 BoundPtr Binder::parameter(const Parameter& value) {
+  if (parameters_.size() == mostParameters)
+    throw tsql::sqlFailure(8623,
+                           "The query processor ran out of internal resources and could not produce a query plan. This "
+                           "is a rare event and only expected for extremely complex queries or queries that reference "
+                           "a very large number of tables or partitions. Please simplify the query.");
   auto bound = std::make_unique<BoundExpression>();
   bound->kind = BoundExpression::Kind::parameter;
   bound->type = value.type;
@@ -41,6 +61,7 @@ Parameter Binder::literalParameter(const tsql::Token& token, Parameter::Source s
 
 BoundPtr Binder::coerce(BoundPtr value, const Type& to, Purpose purpose, int style) {
   if (to.base == Base::unknown) return value;
+  requireConvertible(value->type, to, purpose);
   if (value->type.base == Base::unknown) {
     value->type = to;
     return value;
@@ -59,34 +80,19 @@ BoundPtr Binder::coerce(BoundPtr value, const Type& to, Purpose purpose, int sty
     value->type = to;
     return value;
   }
-  const auto number = [](auto n) { return constant(std::to_string(static_cast<int>(n))); };
   std::vector<BoundPtr> operands;
-  const Base from = value->type.base;
+  const std::int64_t from = codeOf(value->type);
   operands.push_back(std::move(value));
-  operands.push_back(number(from));
-  operands.push_back(number(to.base));
-  operands.push_back(number(to.size));
-  operands.push_back(number(purpose));
-  operands.push_back(number(style));
+  for (const std::int64_t number : {from, codeOf(to), static_cast<std::int64_t>(purpose), std::int64_t{style}})
+    operands.push_back(constant(std::to_string(number)));
   return call("t_convert", to, std::move(operands));
 }
 
-Type Binder::common(const Type& a, const Type& b) {
-  static constexpr Base precedence[] = {Base::unknown, Base::image,   Base::varchar,       Base::nvarchar, Base::ntext,
-                                        Base::bit,     Base::tinyint, Base::smallint,      Base::integer,  Base::bigint,
-                                        Base::decimal, Base::real,    Base::smalldatetime, Base::datetime};
-  const auto rank = [](const Type& type) {
-    return std::find(std::begin(precedence), std::end(precedence), type.base) - std::begin(precedence);
-  };
-  Type result = rank(a) >= rank(b) ? a : b;
-  if (a.isText() && b.isText()) result.size = a.size < 0 || b.size < 0 ? -1 : std::max(a.size, b.size);
-  return result;
-}
-
 void Binder::alignForComparison(BoundPtr& left, BoundPtr& right) {
-  const Type type = common(left->type, right->type);
-  // Numbers of two kinds compare as they lie.
-  if (!(left->type.isNumber() && right->type.isNumber())) {
+  const Type type = commonType(left->type, right->type);
+  // Whole and real numbers compare as they lie.
+  const auto isPlain = [](const BoundExpression& side) { return side.type.isWhole() || side.type.base == Base::real; };
+  if (!isPlain(*left) || !isPlain(*right)) {
     left = coerce(std::move(left), type, Purpose::compute);
     right = coerce(std::move(right), type, Purpose::compute);
   }

@@ -5,6 +5,8 @@
 
 #include "providers/embedded/Binder.h"
 #include "providers/embedded/Literal.h"
+#include "providers/embedded/TypeRules.h"
+#include "providers/tsql/Dialect.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
@@ -34,6 +36,7 @@ void addOperand(BoundExpression& to, BoundPtr operand) {
 }  // namespace
 
 BoundPtr Binder::bind(const tsql::Expression& expression, const Scope& scope) {
+  deadline_.check();
   switch (expression.kind) {
     case Kind::null: {
       BoundPtr null = make(BoundExpression::Kind::null);
@@ -45,9 +48,9 @@ BoundPtr Binder::bind(const tsql::Expression& expression, const Scope& scope) {
     case Kind::column:
       return bindColumn(expression, scope);
     case Kind::unary:
-      return bindUnary(expression, scope);
+      return bindSign(expression, scope);
     case Kind::binary:
-      return bindBinary(expression, scope);
+      return bindChain(expression, scope);
     case Kind::comparison:
       return bindComparison(expression, scope);
     case Kind::logical:
@@ -103,7 +106,7 @@ BoundPtr Binder::bind(const tsql::Expression& expression, const Scope& scope) {
 BoundPtr Binder::bindLiteral(const tsql::Expression& expression, bool negate) {
   Parameter literal = literalParameter(expression.token, Parameter::Source::literal);
   literal.negate = negate;
-  literal.type = literalType(expression.token.kind);
+  literal.type = literalType(expression.token);
   return parameter(literal);
 }
 
@@ -138,81 +141,19 @@ BoundPtr Binder::bindColumn(const tsql::Expression& expression, const Scope& sco
   return column;
 }
 
-BoundPtr Binder::bindUnary(const tsql::Expression& expression, const Scope& scope) {
-  const tsql::Expression& operand = *expression.operands[0];
-  if (expression.op == "-" && operand.kind == Kind::literal && literalType(operand.token.kind).isNumber())
-    return bindLiteral(operand, true);
-  BoundPtr value = bind(operand, scope);
-  if (value->type.isText()) value = coerce(std::move(value), {Base::integer, -1}, Purpose::compute);
-  if (expression.op == "+") return value;
-  const Type type = value->type;
-  std::vector<BoundPtr> operands;
-  operands.push_back(std::move(value));
-  if (expression.op == "-") return call("t_negate", type, std::move(operands));
-  BoundPtr complement = make(BoundExpression::Kind::prefix);
-  complement->text = expression.op;
-  complement->type = type;
-  addOperand(*complement, std::move(operands.front()));
-  return complement;
-}
-
-BoundPtr Binder::bindBinary(const tsql::Expression& expression, const Scope& scope) {
-  BoundPtr left = bind(*expression.operands[0], scope);
-  BoundPtr right = bind(*expression.operands[1], scope);
-  if (expression.op == "+") return bindPlus(std::move(left), std::move(right));
-  if (expression.op == "-" && left->type.isDate() && !right->type.isDate())
-    return moveDate("-", std::move(left), std::move(right));
-  return arithmetic(expression.op, std::move(left), std::move(right));
-}
-
-BoundPtr Binder::bindPlus(BoundPtr left, BoundPtr right) {
-  const bool leftText = left->type.isText() || left->type.base == Base::unknown;
-  const bool rightText = right->type.isText() || right->type.base == Base::unknown;
-  if (leftText && rightText) return infix("||", {Base::nvarchar, -1}, std::move(left), std::move(right));
-  if (left->type.isDate()) return moveDate("+", std::move(left), std::move(right));
-  if (right->type.isDate()) return moveDate("+", std::move(right), std::move(left));
-  return arithmetic("+", std::move(left), std::move(right));
-}
-
-BoundPtr Binder::arithmetic(const std::string& op, BoundPtr left, BoundPtr right) {
-  static constexpr std::pair<std::string_view, const char*> functions[] = {
-      {"+", "t_add"}, {"-", "t_subtract"}, {"*", "t_multiply"}, {"/", "t_divide"}, {"%", "t_modulo"}};
-  Type type = common(left->type, right->type);
-  if (!type.isNumber()) throw tsql::sqlFailure(402, "The data types are incompatible in the operator '" + op + "'.");
-  left = coerce(std::move(left), type, Purpose::compute);
-  right = coerce(std::move(right), type, Purpose::compute);
-  if (type.isWhole() && type.base < Base::integer) type = {Base::integer, -1};
-  const auto* const function = std::ranges::find(functions, op, [](const auto& entry) { return entry.first; });
-  if (function == std::end(functions)) return infix(op, type, std::move(left), std::move(right));
-  // Large and fractional numbers follow the storage library's own arithmetic; a zero divisor is refused in all.
-  if (op != "/" && op != "%" && type.base != Base::integer) return infix(op, type, std::move(left), std::move(right));
-  std::vector<BoundPtr> operands;
-  operands.push_back(std::move(left));
-  operands.push_back(std::move(right));
-  return call(function->second, type, std::move(operands));
-}
-
-BoundPtr Binder::moveDate(const std::string& op, BoundPtr date, BoundPtr days) {
-  static constexpr const char* ticksPerDay = "25920000";
-  const Type type = date->type;
-  if (days->type.isDate()) return infix(op, {Base::datetime, -1}, std::move(date), std::move(days));
-  days = coerce(std::move(days), {Base::real, -1}, Purpose::compute);
-  std::vector<BoundPtr> ticks;
-  ticks.push_back(infix("*", {Base::real, -1}, std::move(days), constant(ticksPerDay)));
-  BoundPtr whole = coerce(call("round", {Base::real, -1}, std::move(ticks)), {Base::bigint, -1}, Purpose::compute);
-  return infix(op, type, std::move(date), std::move(whole));
-}
-
 BoundPtr Binder::bindComparison(const tsql::Expression& expression, const Scope& scope) {
   BoundPtr left = bind(*expression.operands[0], scope);
   BoundPtr right = bind(*expression.operands[1], scope);
   alignForComparison(left, right);
-  return infix(expression.op, {Base::bit, -1}, std::move(left), std::move(right));
+  const tsql::Operation& row = *tsql::operatorNamed(expression.op, tsql::Form::comparison);
+  return infix(std::string(row.emitted), {Base::bit, -1}, std::move(left), std::move(right));
 }
 
 BoundPtr Binder::bindLogical(const tsql::Expression& expression, const Scope& scope) {
-  BoundPtr left = bind(*expression.operands[0], scope);
-  return infix(expression.op, {Base::bit, -1}, std::move(left), bind(*expression.operands[1], scope));
+  BoundPtr chain = make(BoundExpression::Kind::infix);
+  chain->text = tsql::operatorNamed(expression.op, tsql::Form::logical)->emitted;
+  for (const auto& operand : expression.operands) addOperand(*chain, bind(*operand, scope));
+  return chain;
 }
 
 BoundPtr Binder::bindBetween(const tsql::Expression& expression, const Scope& scope) {
@@ -231,34 +172,37 @@ BoundPtr Binder::bindBetween(const tsql::Expression& expression, const Scope& sc
 
 BoundPtr Binder::bindLike(const tsql::Expression& expression, const Scope& scope) {
   const Type text{Base::nvarchar, -1};
+  const tsql::Operation& row = *tsql::operatorNamed("like", tsql::Form::predicate);
   const tsql::Expression& pattern = *expression.operands[1];
   std::vector<BoundPtr> operands;
-  for (const auto& operand : expression.operands)
-    operands.push_back(coerce(bind(*operand, scope), text, Purpose::compute));
+  bool isVarchar = true;
+  for (std::size_t i = 0; i < expression.operands.size(); ++i) {
+    operands.push_back(taken(row, i, bind(*expression.operands[i], scope)));
+    isVarchar = isVarchar && operands.back()->type.base == Base::varchar;
+  }
   const bool ranged = operands[0]->collated && operands[0]->kind == BoundExpression::Kind::column &&
                       pattern.kind == Kind::literal && operands.size() == 2 && !expression.negated;
   if (ranged && !ownLiterals_) patterns_.push_back(pattern.token.literal);
   const bool indexable = ranged && !likePrefix(pattern.token.text).empty();
-  BoundPtr low, high;
+  BoundPtr whole = make(BoundExpression::Kind::infix);
+  whole->text = "and";
   if (indexable) {
-    // The storage library makes no range of a like under a collation of ours, so the statement does.
-    const auto bound = [&](Parameter::Source source, const std::string& op) {
+    // SQLite makes no range of a like under a collation of ours, so the statement does.
+    const auto addBound = [&](Parameter::Source source, const std::string& op) {
       Parameter limit = literalParameter(pattern.token, source);
       limit.type = text;
       BoundPtr column = bind(*expression.operands[0], scope);
-      return infix(op, {Base::bit, -1}, std::move(column), parameter(limit));
+      addOperand(*whole, infix(op, {Base::bit, -1}, std::move(column), parameter(limit)));
     };
-    low = bound(Parameter::Source::prefixLow, ">=");
-    high = bound(Parameter::Source::prefixHigh, "<=");
+    addBound(Parameter::Source::prefixLow, ">=");
+    addBound(Parameter::Source::prefixHigh, "<=");
   }
-  BoundPtr like = call("t_like", {Base::bit, -1}, std::move(operands));
-  if (indexable)
-    return infix("and", {Base::bit, -1}, infix("and", {Base::bit, -1}, std::move(low), std::move(high)),
-                 std::move(like));
-  if (!expression.negated) return like;
+  const std::string function = std::string(row.emitted) + (isVarchar ? "_varchar" : "");
+  addOperand(*whole, call(function, {Base::bit, -1}, std::move(operands)));
+  if (!expression.negated) return whole;
   BoundPtr negation = make(BoundExpression::Kind::prefix);
   negation->text = "not";
-  addOperand(*negation, std::move(like));
+  addOperand(*negation, std::move(whole));
   return negation;
 }
 
@@ -282,9 +226,7 @@ BoundPtr Binder::bindIn(const tsql::Expression& expression, const Scope& scope) 
 }
 
 BoundPtr Binder::bindInList(const tsql::Expression& list, BoundPtr value) {
-  Type items;
-  for (const auto& item : list.token.items) items = common(items, literalType(item.kind));
-  const Type type = common(value->type, items);
+  const Type type = commonType(value->type, literalType(list.token));
   value = collate(coerce(std::move(value), type, Purpose::compute));
   Parameter literal = literalParameter(list.token, Parameter::Source::list);
   literal.type = type;
@@ -304,7 +246,7 @@ BoundPtr Binder::bindInSelect(const tsql::Expression& expression, BoundPtr value
                              "Only one expression can be specified in the select list when the subquery is not "
                              "introduced with EXISTS.");
     BoundPtr& item = part.core.items.front().expression;
-    const Type type = common(value->type, item->type);
+    const Type type = commonType(value->type, item->type);
     value = coerce(std::move(value), type, Purpose::compute);
     item = coerce(std::move(item), type, Purpose::compute);
   }
@@ -312,29 +254,46 @@ BoundPtr Binder::bindInSelect(const tsql::Expression& expression, BoundPtr value
   return in;
 }
 
+// A case in the else of another has a type of its own, which its results take before that of the one around it.
 BoundPtr Binder::bindCase(const tsql::Expression& expression, const Scope& scope) {
   std::vector<BoundPtr> whens, thens;
-  Type type;
+  std::vector<std::size_t> levels;  // of the results
+  std::vector<Type> types(1);       // by level
+  const auto addResult = [&](const tsql::Expression& result) {
+    thens.push_back(bind(result, scope));
+    levels.push_back(types.size() - 1);
+    types.back() = commonType(types.back(), thens.back()->type);
+  };
+  const tsql::Expression* operand = expression.operands.empty() ? nullptr : expression.operands.front().get();
   for (const auto& branch : expression.branches) {
+    if (branch.inElse) {
+      operand = branch.operand.get();
+      types.emplace_back();
+    }
     BoundPtr when = bind(*branch.when, scope);
-    if (!expression.operands.empty()) {
-      BoundPtr value = bind(*expression.operands[0], scope);
+    if (operand) {
+      BoundPtr value = bind(*operand, scope);
       alignForComparison(value, when);
       when = infix("=", {Base::bit, -1}, std::move(value), std::move(when));
     }
     whens.push_back(std::move(when));
-    thens.push_back(bind(*branch.then, scope));
-    type = common(type, thens.back()->type);
+    addResult(*branch.then);
   }
-  if (expression.otherwise) {
-    thens.push_back(bind(*expression.otherwise, scope));
-    type = common(type, thens.back()->type);
-  }
+  if (expression.otherwise) addResult(*expression.otherwise);
+  for (std::size_t i = types.size() - 1; i > 0; --i) types[i - 1] = commonType(types[i - 1], types[i]);
+  std::vector<std::size_t> next(types.size());  // the next level outwards of another type; itself where there is none
+  for (std::size_t i = 1; i < types.size(); ++i)
+    next[i] = !(types[i] == types[i - 1]) ? i - 1 : next[i - 1] == i - 1 ? i : next[i - 1];
+
   BoundPtr result = make(BoundExpression::Kind::caseOf);
-  result->type = type;
+  result->type = types.front();
   for (std::size_t i = 0; i < thens.size(); ++i) {
+    std::size_t level = levels[i];
+    BoundPtr then = coerce(std::move(thens[i]), types[level], Purpose::compute);
+    for (; next[level] != level; level = next[level])
+      then = coerce(std::move(then), types[next[level]], Purpose::compute);
     if (i < whens.size()) addOperand(*result, std::move(whens[i]));
-    addOperand(*result, coerce(std::move(thens[i]), type, Purpose::compute));
+    addOperand(*result, std::move(then));
   }
   return result;
 }

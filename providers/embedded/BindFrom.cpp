@@ -99,7 +99,7 @@ BoundSelectPtr Binder::bindView(const ViewInfo& view) {
   if (viewDepth_ == viewDepthLimit)
     throw tsql::sqlFailure(4413, "Could not use view or function '" + view.name + "' because of binding errors.");
   // The view's names mean what they mean in its own database, whatever surrounds it.
-  Binder inner(catalogue_, view.database);
+  Binder inner(catalogue_, view.database, deadline_);
   inner.parameters_ = std::move(parameters_);
   inner.aliases_ = aliases_;
   inner.viewDepth_ = viewDepth_ + 1;

@@ -1,6 +1,7 @@
 #include <algorithm>
 
 #include "providers/embedded/Binder.h"
+#include "providers/embedded/TypeRules.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
@@ -207,7 +208,7 @@ void Binder::unifyParts(BoundSelect& select) {
                              "number of expressions in their target lists.");
   for (std::size_t i = 0; i < first.size(); ++i) {
     Type type;
-    for (const auto& part : select.parts) type = common(type, part.core.items[i].expression->type);
+    for (const auto& part : select.parts) type = commonType(type, part.core.items[i].expression->type);
     for (auto& part : select.parts) {
       BoundPtr& item = part.core.items[i].expression;
       item = coerce(std::move(item), type, Purpose::compute);

@@ -67,7 +67,9 @@ BoundSelectPtr Binder::keysOf(const tsql::ObjectName& target, const std::vector<
 }
 
 BoundPtr Binder::bindStored(const tsql::Expression& expression, const ColumnInfo& column, const Scope& scope) {
+  stores_ = true;
   BoundPtr value = bind(expression, scope);
+  stores_ = false;
   if (value->type.isDate() && column.type.isNumber() && column.type.isWhole())
     throw tsql::sqlFailure(257,
                            "Implicit conversion from data type datetime to int is not allowed. Use the CONVERT "
@@ -105,7 +107,9 @@ BoundInsert Binder::bindInsert(const tsql::Insert& insert) {
     return tsql::sqlFailure(213, "Column name or number of supplied values does not match table definition.");
   };
   if (insert.select) {
+    stores_ = true;
     bound.select = bindSelect(*insert.select, nullptr);
+    stores_ = false;
     for (const auto& part : bound.select->parts)
       if (part.core.items.size() != given)
         throw insert.columns.empty() ? countFailure()

@@ -3,6 +3,7 @@
 #include <map>
 
 #include "providers/embedded/Bound.h"
+#include "providers/tsql/Dialect.h"
 #include "providers/tsql/Tree.h"
 
 namespace QVSa::embedded {
@@ -14,7 +15,8 @@ namespace QVSa::embedded {
 // does not, and so is part of the statement's shape.
 class Binder {
  public:
-  Binder(const Catalogue& catalogue, std::size_t currentDatabase) : catalogue_(catalogue), database_(currentDatabase) {}
+  Binder(const Catalogue& catalogue, std::size_t currentDatabase, tsql::Deadline deadline = tsql::Deadline())
+      : catalogue_(catalogue), database_(currentDatabase), deadline_(deadline) {}
 
   BoundQuery bindQuery(const tsql::Select& select, bool updatable);
   BoundInsert bindInsert(const tsql::Insert& insert);
@@ -98,11 +100,6 @@ class Binder {
   BoundPtr bindLiteral(const tsql::Expression& expression, bool negate);
   BoundPtr bindColumn(const tsql::Expression& expression, const Scope& scope);
   Found findColumn(const tsql::Expression& expression, const Scope& scope) const;
-  BoundPtr bindUnary(const tsql::Expression& expression, const Scope& scope);
-  BoundPtr bindBinary(const tsql::Expression& expression, const Scope& scope);
-  BoundPtr bindPlus(BoundPtr left, BoundPtr right);
-  BoundPtr arithmetic(const std::string& op, BoundPtr left, BoundPtr right);
-  BoundPtr moveDate(const std::string& op, BoundPtr date, BoundPtr days);
   BoundPtr bindComparison(const tsql::Expression& expression, const Scope& scope);
   BoundPtr bindLogical(const tsql::Expression& expression, const Scope& scope);
   BoundPtr bindBetween(const tsql::Expression& expression, const Scope& scope);
@@ -113,12 +110,24 @@ class Binder {
   BoundPtr bindCase(const tsql::Expression& expression, const Scope& scope);
   BoundPtr bindConvert(const tsql::Expression& expression, const Scope& scope);
 
+  // BindOperator.cpp
+  BoundPtr bindSign(const tsql::Expression& expression, const Scope& scope);
+  BoundPtr bindChain(const tsql::Expression& expression, const Scope& scope);
+  BoundPtr combine(char op, BoundPtr left, BoundPtr right);
+  BoundPtr join(BoundPtr left, BoundPtr right);
+  BoundPtr moveDate(char op, BoundPtr left, BoundPtr right);
+  BoundPtr calculate(const tsql::Operation& row, BoundPtr left, BoundPtr right);
+  BoundPtr scaleDecimals(char op, const Type& type, BoundPtr left, BoundPtr right);
+  Type digitsOf(const BoundExpression& operand);
+
   // BindFunction.cpp
   BoundPtr bindFunction(const tsql::Expression& expression, const Scope& scope);
-  BoundPtr bindAggregate(const tsql::Expression& expression, const Scope& scope);
-  BoundPtr bindIsNull(const tsql::Expression& expression, const Scope& scope);
-  BoundPtr bindCoalesce(const tsql::Expression& expression, const Scope& scope);
-  BoundPtr bindDateFunction(const tsql::Expression& expression, const Scope& scope);
+  BoundPtr bindAggregate(const tsql::Operation& row, const tsql::Expression& expression, const Scope& scope);
+  BoundPtr bindNullIf(const tsql::Expression& expression, const Scope& scope);
+  std::vector<BoundPtr> bindOperands(const tsql::Operation& row, const tsql::Expression& expression,
+                                     const Scope& scope);
+  // The operand as the table of the dialect wants it in that place. Throws 8116, or 8117 for an aggregate or operator.
+  BoundPtr taken(const tsql::Operation& row, std::size_t place, BoundPtr operand);
 
   // BindConversion.cpp
   // `value` as a value of type `to`; unchanged where nothing has to be done.
@@ -127,8 +136,6 @@ class Binder {
   void alignForComparison(BoundPtr& left, BoundPtr& right);
   // The collation of the dialect, put on a text that does not have it by itself.
   static BoundPtr collate(BoundPtr value);
-  // The type that two types meet in, by the dialect's precedence.
-  static Type common(const Type& a, const Type& b);
   BoundPtr parameter(const Parameter& value);
   Parameter literalParameter(const tsql::Token& token, Parameter::Source source) const;
 
@@ -139,12 +146,14 @@ class Binder {
 
   const Catalogue& catalogue_;
   std::size_t database_;
+  tsql::Deadline deadline_;
   std::vector<Parameter> parameters_;
   std::vector<std::size_t> patterns_;
   std::vector<CommonTable> commonTables_;
   std::size_t aliases_ = 0;
   std::size_t viewDepth_ = 0;
   bool ownLiterals_ = false;
+  bool stores_ = false;  // what is bound is written to a table
 };
 
 }  // namespace QVSa::embedded

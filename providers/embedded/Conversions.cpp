@@ -4,6 +4,7 @@
 #include <limits>
 
 #include "providers/embedded/DateText.h"
+#include "providers/embedded/Decimal.h"
 #include "providers/embedded/NumberText.h"
 #include "providers/embedded/Ticks.h"
 #include "providers/embedded/Utf8.h"
@@ -56,6 +57,13 @@ Failure textOverflow(const std::string& text, const Type& from, Base base) {
       std::string("The conversion of the ") + nameOf(from.base) + " value '" + text + "' overflowed an ";
   if (!isSmall(base)) return sqlFailure(248, value + "int column.");
   return sqlFailure(244, value + (base == Base::tinyint ? "INT1" : "INT2") + " column. Use a larger integer column.");
+}
+
+// The value as a decimal, if that is what it is.
+std::optional<Decimal> asDecimal(const Value& value, const Type& from) {
+  const auto* const bytes = std::get_if<Bytes>(&value);
+  if (from.base != Base::decimal || bytes == nullptr || bytes->size() != decimalBytes) return std::nullopt;
+  return decimalFrom(bytes->data());
 }
 
 Failure notAllowed(const Type& from, const Type& to) {
@@ -112,6 +120,12 @@ Value toWhole(const Value& value, const Type& from, Base base) {
   if (const auto* real = std::get_if<double>(&value)) return wholeOf(*real, base);
   if (const auto* whole = std::get_if<std::int64_t>(&value))
     return wholeOf(from.isDate() ? floorDivide(*whole + ticksPerDay / 2, ticksPerDay) : *whole, base);
+  if (const auto decimal = asDecimal(value, from)) {
+    if (base == Base::bit) return std::int64_t{*decimal != 0};
+    const Decimal cut = floorOf(*decimal < 0 ? -*decimal : *decimal, from.scale);
+    if (cut > std::numeric_limits<std::int64_t>::max()) throw wholeOverflow(base, decimalText(*decimal, from.scale));
+    return wholeOf(static_cast<std::int64_t>(*decimal < 0 ? -cut : cut), base);
+  }
   throw notAllowed(from, {base, -1});
 }
 
@@ -121,12 +135,27 @@ Value toReal(const Value& value, const Type& from, Base base) {
   if (const auto* real = std::get_if<double>(&value)) return *real;
   if (const auto* whole = std::get_if<std::int64_t>(&value))
     return static_cast<double>(*whole) / (from.isDate() ? static_cast<double>(ticksPerDay) : 1.0);
+  if (const auto decimal = asDecimal(value, from)) return doubleOf(*decimal, from.scale);
   const auto* text = std::get_if<std::string>(&value);
   if (text == nullptr) throw notAllowed(from, {base, -1});
   const auto read = readReal(*text);
   if (!read)
     throw sqlFailure(8114,
                      std::string("Error converting data type ") + nameOf(from.base) + " to " + nameOf(base) + ".");
+  return *read;
+}
+
+// ---- to a decimal
+
+Decimal decimalOf(const Value& value, const Type& from, const Type& to) {
+  if (const auto* real = std::get_if<double>(&value)) return decimalFrom(*real, to.scale);
+  if (const auto* whole = std::get_if<std::int64_t>(&value))
+    return from.isDate() ? divided(*whole, ticksPerDay, to.scale) : rescaled(*whole, 0, to.scale);
+  if (const auto decimal = asDecimal(value, from)) return rescaled(*decimal, from.scale, to.scale);
+  const auto* text = std::get_if<std::string>(&value);
+  if (text == nullptr) throw notAllowed(from, to);
+  const auto read = readDecimal(*text, to.scale);
+  if (!read) throw sqlFailure(8114, std::string("Error converting data type ") + nameOf(from.base) + " to numeric.");
   return *read;
 }
 
@@ -154,6 +183,8 @@ std::int64_t dateTicks(const Value& value, const Type& from, Base base, int styl
     if (!(*real > -100'000 && *real < 3'000'000)) throw overflow(nameOf(base));
     return std::llround(*real * static_cast<double>(ticksPerDay));
   }
+  if (const auto decimal = asDecimal(value, from))
+    return dateTicks(doubleOf(*decimal, from.scale), {Base::real, -1}, base, style);
   const auto* text = std::get_if<std::string>(&value);
   if (text == nullptr) throw notAllowed(from, {base, -1});
   std::int64_t ticks = 0;
@@ -175,8 +206,8 @@ Value toDate(const Value& value, const Type& from, Base base, int style) {
 
 std::string textOf(const Value& value, const Type& from, const Type& to, int style) {
   if (const auto* text = std::get_if<std::string>(&value)) return *text;
-  if (const auto* real = std::get_if<double>(&value))
-    return from.base == Base::real ? realText(*real, style) : decimalText(*real);
+  if (const auto* real = std::get_if<double>(&value)) return realText(*real, style);
+  if (const auto decimal = asDecimal(value, from)) return decimalText(*decimal, from.scale);
   const auto* whole = std::get_if<std::int64_t>(&value);
   if (whole == nullptr) throw notAllowed(from, to);
   if (!from.isDate()) return std::to_string(*whole);
@@ -209,7 +240,7 @@ Value toText(const Value& value, const Type& from, const Type& to, Purpose purpo
 
 Value toBytes(const Value& value, const Type& from, const Type& to, Purpose purpose) {
   Bytes bytes;
-  if (const auto* held = std::get_if<Bytes>(&value))
+  if (const auto* held = std::get_if<Bytes>(&value); held && from.base != Base::decimal)
     bytes = *held;
   else if (const auto* text = std::get_if<std::string>(&value))
     bytes.assign(text->begin(), text->end());
@@ -250,6 +281,7 @@ Value convert(const Value& value, const Type& from, const Type& to, Purpose purp
   if (std::holds_alternative<std::monostate>(value) || to.base == Base::unknown) return value;
   if (from.base == Base::unknown) return convert(value, impliedType(value), to, purpose, style);
   if (to.isWhole()) return toWhole(value, from, to.base);
+  if (to.base == Base::decimal) return storedDecimal(requireDigits(decimalOf(value, from, to), to.size));
   if (to.isNumber()) return toReal(value, from, to.base);
   if (to.isDate()) return toDate(value, from, to.base, style);
   if (to.isText()) return toText(value, from, to, purpose, style);
@@ -274,6 +306,7 @@ std::int64_t lengthOf(const std::string& text) { return unitsOf(withoutTrailingB
 
 Variant variantOf(Value value, const Type& type) {
   if (auto* text = std::get_if<std::string>(&value)) return Variant(std::move(*text));
+  if (const auto decimal = asDecimal(value, type)) return numberVariant(doubleOf(*decimal, type.scale), type.base);
   if (auto* bytes = std::get_if<Bytes>(&value)) return Variant(std::move(*bytes));
   if (const auto* real = std::get_if<double>(&value)) return numberVariant(*real, type.base);
   const auto* whole = std::get_if<std::int64_t>(&value);

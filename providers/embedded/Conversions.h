@@ -19,9 +19,9 @@ const char* nameOf(Base base);
 
 // Converts as the dialect does by itself and with convert: '' is 0 as a number and 1900-01-01 as a date, blanks around
 // a number are passed over, any non-zero number is 1 as a bit, smalldatetime rounds to the minute, a real becomes a
-// whole number by cutting. `style` is convert's third argument (0 where there is none). Throws 245 (text to whole
-// number), 8114 (text to real), 241 and 242 (text to date), 295, 296 (to smalldatetime), 220 (tinyint, smallint), 244,
-// 248, 8115 (other overflow), 8152 (text truncated while storing).
+// whole number by cutting, a decimal is rounded to its scale. `style` is convert's third argument (0 where there is
+// none). Throws 245 (text to whole number), 8114 (text to real and decimal), 241 and 242 (text to date), 295, 296 (to
+// smalldatetime), 220 (tinyint, smallint), 244, 248, 8115 (other overflow), 8152 (text truncated while storing).
 Value convert(const Value& value, const Type& from, const Type& to, Purpose purpose, int style = 0);
 
 // Ticks of 1/300 s since 1900-01-01 and the library's date value, to and fro; a Date rounds to the nearest tick.

@@ -3,6 +3,7 @@
 #include <limits>
 #include <utility>
 
+#include "providers/embedded/Conversions.h"
 #include "providers/embedded/Function.h"
 #include "providers/embedded/Ticks.h"
 #include "providers/tsql/SqlFailure.h"
@@ -166,6 +167,23 @@ void dateDiff(Call& call) {
   call.give(difference);
 }
 
+template <Part part>
+void partAlone(Call& call) {
+  call.give(valueOfPart(part, call.whole(0)));
+}
+
+// Adds or subtracts two moments, each counted from 1900-01-01.
+void move(Call& call) {
+  const Type type = typeOfCode(call.whole(3));
+  const std::int64_t ticks = call.text(2) == "+" ? call.whole(0) + call.whole(1) : call.whole(0) - call.whole(1);
+  try {
+    call.give(convert(ticks, {Base::datetime, -1}, type, Purpose::compute));
+  } catch (const Failure&) {
+    throw sqlFailure(
+        8115, std::string("Arithmetic overflow error converting expression to data type ") + nameOf(type.base) + ".");
+  }
+}
+
 void datePart(Call& call) { call.give(valueOfPart(partOf(call.text(0)), call.whole(1))); }
 
 void getDate(Call& call) { call.give(call.session().statementTicks); }
@@ -173,6 +191,10 @@ void getDate(Call& call) { call.give(call.session().statementTicks); }
 constexpr Function functions[] = {{"t_dateadd", 3, dateAdd},
                                   {"t_datediff", 3, dateDiff},
                                   {"t_datepart", 2, datePart},
+                                  {"t_year", 1, partAlone<Part::year>},
+                                  {"t_month", 1, partAlone<Part::month>},
+                                  {"t_day", 1, partAlone<Part::day>},
+                                  {"t_move", 4, move},
                                   {"t_getdate", 0, getDate, false}};
 
 }  // namespace

@@ -51,7 +51,7 @@ void refuseTaken(const Catalogue& catalogue, std::size_t database, const std::st
 
 std::string storageType(const Type& type) {
   if (type.isWhole() || type.isDate()) return "integer";
-  if (type.isNumber()) return "real";
+  if (type.base == Base::real) return "real";
   return type.isText() ? "text collate tsql" : "blob";
 }
 

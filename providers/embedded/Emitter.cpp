@@ -1,183 +1,468 @@
 #include "providers/embedded/Emitter.h"
 
+#include <algorithm>
+#include <set>
+
+#include "providers/tsql/SqlFailure.h"
+
 namespace QVSa::embedded {
 
 namespace {
 
-template <class List, class Write>
-std::string joined(const List& list, const std::string& separator, Write write) {
-  std::string text;
-  for (const auto& item : list) {
-    if (!text.empty()) text += separator;
-    text += write(item);
+// SQLite's parser keeps what it has read of every construct that is not complete, in a stack of 100 places. A level of
+// each construct costs these (measured; a name or a literal at the bottom needs up to five).
+namespace places {
+constexpr int most = 90;
+constexpr int parenthesis = 1;
+constexpr int prefix = 2;
+constexpr int rightOperand = 3;
+constexpr int firstArgument = 3;
+constexpr int nextArgument = 5;
+constexpr int firstWhen = 4;
+constexpr int firstThen = 6;
+constexpr int nextWhen = 5;
+constexpr int nextThen = 7;
+constexpr int otherwise = 5;
+constexpr int low = 3;
+constexpr int high = 5;
+constexpr int inItem = 6;
+constexpr int inSelect = 4;
+constexpr int exists = 4;
+constexpr int item = 4;
+constexpr int derived = 6;
+constexpr int on = 9;
+constexpr int where = 7;
+constexpr int groupBy = 9;
+constexpr int having = 7;
+constexpr int orderBy = 11;
+constexpr int unionPart = 2;
+constexpr int commonTable = 8;
+constexpr int behindWith = 3;
+constexpr int values = 9;
+constexpr int assignment = 10;
+constexpr int updateFrom = 11;
+constexpr int deleteFrom = 8;
+}  // namespace places
+
+// A chain is written as chains of so many links: SQLite keeps the depth of an expression below 1,000, and counts a flat
+// chain as one level a link.
+constexpr std::size_t linksInARow = 16;
+// SQLite's functions take 127 operands at most.
+constexpr std::size_t mostOperands = 100;
+
+class Writer {
+ public:
+  void write(const BoundSelect& select);
+  void write(const BoundInsert& insert);
+  void write(const BoundUpdate& update);
+  void write(const BoundDelete& erase);
+
+  Emitted take() {
+    std::ranges::sort(emitted_.parameters);
+    const auto repeated = std::ranges::unique(emitted_.parameters);
+    emitted_.parameters.erase(repeated.begin(), repeated.end());
+    emitted_.databases.assign(databases_.begin(), databases_.end());
+    return std::move(emitted_);
   }
-  return text;
+
+ private:
+  // Takes places of the parser's stack while what is written inside is not complete.
+  class Pending {
+   public:
+    Pending(Writer& writer, int count) : writer_(writer), count_(count) {
+      if (writer_.pending_ + count_ > places::most) tsql::refuseDepth();
+      writer_.pending_ += count_;
+    }
+    ~Pending() { writer_.pending_ -= count_; }
+    Pending(const Pending&) = delete;
+    Pending& operator=(const Pending&) = delete;
+
+   private:
+    Writer& writer_;
+    int count_;
+  };
+
+  void add(std::string_view text) { emitted_.text += text; }
+  void addNumber(std::size_t number) { add(std::to_string(number)); }
+  template <class Node>
+  void inside(int count, const Node& node) {
+    const Pending pending(*this, count);
+    write(node);
+  }
+  template <class List, class Write>
+  void list(const List& items, std::string_view between, Write writeOne) {
+    bool first = true;
+    for (const auto& item : items) {
+      if (!first) add(between);
+      first = false;
+      writeOne(item);
+    }
+  }
+
+  void write(const BoundExpression& expression);
+  void writeParameter(std::size_t parameter);
+  void writeTable(const TableInfo& table);
+  void writeCall(const BoundExpression& call);
+  void writeArguments(const BoundExpression& call, std::size_t begin, std::size_t end);
+  void writeCalculation(const BoundExpression& call);
+  void writeAssociative(const BoundExpression& call, std::size_t begin, std::size_t end);
+  void writeInfix(const BoundExpression& chain, std::size_t begin, std::size_t end);
+  void writeCase(const BoundExpression& choice);
+  void writeIn(const BoundExpression& in);
+  void write(const BoundCore& core);
+  void writePart(const BoundCore& core, bool alone);
+  void writeSource(const BoundSource& source);
+  void writeFrom(const std::vector<BoundSource>& from);
+  void writeWhere(const std::vector<BoundPtr>& where);
+  void writeWith(const std::vector<BoundSelect::CommonTable>& with);
+  void writeOrder(const std::vector<BoundOrder>& orderBy);
+
+  Emitted emitted_;
+  std::set<std::size_t> databases_;
+  int pending_ = 0;
+};
+
+void Writer::writeParameter(std::size_t parameter) {
+  emitted_.parameters.push_back(parameter);
+  add("?");
+  addNumber(parameter + 1);
 }
 
-std::string expressions(const std::vector<BoundPtr>& list, const std::string& separator = ",") {
-  return joined(list, separator, [](const BoundPtr& item) { return emit(*item); });
+void Writer::writeTable(const TableInfo& table) {
+  databases_.insert(table.database);
+  add(databaseNames[table.database]);
+  add(".");
+  add(quoteName(table.name));
 }
 
-std::string parameterName(std::size_t parameter) { return "?" + std::to_string(parameter + 1); }
-
-std::string tableName(const TableInfo& table) {
-  return std::string(databaseNames[table.database]) + "." + quoteName(table.name);
+void Writer::write(const BoundExpression& expression) {
+  using Kind = BoundExpression::Kind;
+  switch (expression.kind) {
+    case Kind::null:
+      return add("null");
+    case Kind::parameter:
+      return writeParameter(expression.parameter);
+    case Kind::column:
+      add(expression.source);
+      add(".");
+      return add(expression.text);
+    case Kind::rowid:
+      add(expression.source);
+      return add(".rowid");
+    case Kind::constant:
+      return add(expression.text);
+    case Kind::call:
+      return writeCall(expression);
+    case Kind::prefix:
+      add("(");
+      add(expression.text);
+      add(" ");
+      inside(places::prefix, *expression.operands[0]);
+      return add(")");
+    case Kind::infix:
+      return writeInfix(expression, 0, expression.operands.size());
+    case Kind::isNull:
+      add("(");
+      inside(places::parenthesis, *expression.operands[0]);
+      return add(expression.negated ? " is not null)" : " is null)");
+    case Kind::between:
+      add("(");
+      inside(places::parenthesis, *expression.operands[0]);
+      add(expression.negated ? " not between " : " between ");
+      inside(places::low, *expression.operands[1]);
+      add(" and ");
+      inside(places::high, *expression.operands[2]);
+      return add(")");
+    case Kind::caseOf:
+      return writeCase(expression);
+    case Kind::inValues:
+    case Kind::inList:
+    case Kind::inSelect:
+      return writeIn(expression);
+    case Kind::exists:
+      add(expression.negated ? "(not exists (" : "(exists (");
+      inside(places::exists, *expression.select);
+      return add("))");
+    case Kind::subquery:
+      add("(");
+      inside(places::parenthesis, *expression.select);
+      return add(")");
+  }
 }
 
-std::string negation(const BoundExpression& expression) { return expression.negated ? " not" : ""; }
-
-std::string emitCase(const BoundExpression& expression) {
-  std::string text = "(case";
-  const std::size_t paired = expression.operands.size() / 2 * 2;
-  for (std::size_t i = 0; i < paired; i += 2)
-    text += " when " + emit(*expression.operands[i]) + " then " + emit(*expression.operands[i + 1]);
-  if (paired < expression.operands.size()) text += " else " + emit(*expression.operands.back());
-  return text + " end)";
+void Writer::writeCall(const BoundExpression& call) {
+  if (call.operands.size() <= mostOperands) return writeArguments(call, 0, call.operands.size());
+  if (call.text == "t_calculate") return writeCalculation(call);
+  writeAssociative(call, 0, call.operands.size());
 }
 
-std::string emitSource(const BoundSource& source) {
-  std::string text = source.table                 ? tableName(*source.table)
-                     : source.commonTable.empty() ? "(" + emit(*source.derived) + ")"
-                                                  : source.commonTable;
-  text += " as " + source.alias;
-  if (source.leftJoin) text += " on " + emit(*source.on);
-  return text;
+void Writer::writeArguments(const BoundExpression& call, std::size_t begin, std::size_t end) {
+  add(call.text);
+  add("(");
+  if (call.distinct) add("distinct ");
+  for (std::size_t i = begin; i < end; ++i) {
+    if (i > begin) add(",");
+    inside(i == begin ? places::firstArgument : places::nextArgument, *call.operands[i]);
+  }
+  add(")");
 }
 
-std::string emitFrom(const std::vector<BoundSource>& from) {
-  std::string text;
+// Numbers are added up from left to right, so that a long chain cannot be cut into calls of its parts: its operands go
+// in packs.
+void Writer::writeCalculation(const BoundExpression& call) {
+  const std::size_t count = call.operands.size() - 1;
+  const std::string& form = call.operands.back()->text;
+  const Pending pending(*this, places::nextArgument);
+  add("t_calculate(");
+  for (std::size_t begin = 0; begin < count; begin += mostOperands) {
+    add("t_pack(");
+    for (std::size_t i = begin; i < std::min(begin + mostOperands, count); ++i) {
+      inside(places::nextArgument, *call.operands[i]);
+      add(",");
+    }
+    add(form);
+    add("),");
+  }
+  // In capitals, the kind of number says that the operands lie in packs.
+  std::string packed = form;
+  packed[1] = static_cast<char>(packed[1] - ('a' - 'A'));
+  add(packed);
+  add(")");
+}
+
+// Of coalesce: whoever takes the first of all takes the first of the firsts of its parts.
+void Writer::writeAssociative(const BoundExpression& call, std::size_t begin, std::size_t end) {
+  std::size_t part = 1;
+  while (part * mostOperands < end - begin) part *= mostOperands;
+  if (part == 1) return writeArguments(call, begin, end);
+  const Pending pending(*this, places::nextArgument);
+  add(call.text);
+  add("(");
+  for (std::size_t at = begin; at < end; at += part) {
+    if (at > begin) add(",");
+    if (end - at == 1)
+      write(*call.operands[at]);
+    else
+      writeAssociative(call, at, std::min(at + part, end));
+  }
+  add(")");
+}
+
+void Writer::writeInfix(const BoundExpression& chain, std::size_t begin, std::size_t end) {
+  if (end - begin == 1) return write(*chain.operands[begin]);
+  std::size_t part = 1;
+  while (part * linksInARow < end - begin) part *= linksInARow;
+  add("(");
+  for (std::size_t at = begin; at < end; at += part) {
+    if (at > begin) {
+      add(" ");
+      add(chain.text);
+      add(" ");
+    }
+    const Pending pending(*this, at == begin ? places::parenthesis : places::rightOperand);
+    writeInfix(chain, at, std::min(at + part, end));
+  }
+  add(")");
+}
+
+void Writer::writeCase(const BoundExpression& choice) {
+  const std::size_t paired = choice.operands.size() / 2 * 2;
+  add("(case");
+  for (std::size_t i = 0; i < paired; i += 2) {
+    add(" when ");
+    inside(i == 0 ? places::firstWhen : places::nextWhen, *choice.operands[i]);
+    add(" then ");
+    inside(i == 0 ? places::firstThen : places::nextThen, *choice.operands[i + 1]);
+  }
+  if (paired < choice.operands.size()) {
+    add(" else ");
+    inside(places::otherwise, *choice.operands.back());
+  }
+  add(" end)");
+}
+
+void Writer::writeIn(const BoundExpression& in) {
+  add("(");
+  inside(places::parenthesis, *in.operands[0]);
+  add(in.negated ? " not in (" : " in (");
+  if (in.kind == BoundExpression::Kind::inSelect) {
+    inside(places::inSelect, *in.select);
+  } else if (in.kind == BoundExpression::Kind::inList) {
+    add("select value from list(");
+    writeParameter(in.parameter);
+    add(")");
+  } else {
+    for (std::size_t i = 1; i < in.operands.size(); ++i) {
+      if (i > 1) add(",");
+      inside(places::inItem, *in.operands[i]);
+    }
+  }
+  add("))");
+}
+
+void Writer::writeSource(const BoundSource& source) {
+  if (source.table) {
+    writeTable(*source.table);
+  } else if (source.derived) {
+    add("(");
+    inside(places::derived, *source.derived);
+    add(")");
+  } else {
+    add(source.commonTable);
+  }
+  add(" as ");
+  add(source.alias);
+  if (!source.leftJoin) return;
+  add(" on ");
+  inside(places::on, *source.on);
+}
+
+void Writer::writeFrom(const std::vector<BoundSource>& from) {
   for (const auto& source : from) {
-    if (!text.empty()) text += source.leftJoin ? " left join " : source.crossJoin ? " cross join " : ",";
-    text += emitSource(source);
+    if (&source != &from.front()) add(source.leftJoin ? " left join " : source.crossJoin ? " cross join " : ",");
+    writeSource(source);
   }
-  return text;
 }
 
-std::string emitWhere(const std::vector<BoundPtr>& where) {
-  return where.empty() ? "" : " where " + expressions(where, " and ");
+void Writer::writeWhere(const std::vector<BoundPtr>& where) {
+  if (where.empty()) return;
+  add(" where ");
+  list(where, " and ", [&](const BoundPtr& condition) { inside(places::where, *condition); });
 }
 
-std::string emitCore(const BoundCore& core) {
-  std::string text = core.distinct ? "select distinct " : "select ";
+void Writer::write(const BoundCore& core) {
+  add(core.distinct ? "select distinct " : "select ");
   std::size_t column = 0;
-  text += joined(core.items, ",",
-                 [&](const BoundItem& item) { return emit(*item.expression) + " as c" + std::to_string(column++); });
-  if (!core.from.empty()) text += " from " + emitFrom(core.from);
-  text += emitWhere(core.where);
-  if (!core.groupBy.empty()) text += " group by " + expressions(core.groupBy);
-  if (core.having) text += (core.groupBy.empty() ? " group by null having " : " having ") + emit(*core.having);
-  return text;
-}
-
-std::string emitWith(const std::vector<BoundSelect::CommonTable>& with) {
-  if (with.empty()) return "";
-  return "with recursive " +
-         joined(with, ",",
-                [](const BoundSelect::CommonTable& table) {
-                  std::string columns;
-                  for (std::size_t i = 0; i < table.columns; ++i) columns += (i ? ",c" : "c") + std::to_string(i);
-                  return table.name + "(" + columns + ") as (" + emit(*table.select) + ")";
-                }) +
-         " ";
-}
-
-std::string emitOrder(const std::vector<BoundOrder>& orderBy) {
-  if (orderBy.empty()) return "";
-  return " order by " + joined(orderBy, ",", [](const BoundOrder& order) {
-           return (order.expression ? emit(*order.expression) : std::to_string(order.ordinal)) +
-                  (order.descending ? " desc" : "");
-         });
+  list(core.items, ",", [&](const BoundItem& item) {
+    inside(places::item, *item.expression);
+    add(" as c");
+    addNumber(column++);
+  });
+  if (!core.from.empty()) add(" from ");
+  writeFrom(core.from);
+  writeWhere(core.where);
+  if (!core.groupBy.empty()) add(" group by ");
+  list(core.groupBy, ",", [&](const BoundPtr& key) { inside(places::groupBy, *key); });
+  if (!core.having) return;
+  add(core.groupBy.empty() ? " group by null having " : " having ");
+  inside(places::having, *core.having);
 }
 
 // A limit of one part of a union stands inside it, that of a single block behind its order.
-std::string emitPart(const BoundCore& core, bool alone) {
-  if (alone || !core.top) return emitCore(core);
-  return "select * from (" + emitCore(core) + " limit " + parameterName(*core.top) + ")";
+void Writer::writePart(const BoundCore& core, bool alone) {
+  if (alone || !core.top) return write(core);
+  add("select * from (");
+  inside(places::derived, core);
+  add(" limit ");
+  writeParameter(*core.top);
+  add(")");
+}
+
+void Writer::writeWith(const std::vector<BoundSelect::CommonTable>& with) {
+  if (with.empty()) return;
+  add("with recursive ");
+  list(with, ",", [&](const BoundSelect::CommonTable& table) {
+    add(table.name);
+    for (std::size_t i = 0; i < table.columns; ++i) {
+      add(i == 0 ? "(c" : ",c");
+      addNumber(i);
+    }
+    add(") as (");
+    inside(places::commonTable, *table.select);
+    add(")");
+  });
+  add(" ");
+}
+
+void Writer::writeOrder(const std::vector<BoundOrder>& orderBy) {
+  if (orderBy.empty()) return;
+  add(" order by ");
+  list(orderBy, ",", [&](const BoundOrder& order) {
+    if (order.expression)
+      inside(places::orderBy, *order.expression);
+    else
+      addNumber(order.ordinal);
+    if (order.descending) add(" desc");
+  });
+}
+
+void Writer::write(const BoundSelect& select) {
+  writeWith(select.with);
+  const Pending behindWith(*this, select.with.empty() ? 0 : places::behindWith);
+  const bool alone = select.parts.size() == 1;
+  const Pending part(*this, alone ? 0 : places::unionPart);
+  for (const auto& one : select.parts) {
+    if (&one != &select.parts.front()) add(one.all ? " union all " : " union ");
+    writePart(one.core, alone);
+  }
+  writeOrder(select.orderBy);
+  if (!alone || !select.parts.front().core.top) return;
+  add(" limit ");
+  writeParameter(*select.parts.front().core.top);
+}
+
+void Writer::write(const BoundInsert& insert) {
+  add("insert into ");
+  writeTable(*insert.table);
+  add("(");
+  list(insert.columns, ",", [&](std::size_t column) { add(quoteName(insert.table->columns[column].name)); });
+  add(") ");
+  if (insert.select) return inside(places::values, *insert.select);
+  add("values ");
+  list(insert.rows, ",", [&](const std::vector<BoundPtr>& row) {
+    add("(");
+    list(row, ",", [&](const BoundPtr& value) { inside(places::values, *value); });
+    add(")");
+  });
+}
+
+void Writer::write(const BoundUpdate& update) {
+  add("update ");
+  writeTable(*update.table);
+  add(" as ");
+  add(update.alias);
+  add(" set ");
+  std::size_t value = 0;
+  list(update.assignments, ",", [&](const auto& assignment) {
+    add(quoteName(update.table->columns[assignment.first].name));
+    add("=");
+    if (!update.from) return inside(places::assignment, *assignment.second);
+    add("n.c");
+    addNumber(++value);
+  });
+  if (!update.from) return writeWhere(update.where);
+  add(" from (");
+  inside(places::updateFrom, *update.from);
+  add(") as n where ");
+  add(update.alias);
+  add(".rowid=n.c0");
+}
+
+void Writer::write(const BoundDelete& erase) {
+  add("delete from ");
+  writeTable(*erase.table);
+  if (!erase.from) {
+    add(" as ");
+    add(erase.alias);
+    return writeWhere(erase.where);
+  }
+  add(" where rowid in (");
+  inside(places::deleteFrom, *erase.from);
+  add(")");
+}
+
+template <class Statement>
+Emitted emitted(const Statement& statement) {
+  Writer writer;
+  writer.write(statement);
+  return writer.take();
 }
 
 }  // namespace
 
-std::string emit(const BoundExpression& expression) {
-  using Kind = BoundExpression::Kind;
-  const auto operand = [&](std::size_t i) { return emit(*expression.operands[i]); };
-  switch (expression.kind) {
-    case Kind::null:
-      return "null";
-    case Kind::parameter:
-      return parameterName(expression.parameter);
-    case Kind::column:
-      return expression.source + "." + expression.text;
-    case Kind::rowid:
-      return expression.source + ".rowid";
-    case Kind::constant:
-      return expression.text;
-    case Kind::call:
-      return expression.text + "(" + (expression.distinct ? "distinct " : "") + expressions(expression.operands) + ")";
-    case Kind::prefix:
-      return "(" + expression.text + " " + operand(0) + ")";
-    case Kind::infix:
-      return "(" + operand(0) + " " + expression.text + " " + operand(1) + ")";
-    case Kind::isNull:
-      return "(" + operand(0) + (expression.negated ? " is not null)" : " is null)");
-    case Kind::between:
-      return "(" + operand(0) + negation(expression) + " between " + operand(1) + " and " + operand(2) + ")";
-    case Kind::caseOf:
-      return emitCase(expression);
-    case Kind::inValues: {
-      std::string items;
-      for (std::size_t i = 1; i < expression.operands.size(); ++i) items += (i > 1 ? "," : "") + operand(i);
-      return "(" + operand(0) + negation(expression) + " in (" + items + "))";
-    }
-    case Kind::inList:
-      return "(" + operand(0) + negation(expression) + " in (select value from list(" +
-             parameterName(expression.parameter) + ")))";
-    case Kind::inSelect:
-      return "(" + operand(0) + negation(expression) + " in (" + emit(*expression.select) + "))";
-    case Kind::exists:
-      return "(" + std::string(expression.negated ? "not " : "") + "exists (" + emit(*expression.select) + "))";
-    case Kind::subquery:
-      return "(" + emit(*expression.select) + ")";
-  }
-  return "";
-}
-
-std::string emit(const BoundSelect& select) {
-  std::string text = emitWith(select.with);
-  const bool alone = select.parts.size() == 1;
-  for (const auto& part : select.parts) {
-    if (&part != &select.parts.front()) text += part.all ? " union all " : " union ";
-    text += emitPart(part.core, alone);
-  }
-  text += emitOrder(select.orderBy);
-  if (alone && select.parts.front().core.top) text += " limit " + parameterName(*select.parts.front().core.top);
-  return text;
-}
-
-std::string emit(const BoundInsert& insert) {
-  std::string text =
-      "insert into " + tableName(*insert.table) + "(" +
-      joined(insert.columns, ",", [&](std::size_t column) { return quoteName(insert.table->columns[column].name); }) +
-      ") ";
-  if (insert.select) return text + emit(*insert.select);
-  return text + "values " +
-         joined(insert.rows, ",", [](const std::vector<BoundPtr>& row) { return "(" + expressions(row) + ")"; });
-}
-
-std::string emit(const BoundUpdate& update) {
-  std::size_t value = 0;
-  std::string text = "update " + tableName(*update.table) + " as " + update.alias + " set " +
-                     joined(update.assignments, ",", [&](const auto& assignment) {
-                       return quoteName(update.table->columns[assignment.first].name) + "=" +
-                              (update.from ? "n.c" + std::to_string(++value) : emit(*assignment.second));
-                     });
-  if (!update.from) return text + emitWhere(update.where);
-  return text + " from (" + emit(*update.from) + ") as n where " + update.alias + ".rowid=n.c0";
-}
-
-std::string emit(const BoundDelete& erase) {
-  const std::string text = "delete from " + tableName(*erase.table);
-  if (erase.from) return text + " where rowid in (" + emit(*erase.from) + ")";
-  return text + " as " + erase.alias + emitWhere(erase.where);
-}
+Emitted emit(const BoundSelect& select) { return emitted(select); }
+Emitted emit(const BoundInsert& insert) { return emitted(insert); }
+Emitted emit(const BoundUpdate& update) { return emitted(update); }
+Emitted emit(const BoundDelete& erase) { return emitted(erase); }
 
 }  // namespace QVSa::embedded

@@ -1,17 +1,24 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include "providers/embedded/Bound.h"
 
 namespace QVSa::embedded {
 
-// Writes bound statements as the storage library's SQL: every table qualified by its database, every literal a numbered
-// parameter, result columns named c0, c1, ... by their place.
-std::string emit(const BoundExpression& expression);
-std::string emit(const BoundSelect& select);
-std::string emit(const BoundInsert& insert);
-std::string emit(const BoundUpdate& update);
-std::string emit(const BoundDelete& erase);
+struct Emitted {
+  std::string text;
+  std::vector<std::size_t> parameters;  // that the text takes, by their place in the statement's list, each once
+  std::vector<std::size_t> databases;   // that the text names
+};
+
+// Writes bound statements as SQLite's SQL: every table qualified by its database, every literal a numbered parameter,
+// result columns named c0, c1, ... by their place. Chains of operators come out flat, whatever their length. Throws 191
+// for what is nested deeper than SQLite's parser has room for.
+Emitted emit(const BoundSelect& select);
+Emitted emit(const BoundInsert& insert);
+Emitted emit(const BoundUpdate& update);
+Emitted emit(const BoundDelete& erase);
 
 }  // namespace QVSa::embedded

@@ -6,10 +6,12 @@
 
 #include "providers/embedded/Collation.h"
 #include "providers/embedded/Conversions.h"
+#include "providers/embedded/Decimal.h"
 #include "providers/embedded/Function.h"
 #include "providers/embedded/ListTable.h"
 #include "providers/embedded/StorageFailure.h"
 #include "providers/embedded/StoredValue.h"
+#include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
 
@@ -24,34 +26,26 @@ struct Registered {
   FunctionContext* session;
 };
 
-// Nothing may be thrown through the storage library's frames.
-void keep(sqlite3_context* context, const char* text) {
-  keptFailure = std::current_exception();
-  sqlite3_result_error(context, text, -1);
-  sqlite3_result_error_code(context, functionFailed);
-}
-
 void run(sqlite3_context* context, int count, sqlite3_value** arguments) {
   const auto* const registered = static_cast<const Registered*>(sqlite3_user_data(context));
   try {
     Call call(context, count, arguments, *registered->session);
     if (!call.anyNull()) registered->function->body(call);
   } catch (const std::exception& e) {
-    keep(context, e.what());
+    keepFailure(context, e.what());
   }
 }
 
 void convertValue(Call& call) {
-  const Type from{static_cast<Base>(call.whole(1)), -1};
-  const Type to{static_cast<Base>(call.whole(2)), static_cast<int>(call.whole(3))};
-  call.give(convert(call.value(0), from, to, static_cast<Purpose>(call.whole(4)), static_cast<int>(call.whole(5))));
+  call.give(convert(call.value(0), typeOfCode(call.whole(1)), typeOfCode(call.whole(2)),
+                    static_cast<Purpose>(call.whole(3)), static_cast<int>(call.whole(4))));
 }
 
 void scopeIdentity(Call& call) {
-  if (call.session().hasScopeIdentity) call.give(call.session().scopeIdentity);
+  if (call.session().hasScopeIdentity) call.give(storedDecimal(call.session().scopeIdentity));
 }
 
-constexpr Function sessionFunctions[] = {{"t_convert", 6, convertValue}, {"t_scope_identity", 0, scopeIdentity, false}};
+constexpr Function sessionFunctions[] = {{"t_convert", 5, convertValue}, {"t_scope_identity", 0, scopeIdentity, false}};
 
 void registerAll(sqlite3* handle, FunctionContext& session, std::span<const Function> functions) {
   const auto destroy = [](void* registered) { delete static_cast<Registered*>(registered); };
@@ -67,6 +61,12 @@ void registerAll(sqlite3* handle, FunctionContext& session, std::span<const Func
 
 }  // namespace
 
+void keepFailure(sqlite3_context* context, const char* text) {
+  keptFailure = std::current_exception();
+  sqlite3_result_error(context, text, -1);
+  sqlite3_result_error_code(context, functionFailed);
+}
+
 bool Call::anyNull() const {
   for (int i = 0; i < count_; ++i)
     if (isNull(i)) return true;
@@ -79,6 +79,17 @@ std::string_view Call::text(int i) const {
   return {reinterpret_cast<const char*>(text), static_cast<std::size_t>(sqlite3_value_bytes(arguments_[i]))};
 }
 
+std::span<const std::uint8_t> Call::bytes(int i) const {
+  const void* const bytes = sqlite3_value_blob(arguments_[i]);
+  return {static_cast<const std::uint8_t*>(bytes), static_cast<std::size_t>(sqlite3_value_bytes(arguments_[i]))};
+}
+
+Decimal Call::decimal(int i) const {
+  const auto stored = bytes(i);
+  if (stored.size() != decimalBytes) throw tsql::sqlFailure(824, "The database is damaged: a decimal is none.");
+  return decimalFrom(stored.data());
+}
+
 Value Call::value(int i) const { return readValue(arguments_[i]); }
 
 void Call::give(const Value& value) { giveResult(context_, value); }
@@ -89,6 +100,7 @@ void registerFunctions(sqlite3* handle, FunctionContext& context) {
   registerAll(handle, context, textFunctions());
   registerAll(handle, context, dateFunctions());
   registerAll(handle, context, numberFunctions());
+  registerAggregates(handle);
   registerListTable(handle);
 }
 

@@ -78,14 +78,16 @@ class Pattern {
 
 }  // namespace
 
-bool matchesLike(std::string_view value, std::string_view text, std::optional<char32_t> escape) {
+bool matchesLike(std::string_view value, std::string_view text, std::optional<char32_t> escape, bool blanksMayFollow) {
   Pattern pattern(text, escape);
   const char* at = value.data();
   const char* const end = at + value.size();
+  const char* const enough = blanksMayFollow ? at + withoutTrailingBlanks(value).size() : end;
   // Only the last "%" is ever tried again with a longer text: what an earlier one could win, the last one wins too.
   std::optional<Pattern> behindAny;
   const char* retry = at;
   while (at < end) {
+    if (at >= enough && pattern.done()) return true;
     if (pattern.skipAny()) {
       behindAny = pattern;
       retry = at;

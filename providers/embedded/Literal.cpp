@@ -1,7 +1,10 @@
 #include "providers/embedded/Literal.h"
 
+#include <algorithm>
 #include <charconv>
 
+#include "providers/embedded/Decimal.h"
+#include "providers/embedded/TypeRules.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
@@ -28,20 +31,33 @@ Bytes bytesOf(const std::string& digits) {
   return bytes;
 }
 
+Type decimalType(const tsql::Token& token) {
+  const tsql::LiteralSize size = tsql::sizeOf(token);
+  if (size.whole + size.fraction > mostDecimalDigits)
+    throw tsql::sqlFailure(
+        1007, "The number '" + token.text + "' is out of the range for numeric representation (maximum precision 38).");
+  return {Base::decimal, std::max(static_cast<int>(size.whole + size.fraction), 1), static_cast<int>(size.fraction)};
+}
+
 }  // namespace
 
-Type literalType(tsql::TokenKind kind) {
-  switch (kind) {
+Type literalType(const tsql::Token& token) {
+  switch (token.kind) {
     case tsql::TokenKind::integer:
       return {Base::integer, -1};
     case tsql::TokenKind::decimal:
-      return {Base::decimal, -1};
+      return decimalType(token);
     case tsql::TokenKind::real:
       return {Base::real, -1};
     case tsql::TokenKind::binary:
       return {Base::image, -1};
+    case tsql::TokenKind::list: {
+      Type type;
+      for (const tsql::Token& item : token.items) type = commonType(type, literalType(item));
+      return type;
+    }
     default:
-      return {Base::nvarchar, -1};
+      return textType(token.unicode ? Base::nvarchar : Base::varchar, tsql::sizeOf(token).isLong);
   }
 }
 
@@ -51,7 +67,10 @@ Value literalValue(const tsql::Token& token, bool negate) {
       const auto number = read<std::int64_t>(token.text);
       return negate ? -number : number;
     }
-    case tsql::TokenKind::decimal:
+    case tsql::TokenKind::decimal: {
+      const Decimal number = readDecimal(token.text, literalType(token).scale).value_or(0);
+      return storedDecimal(negate ? -number : number);
+    }
     case tsql::TokenKind::real: {
       const auto number = read<double>(token.text);
       return negate ? -number : number;

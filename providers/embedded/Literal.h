@@ -5,7 +5,8 @@
 
 namespace QVSa::embedded {
 
-Type literalType(tsql::TokenKind kind);
+// Of a list: the one that all its items meet in. Throws 1007 for a number of more than 38 digits.
+Type literalType(const tsql::Token& token);
 
 // The literal's value as it lies in a file. Throws 8115 for a number beyond what a double holds.
 Value literalValue(const tsql::Token& token, bool negate);

@@ -8,12 +8,6 @@ namespace QVSa::embedded {
 
 namespace {
 
-std::string_view trimmed(std::string_view text) {
-  const std::size_t first = text.find_first_not_of(' ');
-  if (first == std::string_view::npos) return {};
-  return text.substr(first, text.find_last_not_of(' ') - first + 1);
-}
-
 // from_chars takes no plus sign, but a sign behind one would pass.
 bool skipPlus(std::string_view& text) {
   if (!text.starts_with('+')) return true;
@@ -35,9 +29,15 @@ void widenExponent(std::string& text) {
 
 }  // namespace
 
+std::string_view withoutBlanks(std::string_view text) {
+  const std::size_t first = text.find_first_not_of(' ');
+  if (first == std::string_view::npos) return {};
+  return text.substr(first, text.find_last_not_of(' ') - first + 1);
+}
+
 std::optional<std::int64_t> readWhole(std::string_view text, bool& overflow) {
   overflow = false;
-  text = trimmed(text);
+  text = withoutBlanks(text);
   if (text.empty()) return 0;
   if (!skipPlus(text)) return std::nullopt;
   std::int64_t value = 0;
@@ -49,7 +49,7 @@ std::optional<std::int64_t> readWhole(std::string_view text, bool& overflow) {
 }
 
 std::optional<double> readReal(std::string_view text) {
-  text = trimmed(text);
+  text = withoutBlanks(text);
   if (text.empty()) return 0;
   if (!skipPlus(text) || text.find_first_not_of("0123456789+-.eE") != std::string_view::npos) return std::nullopt;
   double value = 0;

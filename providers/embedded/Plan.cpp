@@ -1,9 +1,6 @@
 #include "providers/embedded/Plan.h"
 
 #include <algorithm>
-#include <cstdlib>
-#include <new>
-#include <set>
 
 #include "providers/embedded/Binder.h"
 #include "providers/embedded/Emitter.h"
@@ -79,10 +76,20 @@ Step compileStatement(tsql::Statement& statement, Binder& binder, bool updatable
   return step;
 }
 
-template <class Visit>
-void forEachLiteral(const std::vector<tsql::Token>& tokens, Visit visit) {
-  for (const auto& token : tokens)
-    if (tsql::isLiteral(token.kind)) visit(token);
+// A literal that is used in several ways counts by the one that asks for most.
+void setUses(const Step& step, const std::vector<std::size_t>& patterns, LiteralUses& uses) {
+  const auto isOfBatch = [](const Parameter& parameter) {
+    return !parameter.own && parameter.source != Parameter::Source::lockedRows;
+  };
+  const auto set = [&](std::size_t literal, LiteralUse use) {
+    if (literal >= uses.size()) uses.resize(literal + 1, LiteralUse::value);
+    uses[literal] = use;
+  };
+  for (const auto& parameter : step.parameters)
+    if (isOfBatch(parameter)) set(parameter.literal, LiteralUse::none);
+  for (const std::size_t pattern : patterns) set(pattern, LiteralUse::pattern);
+  for (const auto& parameter : step.parameters)
+    if (isOfBatch(parameter) && parameter.structural) set(parameter.literal, LiteralUse::value);
 }
 
 }  // namespace
@@ -93,21 +100,7 @@ Prepared Compiled::take(Handle& handle) {
     idle_.pop_back();
     return statement;
   }
-  Prepared statement(handle.get(), text_);
-  if (parameters_.empty()) {
-    std::vector<std::size_t> named;
-    for (int i = 1; i <= sqlite3_bind_parameter_count(statement.get()); ++i)
-      if (sqlite3_bind_parameter_name(statement.get(), i)) named.push_back(static_cast<std::size_t>(i - 1));
-    parameters_ = std::move(named);
-  }
-  return statement;
-}
-
-std::vector<std::size_t> Compiled::databases() const {
-  std::vector<std::size_t> named;
-  for (std::size_t i = 0; i < databaseNames.size(); ++i)
-    if (text_.find(std::string(databaseNames[i]) + ".\"") != std::string::npos) named.push_back(i);
-  return named;
+  return Prepared(handle.get(), emitted_.text);
 }
 
 void Compiled::giveBack(Prepared statement) noexcept {
@@ -120,57 +113,43 @@ void Compiled::giveBack(Prepared statement) noexcept {
 }
 
 Step compile(tsql::Statement statement, const Catalogue& catalogue, std::size_t database, bool updatable,
-             ShapeFacts& facts) {
+             tsql::Deadline deadline, LiteralUses& uses) {
   tsql::rewriteOuterJoins(statement);
-  Binder binder(catalogue, database);
+  Binder binder(catalogue, database, deadline);
   Step step = compileStatement(statement, binder, updatable);
   if (step.main) step.databases = step.main->databases();
   step.parameters = binder.takeParameters();
-  for (const auto& pattern : binder.takePatterns()) facts.patterns.push_back(pattern);
-  std::set<std::size_t> structural;
-  for (const auto& parameter : step.parameters)
-    if (parameter.structural) structural.insert(parameter.literal);
-  for (const auto& parameter : step.parameters)
-    if (!parameter.own && parameter.source != Parameter::Source::lockedRows && !structural.contains(parameter.literal))
-      facts.parameters.push_back(parameter.literal);
+  setUses(step, binder.takePatterns(), uses);
   return step;
 }
 
-std::string PlanCache::variant(const Shape& shape, const std::vector<tsql::Token>& tokens) {
+std::string PlanCache::variant(const LiteralUses& uses, const std::vector<tsql::Token>& tokens) {
   std::string text;
-  if (shape.values.empty() && shape.patterns.empty()) return text;
-  forEachLiteral(tokens, [&](const tsql::Token& token) {
-    if (std::ranges::find(shape.values, token.literal) != shape.values.end())
-      text += std::to_string(token.text.size()) + ":" + token.text;
-    else if (std::ranges::find(shape.patterns, token.literal) != shape.patterns.end())
-      text += likePrefix(token.text).empty() ? '%' : 'p';
-  });
+  for (const auto& token : tokens) {
+    if (!tsql::isLiteral(token.kind)) continue;
+    const LiteralUse use = token.literal < uses.size() ? uses[token.literal] : LiteralUse::value;
+    if (use == LiteralUse::value) text += std::to_string(token.text.size()) + ":" + token.text;
+    if (use == LiteralUse::pattern) text += likePrefix(token.text).empty() ? '%' : 'p';
+  }
   return text;
 }
 
 std::shared_ptr<Plan> PlanCache::find(const std::string& shape, const std::vector<tsql::Token>& tokens) const {
   const auto known = shapes_.find(shape);
   if (known == shapes_.end()) return nullptr;
-  const auto plan = known->second.plans.find(variant(known->second, tokens));
+  const auto plan = known->second.plans.find(variant(known->second.uses, tokens));
   return plan == known->second.plans.end() ? nullptr : plan->second;
 }
 
-void PlanCache::add(const std::string& shape, const std::vector<tsql::Token>& tokens, const ShapeFacts& facts,
+void PlanCache::add(const std::string& shape, const std::vector<tsql::Token>& tokens, LiteralUses uses,
                     std::shared_ptr<Plan> plan) {
   if (++size_ > cacheLimit) {
     shapes_.clear();
     size_ = 1;
   }
   Shape& known = shapes_[shape];
-  if (known.plans.empty()) {
-    known.patterns = facts.patterns;
-    known.values.clear();
-    forEachLiteral(tokens, [&](const tsql::Token& token) {
-      if (std::ranges::find(facts.parameters, token.literal) == facts.parameters.end())
-        known.values.push_back(token.literal);
-    });
-  }
-  known.plans[variant(known, tokens)] = std::move(plan);
+  if (known.plans.empty()) known.uses = std::move(uses);
+  known.plans[variant(known.uses, tokens)] = std::move(plan);
 }
 
 }  // namespace QVSa::embedded

@@ -6,6 +6,7 @@
 
 #include "QVSa/frame/Provider.h"
 #include "providers/embedded/Bound.h"
+#include "providers/embedded/Emitter.h"
 #include "providers/embedded/Handle.h"
 #include "providers/tsql/Tree.h"
 
@@ -14,19 +15,18 @@ namespace QVSa::embedded {
 // A text of the storage library, compiled at its first use and kept compiled.
 class Compiled {
  public:
-  explicit Compiled(std::string text) : text_(std::move(text)) {}
+  explicit Compiled(Emitted emitted) : emitted_(std::move(emitted)) {}
 
   // A statement for one run. Two runs at once have two of them.
   Prepared take(Handle& handle);
   void giveBack(Prepared statement) noexcept;
   // The parameters that the text takes, by their place in the step's list.
-  const std::vector<std::size_t>& parameters() const { return parameters_; }
+  const std::vector<std::size_t>& parameters() const { return emitted_.parameters; }
   // The databases that the text names.
-  std::vector<std::size_t> databases() const;
+  const std::vector<std::size_t>& databases() const { return emitted_.databases; }
 
  private:
-  std::string text_;
-  std::vector<std::size_t> parameters_;
+  Emitted emitted_;
   std::vector<Prepared> idle_;
 };
 
@@ -60,29 +60,32 @@ struct Plan {
   std::vector<Step> steps;
 };
 
-// Compiles one statement. `patterns` gets the literals whose form, and `values` those whose value, the text rests on.
-struct ShapeFacts {
-  std::vector<std::size_t> parameters;  // literals that any other value can take the place of
-  std::vector<std::size_t> patterns;    // literals that count by whether they begin with a plain text
+// What the compiled text rests on, for each literal of the batch.
+enum class LiteralUse : std::uint8_t {
+  value,    // its value
+  pattern,  // whether it begins with a plain text
+  none,     // any other value can take its place
 };
+using LiteralUses = std::vector<LiteralUse>;
+
+// Compiles one statement. `uses` grows with the literals that are found to be used otherwise than by their value.
 Step compile(tsql::Statement statement, const Catalogue& catalogue, std::size_t database, bool updatable,
-             ShapeFacts& facts);
+             tsql::Deadline deadline, LiteralUses& uses);
 
 // Plans by the shape of their batch and by those literals that the compiled text rests on.
 class PlanCache {
  public:
   std::shared_ptr<Plan> find(const std::string& shape, const std::vector<tsql::Token>& tokens) const;
-  void add(const std::string& shape, const std::vector<tsql::Token>& tokens, const ShapeFacts& facts,
+  void add(const std::string& shape, const std::vector<tsql::Token>& tokens, LiteralUses uses,
            std::shared_ptr<Plan> plan);
   void clear() { shapes_.clear(); }
 
  private:
   struct Shape {
-    std::vector<std::size_t> values;
-    std::vector<std::size_t> patterns;
+    LiteralUses uses;
     std::map<std::string, std::shared_ptr<Plan>> plans;
   };
-  static std::string variant(const Shape& shape, const std::vector<tsql::Token>& tokens);
+  static std::string variant(const LiteralUses& uses, const std::vector<tsql::Token>& tokens);
 
   std::unordered_map<std::string, Shape> shapes_;
   std::size_t size_ = 0;

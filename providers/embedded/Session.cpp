@@ -43,14 +43,14 @@ Value parameterValue(const Parameter& parameter, const tsql::Token& token) {
   }
   Value value = literalValue(token, parameter.negate);
   if (!parameter.converted) return value;
-  return convert(value, literalType(token.kind), parameter.type, parameter.purpose, parameter.style);
+  return convert(value, literalType(token), parameter.type, parameter.purpose, parameter.style);
 }
 
 std::shared_ptr<const ValueList> listValue(const Parameter& parameter, const tsql::Token& list) {
   auto values = std::make_shared<ValueList>();
   values->reserve(list.items.size());
   for (const auto& item : list.items)
-    values->push_back(convert(literalValue(item, false), literalType(item.kind), parameter.type, Purpose::compute));
+    values->push_back(convert(literalValue(item, false), literalType(item), parameter.type, Purpose::compute));
   return values;
 }
 
@@ -122,34 +122,36 @@ BatchResult EmbeddedSession::run(const Batch& batch) {
 }
 
 BatchResult EmbeddedSession::runStatements(const Batch& batch) {
-  auto tokens = tsql::tokenize(batch.text);
+  auto tokens = tsql::tokenize(batch.text, tsql::Deadline(handle_->deadline()));
   BatchResult result;
   if (const auto plan = planFor(batch, tokens)) {
     for (auto& step : plan->steps) runStep(plan, step, tokens, result);
     return result;
   }
-  return runUncached(tsql::parse(tokens), batch, tokens);
+  return runUncached(tsql::parse(tokens, tsql::Deadline(handle_->deadline())), batch, tokens);
 }
 
 std::shared_ptr<Plan> EmbeddedSession::planFor(const Batch& batch, std::vector<tsql::Token>& tokens) {
   PlanCache& plans = cache_->plans[2 * database_ + (batch.updatable ? 1 : 0)];
   const std::string shape = tsql::shapeOf(tokens);
   if (auto known = plans.find(shape, tokens)) return known;
-  auto statements = tsql::parse(tokens);
+  const tsql::Deadline deadline(handle_->deadline());
+  auto statements = tsql::parse(tokens, deadline);
   if (std::ranges::any_of(statements, changesNames)) return nullptr;
   auto plan = std::make_shared<Plan>();
   plan->catalogue = cache_->catalogue;
-  ShapeFacts facts;
+  LiteralUses uses;
   try {
     for (auto& statement : statements)
-      plan->steps.push_back(compile(std::move(statement), *plan->catalogue, database_, batch.updatable, facts));
+      plan->steps.push_back(
+          compile(std::move(statement), *plan->catalogue, database_, batch.updatable, deadline, uses));
   } catch (const Failure& failure) {
     // Another session may have made the object since this one looked.
     if (cache_->catalogue->version() == handle_->catalogueVersion()) throw;
     refreshCatalogue();
     return planFor(batch, tokens);
   }
-  plans.add(shape, tokens, facts, plan);
+  plans.add(shape, tokens, std::move(uses), plan);
   return plan;
 }
 
@@ -159,8 +161,9 @@ BatchResult EmbeddedSession::runUncached(std::vector<tsql::Statement> statements
   for (auto& statement : statements) {
     auto plan = std::make_shared<Plan>();
     plan->catalogue = cache_->catalogue;
-    ShapeFacts facts;
-    plan->steps.push_back(compile(std::move(statement), *plan->catalogue, database_, batch.updatable, facts));
+    LiteralUses uses;
+    plan->steps.push_back(compile(std::move(statement), *plan->catalogue, database_, batch.updatable,
+                                  tsql::Deadline(handle_->deadline()), uses));
     runStep(plan, plan->steps.front(), tokens, result);
   }
   return result;

@@ -1,11 +1,16 @@
 #include "providers/embedded/StorageFailure.h"
 
+#include <algorithm>
 #include <new>
 #include <optional>
 #include <sqlite3.h>
 #include <string>
+#include <system_error>
 
+#include "providers/embedded/Catalogue.h"
 #include "providers/embedded/Functions.h"
+#include "providers/embedded/NullIndex.h"
+#include "providers/tsql/Parser.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
@@ -19,6 +24,17 @@ Failure deadlock() {
       1205,
       "Transaction was deadlocked on lock resources with another process and has been chosen as the deadlock "
       "victim. Rerun the transaction.");
+}
+
+Failure notRunnable() { return Failure(number::statement, "SQL Server", "The statement can't be run here."); }
+
+// Of an object that another session has dropped since this one looked.
+Failure failedStatement(const std::string& message) {
+  constexpr std::string_view noTable = "no such table: ";
+  if (!message.starts_with(noTable)) return notRunnable();
+  const std::size_t database = message.find('.');
+  return sqlFailure(208, "Invalid object name '" +
+                             message.substr(database == std::string::npos ? noTable.size() : database + 1) + "'.");
 }
 
 // "UNIQUE constraint failed: users.userLogin, users.deptId": the columns behind the colon.
@@ -53,15 +69,52 @@ std::optional<std::string> madeIndex(sqlite3* handle, const std::string& columns
   return name;
 }
 
-Failure duplicate(sqlite3* handle, int code, const std::string& message) {
-  const std::string columns = constrainedColumns(message);
-  const std::string table = tableOf(columns);
-  if (const auto index = madeIndex(handle, columns))
-    return sqlFailure(2601,
-                      "Cannot insert duplicate key row in object '" + table + "' with unique index '" + *index + "'.");
-  const std::string kind = code == SQLITE_CONSTRAINT_UNIQUE ? "UNIQUE KEY" : "PRIMARY KEY";
+// As the library's message tells columns: those of a key of the table, if it is its primary key.
+std::string primaryKeyOf(const tsql::CreateTable& table) {
+  std::string columns;
+  const auto add = [&](const std::string& column) {
+    columns += (columns.empty() ? "" : ", ") + table.table.name + "." + column;
+  };
+  for (const auto& column : table.columns)
+    if (column.primaryKey) add(column.name);
+  for (const auto& key : table.keys)
+    if (key.primary) std::ranges::for_each(key.columns, add);
+  return columns;
+}
+
+// Whether these columns are the primary key of the table in one of the databases, which the message does not tell.
+bool isPrimaryKey(sqlite3* handle, const std::string& columns) {
+  for (const char* database : databaseNames) {
+    Prepared query(handle, std::string("select text from ") + database + ".definitions where name=?");
+    query.bind(1, foldName(tableOf(columns)));
+    if (!query.step()) continue;
+    const auto statements = tsql::parse(tsql::tokenize(std::get<std::string>(query.column(0))));
+    const auto* const table = std::get_if<tsql::CreateTable>(&statements.front());
+    if (table != nullptr && sameName(primaryKeyOf(*table), columns)) return true;
+  }
+  return false;
+}
+
+Failure duplicateKey(const std::string& kind, const std::string& table, const std::string& columns) {
   return sqlFailure(2627, "Violation of " + kind + " constraint. Cannot insert duplicate key in object '" + table +
                               "'. (column " + columns + ")");
+}
+
+Failure duplicateRow(const std::string& table, const std::string& index) {
+  return sqlFailure(2601,
+                    "Cannot insert duplicate key row in object '" + table + "' with unique index '" + index + "'.");
+}
+
+Failure duplicate(sqlite3* handle, int code, const std::string& message) {
+  const std::string columns = constrainedColumns(message);
+  if (const auto nulls = readNullIndex(columns)) {
+    const auto& [table, index] = *nulls;
+    return index.empty() ? duplicateKey("UNIQUE KEY", table, "that is NULL") : duplicateRow(table, index);
+  }
+  const std::string table = tableOf(columns);
+  if (const auto index = madeIndex(handle, columns)) return duplicateRow(table, *index);
+  const bool isPrimary = code != SQLITE_CONSTRAINT_UNIQUE || isPrimaryKey(handle, columns);
+  return duplicateKey(isPrimary ? "PRIMARY KEY" : "UNIQUE KEY", table, columns);
 }
 
 Failure missingValue(const std::string& message) {
@@ -78,8 +131,11 @@ Failure constraintFailure(sqlite3* handle, int code, const std::string& message)
     case SQLITE_CONSTRAINT_PRIMARYKEY:
     case SQLITE_CONSTRAINT_ROWID:
       return duplicate(handle, code, message);
+    case SQLITE_CONSTRAINT_CHECK:
+      // The one check that there is: of an identity column's range.
+      return sqlFailure(8115, "Arithmetic overflow error converting IDENTITY to data type int.");
     default:
-      return Failure(number::integrity, "SQL Server", message);
+      return notRunnable();
   }
 }
 
@@ -103,22 +159,23 @@ Failure failureOf(sqlite3* handle, int code, const std::string& message) {
       return sqlFailure(3906, "Failed to update the database because it is read-only.");
     case SQLITE_IOERR:
     case SQLITE_CANTOPEN:
-      return sqlFailure(823,
-                        "The operating system returned an error while the database was read or written: " + message);
+      return sqlFailure(823, "The operating system returned an error while the database was read or written: " +
+                                 std::generic_category().message(sqlite3_system_errno(handle)) + ".");
     case SQLITE_CORRUPT:
     case SQLITE_NOTADB:
-      return sqlFailure(824, "The database is damaged: " + message);
+      return sqlFailure(824, "The database is damaged.");
+    case SQLITE_TOOBIG:
+      return valueTooLarge();
     default:
-      // The one error of an aggregate: a sum that 64 bits do not hold.
-      if (message == "integer overflow")
-        return sqlFailure(8115, "Arithmetic overflow error converting expression to data type int.");
-      return Failure(number::statement, "SQL Server", message);
+      return failedStatement(message);
   }
 }
 
 }  // namespace
 
-Failure timeExpired() { return Failure(number::timeout, "SQL Server", "Timeout expired"); }
+Failure valueTooLarge() {
+  return sqlFailure(7119, "Attempting to grow LOB beyond maximum allowed size of 1000000000 bytes.");
+}
 
 void requireMemory(int code) {
   if ((code & 0xFF) == SQLITE_NOMEM || code == SQLITE_IOERR_NOMEM) throw std::bad_alloc();

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Failure.h"
+#include "providers/tsql/SqlFailure.h"
 
 struct sqlite3;
 
@@ -12,10 +12,13 @@ void requireMemory(int code);
 // Throws the failure for a result code of the storage library, with SQL Server's number where it has one: a function's
 // own failure first, then 2627 and 2601 (unique), 515 (not null), 1205 (the writer's place is taken while this handle
 // writes, or the rows read are old), the time-out, 1105 (no room), 3906 (read-only), 823 (input or output error), 824
-// (damaged).
+// (damaged), 208 (another session dropped the table), 7119 (a value too large). The library's own texts never get out:
+// what has no number there is one failure with the native number 0, which no statement should come to.
 [[noreturn]] void throwStorageFailure(sqlite3* handle, int code);
 
-// A statement or a wait ran over its time-out.
-Failure timeExpired();
+using tsql::timeExpired;
+
+// A value is larger than SQLite can hold.
+Failure valueTooLarge();
 
 }  // namespace QVSa::embedded

@@ -7,6 +7,7 @@
 #include "providers/embedded/Function.h"
 #include "providers/embedded/Like.h"
 #include "providers/embedded/NumberText.h"
+#include "providers/embedded/StorageFailure.h"
 #include "providers/embedded/TextSearch.h"
 #include "providers/embedded/Utf8.h"
 #include "providers/tsql/SqlFailure.h"
@@ -17,10 +18,26 @@ namespace {
 
 using tsql::sqlFailure;
 
-constexpr std::int64_t longestText = 8000;
+// The most that SQLite takes as one value.
+constexpr std::int64_t longest = 1'000'000'000;
+// Of a text that str makes.
+constexpr std::int64_t widest = 8000;
 
-void like(Call& call) { call.give(std::int64_t{matchesLike(call.text(0), call.text(1), std::nullopt)}); }
+// The last argument tells how long the result may be: cut there, or refused where it is negative. -1: any length.
+void giveLimited(Call& call, const std::string& text) {
+  const std::int64_t limit = call.whole(call.count() - 1);
+  if (limit >= 0) return call.give(unitsAt(text, 0, limit));
+  if (limit < -1 && unitsOf(text) > -limit) throw sqlFailure(8152, "String or binary data would be truncated.");
+  call.give(text);
+}
 
+// Behind a varchar, blanks may follow what matches.
+template <bool blanksMayFollow>
+void like(Call& call) {
+  call.give(std::int64_t{matchesLike(call.text(0), call.text(1), std::nullopt, blanksMayFollow)});
+}
+
+template <bool blanksMayFollow>
 void likeEscaped(Call& call) {
   const std::string_view escape = call.text(2);
   const char* at = escape.data();
@@ -29,7 +46,7 @@ void likeEscaped(Call& call) {
   if (escape.empty() || at != end)
     throw sqlFailure(506,
                      "The invalid escape character \"" + std::string(escape) + "\" was specified in a LIKE predicate.");
-  call.give(std::int64_t{matchesLike(call.text(0), call.text(1), symbol)});
+  call.give(std::int64_t{matchesLike(call.text(0), call.text(1), symbol, blanksMayFollow)});
 }
 
 void length(Call& call) { call.give(unitsOf(withoutTrailingBlanks(call.text(0)))); }
@@ -48,7 +65,7 @@ void replace(Call& call) {
   const std::string_view in = call.text(0);
   const std::string_view what = call.text(1);
   const std::string_view with = call.text(2);
-  if (what.empty()) return call.give(std::string(in));
+  if (what.empty()) return giveLimited(call, std::string(in));
   const TextSearch search(what);
   std::string result;
   std::size_t at = 0;
@@ -58,7 +75,7 @@ void replace(Call& call) {
     at = match->end;
   }
   result += in.substr(at);
-  call.give(result);
+  giveLimited(call, result);
 }
 
 void substring(Call& call) {
@@ -117,7 +134,7 @@ std::string fixedText(double value, std::int64_t width, std::int64_t decimals) {
 void numberText(Call& call) {
   const std::int64_t width = call.count() > 1 ? call.whole(1) : 10;
   const std::int64_t decimals = call.count() > 2 ? std::min<std::int64_t>(call.whole(2), 16) : 0;
-  if (width < 0 || width > longestText || decimals < 0) return;
+  if (width < 0 || width > widest || decimals < 0) return;
   const std::string text = fixedText(call.real(0), width, decimals);
   const std::size_t size = static_cast<std::size_t>(width);
   call.give(text.size() > size ? std::string(size, '*') : std::string(size - text.size(), ' ') + text);
@@ -127,18 +144,23 @@ void replicate(Call& call) {
   const std::string_view text = call.text(0);
   const std::int64_t times = call.whole(1);
   if (times < 0) return;
+  const std::int64_t limit = std::abs(call.whole(2));
+  const std::int64_t units = std::max<std::int64_t>(unitsOf(text), 1);
+  const std::int64_t most = limit == 1 ? times : std::min(times, limit / units + 1);
+  if (std::ssize(text) * most > longest) throw valueTooLarge();
   std::string result;
-  const std::int64_t most = std::min(times, longestText / std::max<std::int64_t>(unitsOf(text), 1) + 1);
-  for (std::int64_t i = 0; i < most; ++i) result += text;
-  call.give(unitsAt(result, 0, longestText));
+  for (std::int64_t i = 0; i < most && !text.empty(); ++i) result += text;
+  giveLimited(call, result);
 }
 
-constexpr Function functions[] = {{"t_like", 2, like},
-                                  {"t_like", 3, likeEscaped},
+constexpr Function functions[] = {{"t_like", 2, like<false>},
+                                  {"t_like", 3, likeEscaped<false>},
+                                  {"t_like_varchar", 2, like<true>},
+                                  {"t_like_varchar", 3, likeEscaped<true>},
                                   {"t_len", 1, length},
                                   {"t_charindex", 2, charIndex},
                                   {"t_charindex", 3, charIndex},
-                                  {"t_replace", 3, replace},
+                                  {"t_replace", 4, replace},
                                   {"t_substring", 3, substring},
                                   {"t_left", 2, left},
                                   {"t_right", 2, right},
@@ -149,7 +171,7 @@ constexpr Function functions[] = {{"t_like", 2, like},
                                   {"t_str", 1, numberText},
                                   {"t_str", 2, numberText},
                                   {"t_str", 3, numberText},
-                                  {"t_replicate", 2, replicate}};
+                                  {"t_replicate", 3, replicate}};
 
 }  // namespace
 

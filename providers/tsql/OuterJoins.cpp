@@ -26,30 +26,22 @@ void split(ExpressionPtr condition, std::vector<ExpressionPtr>& conjuncts) {
     conjuncts.push_back(std::move(condition));
     return;
   }
-  split(std::move(condition->operands[0]), conjuncts);
-  split(std::move(condition->operands[1]), conjuncts);
+  for (ExpressionPtr& operand : condition->operands) split(std::move(operand), conjuncts);
 }
 
 ExpressionPtr combine(std::vector<ExpressionPtr> conjuncts) {
-  ExpressionPtr whole;
-  for (ExpressionPtr& conjunct : conjuncts) {
-    if (!whole) {
-      whole = std::move(conjunct);
-      continue;
-    }
-    auto both = std::make_unique<Expression>(Kind::logical, conjunct->position);
-    both->op = "and";
-    both->operands.push_back(std::move(whole));
-    both->operands.push_back(std::move(conjunct));
-    whole = std::move(both);
-  }
+  if (conjuncts.empty()) return nullptr;
+  if (conjuncts.size() == 1) return std::move(conjuncts.front());
+  auto whole = std::make_unique<Expression>(Kind::logical, conjuncts.front()->position);
+  whole->op = "and";
+  whole->operands = std::move(conjuncts);
   return whole;
 }
 
 bool holdsOldJoin(const ExpressionPtr& condition) {
   if (!condition) return false;
   if (!isConjunction(*condition)) return isOldJoin(*condition);
-  return holdsOldJoin(condition->operands[0]) || holdsOldJoin(condition->operands[1]);
+  return std::any_of(condition->operands.begin(), condition->operands.end(), holdsOldJoin);
 }
 
 TableSourcePtr joined(TableSourcePtr left, TableSource::Join join, TableSourcePtr right, ExpressionPtr on) {

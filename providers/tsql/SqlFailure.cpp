@@ -44,4 +44,13 @@ Long failureNumber(Long native) {
   }
 }
 
+Failure timeExpired() { return Failure(number::timeout, "SQL Server", "Timeout expired"); }
+
+void refuseDepth() {
+  throw sqlFailure(
+      191,
+      "Some part of your SQL statement is nested too deeply. Rewrite the query or break it up into smaller "
+      "queries.");
+}
+
 }  // namespace QVSa::tsql

@@ -12,4 +12,10 @@ Failure sqlFailure(Long native, const String& description);
 // for every other statement error.
 Long failureNumber(Long native);
 
+// A statement, or a wait of it, ran over its time-out.
+Failure timeExpired();
+
+// 191: what is nested deeper than whoever reads it has room for.
+[[noreturn]] void refuseDepth();
+
 }  // namespace QVSa::tsql

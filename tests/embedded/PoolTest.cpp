@@ -54,7 +54,7 @@ TEST(Pool, AHandleWhoseFilesWereReplacedIsNotUsedAgain) {
   EXPECT_EQ(failureOf([&] { acquireHandle(folder.data()); }).native(), 17);
   createInstallation(folder.plan());
   EXPECT_EQ(failureOf([&] { acquireHandle(folder.data())->execute("select * from QVSys.old"); }).number(),
-            number::statement);
+            number::noTable);
 }
 
 TEST(Pool, ThreadsHaveAHandleEach) {
