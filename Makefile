@@ -53,14 +53,13 @@ bench: packages  ## Run the benchmarks, each operation beside its floor (build/b
 	@for program in $$(find build/bench/bench -maxdepth 1 -type f -executable | sort); do \
 	  printf '\n== %s\n' "$$program"; "$$program"; done
 
-fuzz:  ## Fuzz the T-SQL front end for a minute (build/fuzz)
+fuzz:  ## Fuzz statements of T-SQL up to SQLite for a minute (build/fuzz)
 	@tools/install-packages.sh fuzz
 	$(say) 'Building the fuzz target (build/fuzz)'
 	@cmake --preset fuzz --log-level=NOTICE
-	@cmake --build --preset fuzz -j $(JOBS)
-	@for program in $$(find build/fuzz -name '*_fuzz' -type f -executable); do \
-	  mkdir -p build/fuzz/corpus; "$$program" -max_total_time=60 $$(ls -1 tests/tsql/*.dict 2>/dev/null | \
-	  sed 's/^/-dict=/') build/fuzz/corpus; done
+	@cmake --build --preset fuzz -j $(JOBS) --target statement_fuzz
+	@test -d build/fuzz/corpus || { mkdir build/fuzz/corpus; split -l 1 -a 3 tests/tsql/statements.txt build/fuzz/corpus/; }
+	@build/fuzz/tests/fuzz/statement_fuzz -max_total_time=60 -dict=tests/fuzz/tsql.dict build/fuzz/corpus
 
 sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h')
 

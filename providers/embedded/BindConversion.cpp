@@ -8,8 +8,8 @@ namespace QVSa::embedded {
 
 namespace {
 
-// Fewer than SQLite takes in one statement, 32,766 as it is built by default.
-constexpr std::size_t mostParameters = 32'000;
+// SQLite takes 32,766 in one statement as it is built by default, but compares each constant with all before it.
+constexpr std::size_t mostParameters = 20'000;
 
 bool fits(const Type& from, const Type& to) { return to.size < 0 || (from.size >= 0 && from.size <= to.size); }
 
@@ -36,12 +36,15 @@ void requireConvertible(const Type& from, const Type& to, Purpose purpose) {
 
 }  // namespace
 
+void refuseSize() {
+  throw tsql::sqlFailure(8623,
+                         "The query processor ran out of internal resources and could not produce a query plan. This "
+                         "is a rare event and only expected for extremely complex queries or queries that reference "
+                         "a very large number of tables or partitions. Please simplify the query.");
+}
+
 BoundPtr Binder::parameter(const Parameter& value) {
-  if (parameters_.size() == mostParameters)
-    throw tsql::sqlFailure(8623,
-                           "The query processor ran out of internal resources and could not produce a query plan. This "
-                           "is a rare event and only expected for extremely complex queries or queries that reference "
-                           "a very large number of tables or partitions. Please simplify the query.");
+  if (parameters_.size() == mostParameters) refuseSize();
   auto bound = std::make_unique<BoundExpression>();
   bound->kind = BoundExpression::Kind::parameter;
   bound->type = value.type;

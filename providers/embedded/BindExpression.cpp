@@ -15,6 +15,8 @@ namespace {
 
 using Kind = tsql::Expression::Kind;
 
+constexpr std::size_t mostNodes = 200'000;
+
 std::string qualifiedName(const tsql::Expression& column) {
   std::string name;
   for (const auto& part : column.qualifier) name += part + ".";
@@ -35,8 +37,14 @@ void addOperand(BoundExpression& to, BoundPtr operand) {
 
 }  // namespace
 
-BoundPtr Binder::bind(const tsql::Expression& expression, const Scope& scope) {
+// A view that reads another one twice, and so on, is a short statement with a tree without end.
+void Binder::countNode() {
   deadline_.check();
+  if (++nodes_ > mostNodes) refuseSize();
+}
+
+BoundPtr Binder::bind(const tsql::Expression& expression, const Scope& scope) {
+  countNode();
   switch (expression.kind) {
     case Kind::null: {
       BoundPtr null = make(BoundExpression::Kind::null);
@@ -75,21 +83,11 @@ BoundPtr Binder::bind(const tsql::Expression& expression, const Scope& scope) {
       return bindIn(expression, scope);
     case Kind::exists: {
       BoundPtr exists = make(BoundExpression::Kind::exists);
-      exists->negated = expression.negated;
-      exists->select = bindSelect(*expression.select, &scope);
+      exists->select = bindInner(*expression.select, &scope);
       return exists;
     }
-    case Kind::subquery: {
-      BoundPtr subquery = make(BoundExpression::Kind::subquery);
-      subquery->select = bindSelect(*expression.select, &scope);
-      const auto& items = subquery->select->parts.front().core.items;
-      if (items.size() != 1)
-        throw tsql::sqlFailure(116,
-                               "Only one expression can be specified in the select list when the subquery is not "
-                               "introduced with EXISTS.");
-      subquery->type = items.front().expression->type;
-      return subquery;
-    }
+    case Kind::subquery:
+      return bindSubquery(*expression.select, scope);
     case Kind::function:
       return bindFunction(expression, scope);
     case Kind::convert:
@@ -114,7 +112,7 @@ Binder::Found Binder::findColumn(const tsql::Expression& expression, const Scope
   for (const Scope* level = &scope; level; level = level->outer) {
     std::optional<Found> found;
     for (const auto& source : level->sources) {
-      if (!expression.qualifier.empty() && !sameName(source.name, expression.qualifier.back())) continue;
+      if (!expression.qualifier.empty() && !isNamed(source, expression.qualifier)) continue;
       const auto column = std::ranges::find_if(
           source.columns, [&](const SourceColumn& candidate) { return sameName(candidate.name, expression.name); });
       if (column == source.columns.end()) {
@@ -239,12 +237,9 @@ BoundPtr Binder::bindInList(const tsql::Expression& list, BoundPtr value) {
 BoundPtr Binder::bindInSelect(const tsql::Expression& expression, BoundPtr value, const Scope& scope) {
   BoundPtr in = make(BoundExpression::Kind::inSelect);
   in->negated = expression.negated;
-  in->select = bindSelect(*expression.select, &scope);
+  in->select = bindInner(*expression.select, &scope);
+  requireOneColumn(*in->select);
   for (auto& part : in->select->parts) {
-    if (part.core.items.size() != 1)
-      throw tsql::sqlFailure(116,
-                             "Only one expression can be specified in the select list when the subquery is not "
-                             "introduced with EXISTS.");
     BoundPtr& item = part.core.items.front().expression;
     const Type type = commonType(value->type, item->type);
     value = coerce(std::move(value), type, Purpose::compute);

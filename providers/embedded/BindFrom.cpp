@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <set>
 
 #include "providers/embedded/Binder.h"
 #include "providers/tsql/OuterJoins.h"
@@ -10,11 +11,28 @@ namespace {
 
 // Deeper than any view of ours stands on others; a view that reads itself ends here.
 constexpr std::size_t viewDepthLimit = 32;
+// SQLite joins 64, and draws those of a derived table into the select around it. A write adds one or two.
+constexpr std::size_t mostTables = 60;
+
+std::size_t tablesIn(const BoundCore& core) {
+  std::size_t tables = 0;
+  for (const auto& source : core.from) tables += source.tables;
+  return tables;
+}
 
 }  // namespace
 
+std::size_t Binder::tablesIn(const BoundSelect& select) {
+  std::size_t most = 0;
+  for (const auto& part : select.parts) most = std::max(most, embedded::tablesIn(part.core));
+  return most;
+}
+
 void Binder::bindFrom(const std::vector<tsql::TableSourcePtr>& from, Scope& scope, BoundCore& core) {
   for (const auto& source : from) bindSource(*source, scope, core);
+  if (embedded::tablesIn(core) > mostTables)
+    throw tsql::sqlFailure(
+        106, "Too many table names in the query. The maximum allowable is " + std::to_string(mostTables) + ".");
 }
 
 void Binder::bindSource(const tsql::TableSource& source, Scope& scope, BoundCore& core) {
@@ -43,6 +61,10 @@ void Binder::bindJoin(const tsql::TableSource& join, Scope& scope, BoundCore& co
   core.from.back().crossJoin = join.join == Join::cross;
   if (!join.on) return;
   BoundPtr on = bind(*join.on, scope);
+  if (on->aggregate)
+    throw tsql::sqlFailure(1015,
+                           "An aggregate cannot appear in an ON clause unless it is in a subquery contained in a "
+                           "HAVING clause or select list, and the column being aggregated is an outer reference.");
   if (outer) {
     core.from.back().leftJoin = true;
     core.from.back().on = std::move(on);
@@ -52,12 +74,26 @@ void Binder::bindJoin(const tsql::TableSource& join, Scope& scope, BoundCore& co
 }
 
 Binder::ScopeSource Binder::tableScope(const TableInfo& table, const std::string& name) {
-  ScopeSource source{name, newAlias(), {}, &table};
+  ScopeSource source{name, newAlias(), {}, &table, {}};
   for (std::size_t i = 0; i < table.columns.size(); ++i) {
     const ColumnInfo& column = table.columns[i];
     source.columns.push_back({column.name, quoteName(column.name), column.type, column.type.isText(), i});
   }
   return source;
+}
+
+std::optional<std::size_t> Binder::databaseOf(const tsql::TableSource& source) const {
+  if (source.alias) return std::nullopt;
+  return source.table.database.empty() ? std::optional(database_) : databaseByName(source.table.database);
+}
+
+bool Binder::isNamed(const ScopeSource& source, const std::vector<String>& qualifier) {
+  if (!sameName(source.name, qualifier.back())) return false;
+  if (qualifier.size() == 1) return true;
+  const String& owner = qualifier[qualifier.size() - 2];
+  if (!source.database || !isOwner(owner)) return false;
+  const String& database = qualifier.size() > 2 ? qualifier[qualifier.size() - 3] : String();
+  return database.empty() || databaseByName(database) == source.database;
 }
 
 void Binder::addScope(Scope& scope, ScopeSource source) {
@@ -69,29 +105,40 @@ void Binder::addScope(Scope& scope, ScopeSource source) {
   scope.sources.push_back(std::move(source));
 }
 
-const Binder::CommonTable* Binder::commonTable(const tsql::ObjectName& name) const {
+Binder::CommonTable* Binder::commonTable(const tsql::ObjectName& name) {
   if (!name.database.empty() || !name.owner.empty()) return nullptr;
   const auto found = std::find_if(commonTables_.rbegin(), commonTables_.rend(),
                                   [&](const CommonTable& table) { return sameName(table.name, name.name); });
   return found == commonTables_.rend() ? nullptr : &*found;
 }
 
+// A common table reads itself once in each part behind its first, and directly.
+void Binder::readRecursively(CommonTable& table) {
+  if (selectDepth_ != table.depth) throw tsql::sqlFailure(465, "Recursive references are not allowed in subqueries.");
+  if (++table.reads > 1)
+    throw tsql::sqlFailure(
+        253, "Recursive member of a common table expression '" + table.name + "' has multiple recursive references.");
+}
+
 void Binder::bindTable(const tsql::TableSource& source, Scope& scope, BoundCore& core) {
   const std::string name = source.alias.value_or(source.table.name);
-  if (const CommonTable* common = commonTable(source.table)) {
-    ScopeSource found{name, newAlias(), common->columns, nullptr};
-    core.from.push_back({.alias = found.alias, .commonTable = common->emitted});
+  if (CommonTable* common = commonTable(source.table)) {
+    if (common->isOpen) readRecursively(*common);
+    ScopeSource found{name, newAlias(), common->columns, nullptr, {}};
+    core.from.push_back({.alias = found.alias, .commonTable = common->emitted, .tables = common->tables});
     return addScope(scope, std::move(found));
   }
   const Object object = catalogue_.find(source.table, database_);
   if (const auto* table = std::get_if<const TableInfo*>(&object)) {
     ScopeSource found = tableScope(**table, name);
+    found.database = databaseOf(source);
     core.from.push_back({.alias = found.alias, .table = *table});
     return addScope(scope, std::move(found));
   }
   BoundSelectPtr view = bindView(*std::get<const ViewInfo*>(object));
-  ScopeSource found{name, newAlias(), resultColumns(*view), nullptr};
-  core.from.push_back({.alias = found.alias, .derived = std::move(view)});
+  ScopeSource found{name, newAlias(), resultColumns(*view), nullptr, databaseOf(source)};
+  const std::size_t tables = tablesIn(*view);
+  core.from.push_back({.alias = found.alias, .derived = std::move(view), .tables = tables});
   addScope(scope, std::move(found));
 }
 
@@ -102,32 +149,44 @@ BoundSelectPtr Binder::bindView(const ViewInfo& view) {
   Binder inner(catalogue_, view.database, deadline_);
   inner.parameters_ = std::move(parameters_);
   inner.aliases_ = aliases_;
+  inner.nodes_ = nodes_;
   inner.viewDepth_ = viewDepth_ + 1;
   inner.ownLiterals_ = true;
   BoundSelectPtr select = inner.bindSelect(*view.definition.select, nullptr);
   parameters_ = std::move(inner.parameters_);
   aliases_ = inner.aliases_;
-  auto& items = select->parts.front().core.items;
-  for (std::size_t i = 0; i < view.definition.columns.size() && i < items.size(); ++i)
-    items[i].name = view.definition.columns[i];
+  nodes_ = inner.nodes_;
+  nameColumns(select->parts.front().core, view.definition.columns, view.name);
   return select;
 }
 
 void Binder::bindDerived(const tsql::TableSource& source, Scope& scope, BoundCore& core) {
-  BoundSelectPtr select = bindSelect(*source.derived, scope.outer);
-  auto& items = select->parts.front().core.items;
-  if (!source.columnNames.empty() && source.columnNames.size() != items.size())
-    throw tsql::sqlFailure(8158, "'" + source.alias.value_or("") +
-                                     "' has a different number of columns than were "
-                                     "specified in the column list.");
-  for (std::size_t i = 0; i < source.columnNames.size(); ++i) items[i].name = source.columnNames[i];
-  ScopeSource found{source.alias.value_or(""), newAlias(), resultColumns(*select), nullptr};
-  for (std::size_t i = 0; i < found.columns.size(); ++i)
-    if (found.columns[i].name.empty())
-      throw tsql::sqlFailure(
-          8155, "No column name was specified for column " + std::to_string(i + 1) + " of '" + found.name + "'.");
-  core.from.push_back({.alias = found.alias, .derived = std::move(select)});
+  BoundSelectPtr select = bindInner(*source.derived, scope.outer);
+  const std::string name = source.alias.value_or("");
+  nameColumns(select->parts.front().core, source.columnNames, name);
+  ScopeSource found{name, newAlias(), resultColumns(*select), nullptr, {}};
+  const std::size_t tables = tablesIn(*select);
+  core.from.push_back({.alias = found.alias, .derived = std::move(select), .tables = tables});
   addScope(scope, std::move(found));
+}
+
+// Gives the columns of a derived or common table the names of its list. Each has to have one, of its own.
+void Binder::nameColumns(BoundCore& core, const std::vector<String>& names, const std::string& table) {
+  auto& items = core.items;
+  if (!names.empty() && items.size() != names.size())
+    throw tsql::sqlFailure(items.size() > names.size() ? 8158 : 8159,
+                           "'" + table + "' has " + (items.size() > names.size() ? "more" : "fewer") +
+                               " columns than were specified in the column list.");
+  std::set<std::string> known;
+  for (std::size_t i = 0; i < items.size(); ++i) {
+    if (!names.empty()) items[i].name = names[i];
+    if (items[i].name.empty())
+      throw tsql::sqlFailure(
+          8155, "No column name was specified for column " + std::to_string(i + 1) + " of '" + table + "'.");
+    if (!known.insert(foldName(items[i].name)).second)
+      throw tsql::sqlFailure(8156,
+                             "The column '" + items[i].name + "' was specified multiple times for '" + table + "'.");
+  }
 }
 
 }  // namespace QVSa::embedded

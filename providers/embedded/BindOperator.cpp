@@ -21,10 +21,20 @@ bool isTextOrNull(const Type& type) { return type.isText() || type.base == Base:
 Form formOf(char op) { return op == '*' || op == '/' || op == '%' ? Form::product : Form::sum; }
 
 std::string nameOfOperator(char op) {
-  static const std::map<char, std::string> names = {
-      {'+', "add"}, {'-', "subtract"}, {'*', "multiply"}, {'/', "divide"}, {'%', "modulo"}};
-  const auto name = names.find(op);
-  return name == names.end() ? "'" + std::string(1, op) + "'" : name->second;
+  switch (op) {
+    case '+':
+      return "add";
+    case '-':
+      return "subtract";
+    case '*':
+      return "multiply";
+    case '/':
+      return "divide";
+    case '%':
+      return "modulo";
+    default:
+      return "'" + std::string(1, op) + "'";
+  }
 }
 
 Failure incompatible(char op, const Type& left, const Type& right) {

@@ -1,6 +1,7 @@
 #include <algorithm>
 
 #include "providers/embedded/Binder.h"
+#include "providers/embedded/EntryOrder.h"
 #include "providers/embedded/TypeRules.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -10,6 +11,40 @@ namespace {
 
 using Kind = tsql::Expression::Kind;
 
+// SQLite takes 500.
+constexpr std::size_t mostParts = 500;
+// SQLite takes 2,000 results, groups and keys of an order; an updatable row set has a column more, an order one or two
+// keys.
+constexpr std::size_t mostColumns = 1990;
+
+std::string resultColumn(std::size_t place) { return "\"c" + std::to_string(place) + "\""; }
+
+void requireNoOrder(const tsql::Select& select) {
+  if (select.orderBy.empty() || select.parts.front().core.top) return;
+  throw tsql::sqlFailure(1033,
+                         "The ORDER BY clause is invalid in views, inline functions, derived tables, subqueries, and "
+                         "common table expressions, unless TOP, OFFSET or FOR XML is also specified.");
+}
+
+// What the part of a common table that reads the table itself cannot have.
+void checkRecursive(const tsql::Select::Part& part, const BoundCore& bound, const std::string& table) {
+  const auto refuse = [&](Long number, const std::string& what) {
+    throw tsql::sqlFailure(number,
+                           what + " in the recursive part of a recursive common table expression '" + table + "'.");
+  };
+  if (!part.all)
+    throw tsql::sqlFailure(
+        252, "Recursive common table expression '" + table + "' does not contain a top-level UNION ALL operator.");
+  if (bound.distinct) refuse(460, "DISTINCT operator is not allowed");
+  if (bound.top) refuse(461, "TOP operator is not allowed");
+  const bool hasOuter = std::ranges::any_of(bound.from, &BoundSource::leftJoin);
+  if (hasOuter) refuse(462, "Outer join is not allowed");
+  const bool hasAggregates =
+      std::ranges::any_of(bound.items, [](const BoundItem& item) { return item.expression->aggregate; });
+  if (hasAggregates || bound.having || !bound.groupBy.empty())
+    refuse(467, "GROUP BY, HAVING, or aggregate functions are not allowed");
+}
+
 const BoundExpression& withoutCollation(const BoundExpression& expression) {
   const bool collation = expression.kind == BoundExpression::Kind::infix && expression.text == "collate";
   return collation ? *expression.operands[0] : expression;
@@ -17,12 +52,22 @@ const BoundExpression& withoutCollation(const BoundExpression& expression) {
 
 }  // namespace
 
+void requireOneColumn(const BoundSelect& select) {
+  for (const auto& part : select.parts)
+    if (part.core.items.size() != 1)
+      throw tsql::sqlFailure(116,
+                             "Only one expression can be specified in the select list when the subquery is not "
+                             "introduced with EXISTS.");
+}
+
 BoundQuery Binder::bindQuery(const tsql::Select& select, bool updatable) {
   BoundQuery query;
   query.select = bindSelect(select, nullptr);
   BoundCore& core = query.select->parts.front().core;
   const bool oneTable = select.parts.size() == 1 && core.from.size() == 1 && core.from.front().table;
-  if (updatable && oneTable && !core.distinct && core.groupBy.empty()) {
+  const bool hasAggregates =
+      std::ranges::any_of(core.items, [](const BoundItem& item) { return item.expression->aggregate; });
+  if (updatable && oneTable && !core.distinct && core.groupBy.empty() && !core.having && !hasAggregates) {
     query.updatable = core.from.front().table;
     core.items.push_back({rowid(core.from.front().alias), "", std::nullopt});
   }
@@ -50,8 +95,10 @@ BoundQuery Binder::bindQuery(const tsql::Select& select, bool updatable) {
 BoundSelectPtr Binder::bindSelect(const tsql::Select& select, const Scope* outer) {
   auto bound = std::make_unique<BoundSelect>();
   const std::size_t visible = commonTables_.size();
+  ++selectDepth_;
   bindCommonTables(select, *bound, outer);
   Scope scope;
+  if (select.parts.size() > mostParts) tsql::refuseDepth();
   for (const auto& part : select.parts) {
     scope = {};
     scope.outer = outer;
@@ -61,27 +108,112 @@ BoundSelectPtr Binder::bindSelect(const tsql::Select& select, const Scope* outer
   collateResult(*bound);
   bindOrder(select, *bound, scope);
   commonTables_.resize(visible);
+  --selectDepth_;
   return bound;
 }
 
-// A common table may read itself: its first part gives the columns, the parts behind it are bound with the name known.
+BoundSelectPtr Binder::bindInner(const tsql::Select& select, const Scope* outer) {
+  requireNoOrder(select);
+  return bindSelect(select, outer);
+}
+
+// A select that stands for a value fails where it has a second row.
+BoundPtr Binder::bindSubquery(const tsql::Select& select, const Scope& scope) {
+  auto subquery = std::make_unique<BoundExpression>();
+  subquery->kind = BoundExpression::Kind::subquery;
+  subquery->select = bindInner(select, &scope);
+  requireOneColumn(*subquery->select);
+  BoundCore& core = subquery->select->parts.front().core;
+  subquery->type = core.items.front().expression->type;
+  const bool isPlain = subquery->select->parts.size() == 1 && !core.top && !core.distinct && core.groupBy.empty();
+  if (isPlain && (core.from.empty() || core.having || core.items.front().expression->aggregate)) return subquery;
+  const auto single = [&](BoundPtr value) {
+    std::vector<BoundPtr> operands;
+    operands.push_back(std::move(value));
+    BoundPtr one = call("t_single", subquery->type, std::move(operands));
+    one->aggregate = true;
+    return one;
+  };
+  if (isPlain) {
+    core.items.front().expression = single(std::move(core.items.front().expression));
+    return subquery;
+  }
+  auto outer = std::make_unique<BoundSelect>();
+  BoundCore& whole = outer->parts.emplace_back().core;
+  const std::string alias = newAlias();
+  auto column = std::make_unique<BoundExpression>();
+  column->kind = BoundExpression::Kind::column;
+  column->source = alias;
+  column->text = resultColumn(0);
+  whole.items.push_back({single(std::move(column)), "", std::nullopt});
+  whole.from.push_back({.alias = alias, .derived = std::move(subquery->select)});
+  subquery->select = std::move(outer);
+  return subquery;
+}
+
+void Binder::checkView(const tsql::CreateView& view) {
+  requireNoOrder(*view.select);
+  const BoundSelectPtr bound = bindSelect(*view.select, nullptr);
+  nameColumns(bound->parts.front().core, view.columns, view.view.name);
+}
+
 void Binder::bindCommonTables(const tsql::Select& select, BoundSelect& bound, const Scope* outer) {
   for (const auto& table : select.with) {
-    auto body = std::make_unique<BoundSelect>();
     const std::string emitted = "c" + std::to_string(++aliases_);
-    for (std::size_t i = 0; i < table.select->parts.size(); ++i) {
-      Scope scope;
-      scope.outer = outer;
-      body->parts.push_back({table.select->parts[i].all, bindCore(table.select->parts[i].core, scope)});
-      if (i > 0) continue;
-      auto& items = body->parts.front().core.items;
-      for (std::size_t n = 0; n < table.columns.size() && n < items.size(); ++n) items[n].name = table.columns[n];
-      commonTables_.push_back({table.name, emitted, resultColumns(*body)});
-    }
-    if (body->parts.size() > 1) unifyParts(*body);
+    BoundSelectPtr body = bindRecursion(table, emitted, outer);
     const std::size_t columns = body->parts.front().core.items.size();
+    commonTables_.back().isOpen = false;
+    commonTables_.back().tables = tablesIn(*body);
     bound.with.push_back({emitted, columns, std::move(body)});
   }
+}
+
+// A common table may read itself: its first parts give the columns, those behind them are bound with the name known.
+BoundSelectPtr Binder::bindRecursion(const tsql::Select::CommonTable& table, const std::string& emitted,
+                                     const Scope* outer) {
+  const auto& parts = table.select->parts;
+  const auto add = [&](BoundSelect& body) {
+    nameColumns(body.parts.front().core, table.columns, table.name);
+    commonTables_.push_back({table.name, emitted, resultColumns(body), 1, true, selectDepth_, 0});
+  };
+  BoundSelectPtr body;
+  if (parts.size() == 1) {
+    body = bindInner(*table.select, outer);
+    add(*body);
+    return body;
+  }
+  requireNoOrder(*table.select);
+  if (parts.size() > mostParts) tsql::refuseDepth();
+  body = std::make_unique<BoundSelect>();
+  bool isRecursive = false;
+  for (const auto& part : parts) {
+    Scope scope;
+    scope.outer = outer;
+    const bool isFirst = body->parts.empty();
+    if (!isFirst) commonTables_.back().reads = 0;
+    body->parts.push_back({part.all, bindCore(part.core, scope)});
+    if (isFirst) {
+      add(*body);
+      continue;
+    }
+    const bool reads = commonTables_.back().reads > 0;
+    if (reads) checkRecursive(part, body->parts.back().core, table.name);
+    if (isRecursive && !reads)
+      throw tsql::sqlFailure(
+          247, "An anchor member was found in the recursive query part of recursive query \"" + table.name + "\".");
+    isRecursive = reads;
+  }
+  unifyParts(*body);
+  return body;
+}
+
+BoundPtr Binder::bindWhere(const tsql::Expression& where, const Scope& scope) {
+  BoundPtr condition = bind(where, scope);
+  if (condition->aggregate)
+    throw tsql::sqlFailure(147,
+                           "An aggregate may not appear in the WHERE clause unless it is in a subquery contained in a "
+                           "HAVING clause or a select list, and the column being aggregated is an outer reference.");
+  return condition;
 }
 
 BoundCore Binder::bindCore(const tsql::SelectCore& core, Scope& scope) {
@@ -95,16 +227,19 @@ BoundCore Binder::bindCore(const tsql::SelectCore& core, Scope& scope) {
     top.converted = true;
     bound.top = parameter(top)->parameter;
   }
-  if (core.where) {
-    bound.where.push_back(bind(*core.where, scope));
-    if (bound.where.back()->aggregate)
-      throw tsql::sqlFailure(147,
-                             "An aggregate may not appear in the WHERE clause unless it is in a subquery contained "
-                             "in a HAVING clause or a select list, and the column being aggregated is an outer "
-                             "reference.");
-  }
+  if (core.where) bound.where.push_back(bindWhere(*core.where, scope));
   bindItems(core, scope, bound);
-  for (const auto& expression : core.groupBy) bound.groupBy.push_back(collate(bind(*expression, scope)));
+  if (bound.items.size() > mostColumns)
+    throw tsql::sqlFailure(1056, "The number of elements in the select list exceeds the maximum allowed number of " +
+                                     std::to_string(mostColumns) + " elements.");
+  if (core.groupBy.size() > mostColumns) refuseSize();
+  for (const auto& expression : core.groupBy) {
+    bound.groupBy.push_back(collate(bind(*expression, scope)));
+    if (bound.groupBy.back()->aggregate)
+      throw tsql::sqlFailure(144,
+                             "Cannot use an aggregate or a subquery in an expression used for the group by list of a "
+                             "GROUP BY clause.");
+  }
   if (core.having) bound.having = bind(*core.having, scope);
   checkGroup(bound, scope);
   return bound;
@@ -133,9 +268,10 @@ void Binder::bindItems(const tsql::SelectCore& core, const Scope& scope, BoundCo
 void Binder::addStar(const tsql::Expression& star, const Scope& scope, BoundCore& bound) {
   bool known = false;
   for (const auto& source : scope.sources) {
-    if (!star.qualifier.empty() && !sameName(source.name, star.qualifier.back())) continue;
+    if (!star.qualifier.empty() && !isNamed(source, star.qualifier)) continue;
     known = true;
     for (const auto& column : source.columns) {
+      countNode();
       auto expression = std::make_unique<BoundExpression>();
       expression->kind = BoundExpression::Kind::column;
       expression->source = source.alias;
@@ -152,16 +288,20 @@ void Binder::addStar(const tsql::Expression& star, const Scope& scope, BoundCore
                                   "alias name used in the query.");
 }
 
+bool Binder::isGrouped(const BoundCore& core) {
+  return !core.groupBy.empty() || core.having ||
+         std::ranges::any_of(core.items, [](const BoundItem& item) { return item.expression->aggregate; });
+}
+
 void Binder::checkGroup(const BoundCore& core, const Scope& scope) {
-  const bool aggregates =
-      std::ranges::any_of(core.items, [](const BoundItem& item) { return item.expression->aggregate; });
-  if (core.groupBy.empty() && !core.having && !aggregates) return;
-  for (const auto& item : core.items) checkGrouped(*item.expression, core, scope);
-  if (core.having) checkGrouped(*core.having, core, scope);
+  if (!isGrouped(core)) return;
+  for (const auto& item : core.items) checkGrouped(*item.expression, core, scope, 8120, "select list");
+  if (core.having) checkGrouped(*core.having, core, scope, 8121, "HAVING clause");
 }
 
 // Every column that is read outside an aggregate is one of the group's expressions or stands inside one.
-void Binder::checkGrouped(const BoundExpression& expression, const BoundCore& core, const Scope& scope) {
+void Binder::checkGrouped(const BoundExpression& expression, const BoundCore& core, const Scope& scope, Long number,
+                          const std::string& clause) {
   if (std::ranges::any_of(core.groupBy, [&](const BoundPtr& group) { return sameExpression(*group, expression); }))
     return;
   const bool isAggregate = expression.kind == BoundExpression::Kind::call && expression.aggregate &&
@@ -171,10 +311,10 @@ void Binder::checkGrouped(const BoundExpression& expression, const BoundCore& co
       expression.kind == BoundExpression::Kind::column &&
       std::ranges::any_of(scope.sources, [&](const ScopeSource& s) { return s.alias == expression.source; });
   if (own)
-    throw tsql::sqlFailure(8120, "Column " + expression.text +
-                                     " is invalid in the select list because it is not "
-                                     "contained in either an aggregate function or the GROUP BY clause.");
-  for (const auto& operand : expression.operands) checkGrouped(*operand, core, scope);
+    throw tsql::sqlFailure(number, "Column " + expression.text + " is invalid in the " + clause +
+                                       " because it is not contained in either an aggregate function or the GROUP BY "
+                                       "clause.");
+  for (const auto& operand : expression.operands) checkGrouped(*operand, core, scope, number, clause);
 }
 
 // Two texts of one expression hold two parameters where they hold a literal. If the literals are equal the expressions
@@ -244,6 +384,8 @@ std::optional<std::size_t> Binder::ordinalOf(const tsql::Expression& expression,
 
 void Binder::bindOrder(const tsql::Select& select, BoundSelect& bound, const Scope& scope) {
   BoundCore& core = bound.parts.front().core;
+  if (select.orderBy.size() > mostColumns) refuseSize();
+  const bool grouped = isGrouped(core);
   for (const auto& item : select.orderBy) {
     BoundOrder order;
     order.descending = item.descending;
@@ -259,6 +401,11 @@ void Binder::bindOrder(const tsql::Select& select, BoundSelect& bound, const Sco
                              "ORDER BY items must appear in the select list if the statement contains a UNION, "
                              "INTERSECT or EXCEPT operator.");
     order.expression = collate(bind(*item.expression, scope));
+    if (grouped) {
+      checkGrouped(*order.expression, core, scope, 8127, "ORDER BY clause");
+    } else if (order.expression->aggregate) {
+      for (const auto& result : core.items) checkGrouped(*result.expression, core, scope, 8120, "select list");
+    }
     if (core.distinct) {
       const auto same = std::ranges::find_if(core.items, [&](const BoundItem& candidate) {
         return sameExpression(*candidate.expression, *order.expression);
@@ -270,13 +417,21 @@ void Binder::bindOrder(const tsql::Select& select, BoundSelect& bound, const Sco
     }
     bound.orderBy.push_back(std::move(order));
   }
+  addEntryOrder(bound);
+}
+
+// Rows of one table that are equal come in the order of their entry, in the direction of the last key.
+void Binder::addEntryOrder(BoundSelect& bound) {
+  const BoundCore& core = bound.parts.front().core;
+  if (bound.orderBy.empty() || bound.parts.size() > 1 || core.distinct || isGrouped(core)) return;
+  const BoundSource* const rows = rowsOf(core);
+  if (rows) bound.orderBy.push_back({0, rowid(rows->alias), bound.orderBy.back().descending});
 }
 
 std::vector<Binder::SourceColumn> Binder::resultColumns(const BoundSelect& select) {
   std::vector<SourceColumn> columns;
   for (const auto& item : select.parts.front().core.items)
-    columns.push_back(
-        {item.name, "\"c" + std::to_string(columns.size()) + "\"", item.expression->type, false, std::nullopt});
+    columns.push_back({item.name, resultColumn(columns.size()), item.expression->type, false, std::nullopt});
   return columns;
 }
 

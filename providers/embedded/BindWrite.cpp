@@ -3,6 +3,7 @@
 
 #include "providers/embedded/Binder.h"
 #include "providers/tsql/SqlFailure.h"
+#include "providers/tsql/TreeWalk.h"
 
 namespace QVSa::embedded {
 
@@ -21,6 +22,11 @@ const tsql::TableSource* sourceNamed(const std::vector<tsql::TableSourcePtr>& fr
   for (const auto& source : from)
     if (const auto* found = find(find, *source)) return found;
   return nullptr;
+}
+
+Failure repeatedColumn(const std::string& name) {
+  return tsql::sqlFailure(
+      264, "The column name '" + name + "' is specified more than once in the SET clause or column list of an INSERT.");
 }
 
 }  // namespace
@@ -49,6 +55,7 @@ std::size_t Binder::bindWriteScope(const tsql::ObjectName& target, const std::ve
   if (const auto found = std::ranges::find_if(scope.sources, isTarget); found != scope.sources.end())
     return static_cast<std::size_t>(found - scope.sources.begin());
   ScopeSource source = tableScope(table, target.name);
+  source.database = target.database.empty() ? std::optional(database_) : databaseByName(target.database);
   core.from.insert(core.from.begin(), {.alias = source.alias, .table = &table});
   scope.sources.insert(scope.sources.begin(), std::move(source));
   return 0;
@@ -62,7 +69,7 @@ BoundSelectPtr Binder::keysOf(const tsql::ObjectName& target, const std::vector<
   Scope scope;
   const std::size_t place = bindWriteScope(target, from, scope, core);
   core.items.push_back({rowid(scope.sources[place].alias), "", std::nullopt});
-  if (where) core.where.push_back(bind(*where, scope));
+  if (where) core.where.push_back(bindWhere(*where, scope));
   return select;
 }
 
@@ -70,6 +77,8 @@ BoundPtr Binder::bindStored(const tsql::Expression& expression, const ColumnInfo
   stores_ = true;
   BoundPtr value = bind(expression, scope);
   stores_ = false;
+  if (value->aggregate)
+    throw tsql::sqlFailure(157, "An aggregate may not appear in the set list of an UPDATE statement.");
   if (value->type.isDate() && column.type.isNumber() && column.type.isWhole())
     throw tsql::sqlFailure(257,
                            "Implicit conversion from data type datetime to int is not allowed. Use the CONVERT "
@@ -84,13 +93,11 @@ std::vector<std::size_t> Binder::insertColumns(const tsql::Insert& insert, const
       if (i != table.identity) columns.push_back(i);
     return columns;
   }
+  std::set<std::size_t> known;
   for (const auto& name : insert.columns) {
     const auto column = table.find(name);
     if (!column) throw tsql::sqlFailure(207, "Invalid column name '" + name + "'.");
-    if (std::ranges::find(columns, *column) != columns.end())
-      throw tsql::sqlFailure(264, "The column name '" + name +
-                                      "' is specified more than once in the SET clause or column "
-                                      "list of an INSERT.");
+    if (!known.insert(*column).second) throw repeatedColumn(name);
     columns.push_back(*column);
   }
   return columns;
@@ -130,6 +137,7 @@ BoundInsert Binder::bindInsert(const tsql::Insert& insert) {
   }
   addDefaults(bound, given);
   if (bound.select) storeItems(*bound.select, bound);
+  if (bound.givesIdentity) requireIdentity(bound);
   return bound;
 }
 
@@ -153,6 +161,35 @@ void Binder::addDefaults(BoundInsert& insert, std::size_t given) {
   }
 }
 
+// SQLite would make a value where the statement gives NULL.
+void Binder::requireIdentity(BoundInsert& insert) {
+  const auto place =
+      static_cast<std::size_t>(std::ranges::find(insert.columns, *insert.table->identity) - insert.columns.begin());
+  const auto require = [](BoundPtr& value) {
+    const Type type = value->type;
+    std::vector<BoundPtr> operands;
+    operands.push_back(std::move(value));
+    operands.push_back(call("t_no_identity", type, {}));
+    value = call("ifnull", type, std::move(operands));
+  };
+  for (auto& row : insert.rows) require(row[place]);
+  if (!insert.select) return;
+  for (auto& part : insert.select->parts) require(part.core.items[place].expression);
+}
+
+void Binder::checkDefault(const ColumnInfo& column) {
+  if (!column.defaultValue) return;
+  tsql::walkExpression(*column.defaultValue, [](const tsql::Expression& part) {
+    if (part.kind == tsql::Expression::Kind::column)
+      throw tsql::sqlFailure(128, "The name \"" + part.name +
+                                      "\" is not permitted in this context. Valid expressions are constants, constant "
+                                      "expressions, and (in some contexts) variables. Column names are not permitted.");
+    if (part.select)
+      throw tsql::sqlFailure(1046, "Subqueries are not allowed in this context. Only scalar expressions are allowed.");
+  });
+  bindStored(*column.defaultValue, column, {});
+}
+
 void Binder::storeItems(BoundSelect& select, const BoundInsert& insert) {
   for (auto& part : select.parts)
     for (std::size_t i = 0; i < part.core.items.size(); ++i) {
@@ -161,32 +198,44 @@ void Binder::storeItems(BoundSelect& select, const BoundInsert& insert) {
     }
 }
 
+// The rows of an update with their new values, as one select: the row's key is its first item.
+BoundSelectPtr Binder::bindNewValues(const tsql::Update& update) {
+  const TableInfo& table = writeTarget(update.target, update.from);
+  auto select = std::make_unique<BoundSelect>();
+  BoundCore& core = select->parts.emplace_back().core;
+  Scope scope;
+  const ScopeSource& target = scope.sources[bindWriteScope(update.target, update.from, scope, core)];
+  core.items.push_back({rowid(target.alias), "", std::nullopt});
+  std::set<std::size_t> assigned;
+  for (const auto& assignment : update.assignments) {
+    if (!assignment.qualifier.empty() && !isNamed(target, assignment.qualifier))
+      throw tsql::sqlFailure(4104, "The multi-part identifier \"" + assignment.qualifier.back() + "." +
+                                       assignment.column + "\" could not be bound.");
+    const auto column = table.find(assignment.column);
+    if (!column) throw tsql::sqlFailure(207, "Invalid column name '" + assignment.column + "'.");
+    if (column == table.identity)
+      throw tsql::sqlFailure(8102, "Cannot update identity column '" + assignment.column + "'.");
+    if (!assigned.insert(*column).second) throw repeatedColumn(assignment.column);
+    core.items.push_back({bindStored(*assignment.value, table.columns[*column], scope), "", *column});
+  }
+  if (update.where) core.where.push_back(bindWhere(*update.where, scope));
+  return select;
+}
+
 BoundUpdate Binder::bindUpdate(const tsql::Update& update) {
   BoundUpdate bound;
+  BoundSelectPtr rows = bindNewValues(update);
+  BoundCore& core = rows->parts.front().core;
   bound.table = &writeTarget(update.target, update.from);
-  BoundCore core;
-  Scope scope;
-  const std::size_t place = bindWriteScope(update.target, update.from, scope, core);
-  bound.alias = scope.sources[place].alias;
-  for (const auto& assignment : update.assignments) {
-    const auto column = bound.table->find(assignment.column);
-    if (!column) throw tsql::sqlFailure(207, "Invalid column name '" + assignment.column + "'.");
-    if (column == bound.table->identity)
-      throw tsql::sqlFailure(8102, "Cannot update identity column '" + assignment.column + "'.");
-    BoundPtr value = bindStored(*assignment.value, bound.table->columns[*column], scope);
-    if (value->aggregate)
-      throw tsql::sqlFailure(157, "An aggregate may not appear in the set list of an UPDATE statement.");
-    bound.assignments.emplace_back(*column, std::move(value));
+  bound.alias = core.items.front().expression->source;
+  for (std::size_t i = 1; i < core.items.size(); ++i) {
+    BoundItem& item = core.items[i];
+    bound.assignments.emplace_back(*item.tableColumn, update.from.empty() ? std::move(item.expression) : nullptr);
   }
-  if (update.where) core.where.push_back(bind(*update.where, scope));
-  if (update.from.empty()) {
+  if (update.from.empty())
     bound.where = std::move(core.where);
-  } else {
-    core.items.push_back({rowid(bound.alias), "", std::nullopt});
-    for (auto& [column, value] : bound.assignments) core.items.push_back({std::move(value), "", std::nullopt});
-    bound.from = std::make_unique<BoundSelect>();
-    bound.from->parts.push_back({false, std::move(core)});
-  }
+  else
+    bound.from = std::move(rows);
   bound.claim = {bound.table, keysOf(update.target, update.from, update.where.get()), false, false};
   return bound;
 }
@@ -198,7 +247,7 @@ BoundDelete Binder::bindDelete(const tsql::Delete& erase) {
     BoundCore core;
     Scope scope;
     bound.alias = scope.sources[bindWriteScope(erase.target, {}, scope, core)].alias;
-    if (erase.where) bound.where.push_back(bind(*erase.where, scope));
+    if (erase.where) bound.where.push_back(bindWhere(*erase.where, scope));
   } else {
     bound.from = keysOf(erase.target, erase.from, erase.where.get());
   }

@@ -19,9 +19,15 @@ class Binder {
       : catalogue_(catalogue), database_(currentDatabase), deadline_(deadline) {}
 
   BoundQuery bindQuery(const tsql::Select& select, bool updatable);
+  // Throws the failures of a query that no view can stand for as well.
+  void checkView(const tsql::CreateView& view);
+  // Throws the failures of a default that cannot be stored, if the column has one.
+  void checkDefault(const ColumnInfo& column);
   BoundInsert bindInsert(const tsql::Insert& insert);
   BoundUpdate bindUpdate(const tsql::Update& update);
   BoundDelete bindDelete(const tsql::Delete& erase);
+  // The keys of the rows that an update changes, each with its new values in the order of the assignments.
+  BoundSelectPtr bindNewValues(const tsql::Update& update);
 
   std::vector<Parameter> takeParameters() { return std::move(parameters_); }
   // Literals that are patterns of an index range: whether they begin with a plain text is part of the shape.
@@ -40,6 +46,8 @@ class Binder {
     std::string alias;  // in the emitted text
     std::vector<SourceColumn> columns;
     const TableInfo* table = nullptr;
+    // The database in which it stands by its own name, as in "database.owner.table.column".
+    std::optional<std::size_t> database;
   };
   struct Scope {
     std::vector<ScopeSource> sources;
@@ -49,6 +57,11 @@ class Binder {
     std::string name;
     std::string emitted;
     std::vector<SourceColumn> columns;
+    std::size_t tables = 1;  // that it reads
+    // While its own body is bound, which may read it:
+    bool isOpen = false;
+    std::size_t depth = 0;  // of selects around the body
+    std::size_t reads = 0;  // by the part that is bound now
   };
   struct Found {
     const ScopeSource* source;
@@ -57,16 +70,25 @@ class Binder {
 
   // BindSelect.cpp
   BoundSelectPtr bindSelect(const tsql::Select& select, const Scope* outer);
+  // A select inside another statement: ordered only where the order decides which rows there are.
+  BoundSelectPtr bindInner(const tsql::Select& select, const Scope* outer);
+  BoundPtr bindSubquery(const tsql::Select& select, const Scope& scope);
   void bindCommonTables(const tsql::Select& select, BoundSelect& bound, const Scope* outer);
+  BoundSelectPtr bindRecursion(const tsql::Select::CommonTable& table, const std::string& emitted, const Scope* outer);
   BoundCore bindCore(const tsql::SelectCore& core, Scope& scope);
+  BoundPtr bindWhere(const tsql::Expression& where, const Scope& scope);
   void bindItems(const tsql::SelectCore& core, const Scope& scope, BoundCore& bound);
   void addStar(const tsql::Expression& star, const Scope& scope, BoundCore& bound);
   void checkGroup(const BoundCore& core, const Scope& scope);
-  void checkGrouped(const BoundExpression& expression, const BoundCore& core, const Scope& scope);
+  // Throws `number` for a column of the clause that the group does not give.
+  void checkGrouped(const BoundExpression& expression, const BoundCore& core, const Scope& scope, Long number,
+                    const std::string& clause);
+  static bool isGrouped(const BoundCore& core);
   bool sameExpression(const BoundExpression& first, const BoundExpression& second);
   void unifyParts(BoundSelect& select);
   void collateResult(BoundSelect& select);
   void bindOrder(const tsql::Select& select, BoundSelect& bound, const Scope& scope);
+  static void addEntryOrder(BoundSelect& bound);
   std::optional<std::size_t> ordinalOf(const tsql::Expression& expression, const tsql::Select& select,
                                        const BoundCore& core) const;
   static std::vector<SourceColumn> resultColumns(const BoundSelect& select);
@@ -79,7 +101,12 @@ class Binder {
   void bindDerived(const tsql::TableSource& source, Scope& scope, BoundCore& core);
   BoundSelectPtr bindView(const ViewInfo& view);
   ScopeSource tableScope(const TableInfo& table, const std::string& name);
-  const CommonTable* commonTable(const tsql::ObjectName& name) const;
+  CommonTable* commonTable(const tsql::ObjectName& name);
+  void readRecursively(CommonTable& table);
+  std::optional<std::size_t> databaseOf(const tsql::TableSource& source) const;
+  static bool isNamed(const ScopeSource& source, const std::vector<String>& qualifier);
+  static void nameColumns(BoundCore& core, const std::vector<String>& names, const std::string& table);
+  static std::size_t tablesIn(const BoundSelect& select);
   static void addScope(Scope& scope, ScopeSource source);
   std::string newAlias() { return "s" + std::to_string(++aliases_); }
 
@@ -94,9 +121,11 @@ class Binder {
   void addDefaults(BoundInsert& insert, std::size_t given);
   std::vector<std::size_t> insertColumns(const tsql::Insert& insert, const TableInfo& table) const;
   void storeItems(BoundSelect& select, const BoundInsert& insert);
+  void requireIdentity(BoundInsert& insert);
 
   // BindExpression.cpp
   BoundPtr bind(const tsql::Expression& expression, const Scope& scope);
+  void countNode();
   BoundPtr bindLiteral(const tsql::Expression& expression, bool negate);
   BoundPtr bindColumn(const tsql::Expression& expression, const Scope& scope);
   Found findColumn(const tsql::Expression& expression, const Scope& scope) const;
@@ -151,9 +180,17 @@ class Binder {
   std::vector<std::size_t> patterns_;
   std::vector<CommonTable> commonTables_;
   std::size_t aliases_ = 0;
+  std::size_t nodes_ = 0;  // of the bound tree
   std::size_t viewDepth_ = 0;
+  std::size_t selectDepth_ = 0;
   bool ownLiterals_ = false;
   bool stores_ = false;  // what is bound is written to a table
 };
+
+// Throws 116 where a select that stands for values gives several columns.
+void requireOneColumn(const BoundSelect& select);
+
+// 8623: the statement has more of something than it may.
+[[noreturn]] void refuseSize();
 
 }  // namespace QVSa::embedded

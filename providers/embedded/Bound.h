@@ -23,18 +23,18 @@ struct BoundExpression {
     null,
     parameter,  // ?n
     column,     // source.name
-    rowid,      // source.rowid
+    rowid,      // source._rowid_, the key that SQLite gives every row
     constant,   // a text of the storage library's own, such as a type code
     call,       // text(operands), `distinct` for an aggregate; count(*) has the operand constant *
     prefix,     // text operands[0]
-    infix,      // operands[0] text operands[1]
+    infix,      // operands with text between them
     isNull,     // operands[0] is [not] null
     between,    // operands[0] [not] between operands[1] and operands[2]
     caseOf,     // case when o[0] then o[1] when o[2] then o[3] ... [else o.back()]
     inValues,   // operands[0] [not] in (operands[1], ...)
     inList,     // operands[0] [not] in the list bound to `parameter`
     inSelect,   // operands[0] [not] in (select)
-    exists,     // [not] exists (select)
+    exists,     // exists (select)
     subquery,   // (select)
   };
 
@@ -91,6 +91,7 @@ struct BoundSource {
   // Written as a cross join: read after what stands before it, as the text's author chose.
   bool crossJoin = false;
   BoundPtr on{};
+  std::size_t tables = 1;  // that stand here, those of a derived table counted
 };
 
 struct BoundCore {

@@ -16,22 +16,6 @@ namespace QVSa::embedded {
 
 namespace {
 
-TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition) {
-  TableInfo table{database, definition.table.name, {}, std::nullopt};
-  for (auto& column : definition.columns) {
-    const bool inKey = column.primaryKey || std::ranges::any_of(definition.keys, [&](const tsql::KeyDefinition& key) {
-                         return key.primary && std::ranges::any_of(key.columns, [&](const String& name) {
-                                  return sameName(name, column.name);
-                                });
-                       });
-    if (column.identity) table.identity = table.columns.size();
-    table.columns.push_back({column.name, typeOf(column.type),
-                             !inKey && !column.identity && column.nullable.value_or(true),
-                             std::move(column.defaultValue)});
-  }
-  return table;
-}
-
 std::string quoted(const std::string& text) {
   std::string result = "N'";
   for (const char c : text) result.append(c == '\'' ? 2 : 1, c);
@@ -56,7 +40,35 @@ Type decimalType(const tsql::TypeName& name) {
   return {Base::decimal, static_cast<int>(precision), static_cast<int>(scale)};
 }
 
+std::string dotted(const tsql::ObjectName& name) {
+  const std::string owned = name.owner.empty() && name.database.empty() ? name.name : name.owner + "." + name.name;
+  return name.database.empty() ? owned : name.database + "." + owned;
+}
+
 }  // namespace
+
+TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition) {
+  TableInfo table{database, definition.table.name, {}, std::nullopt, {}};
+  for (auto& column : definition.columns) {
+    const bool inKey = column.primaryKey || std::ranges::any_of(definition.keys, [&](const tsql::KeyDefinition& key) {
+                         return key.primary && std::ranges::any_of(key.columns, [&](const String& name) {
+                                  return sameName(name, column.name);
+                                });
+                       });
+    if (column.identity) table.identity = table.columns.size();
+    if (column.identity || column.primaryKey || column.unique) table.keys.push_back({table.columns.size()});
+    table.columns.push_back({column.name, typeOf(column.type),
+                             !inKey && !column.identity && column.nullable.value_or(true),
+                             std::move(column.defaultValue)});
+  }
+  for (const auto& key : definition.keys) {
+    std::vector<std::size_t> columns;
+    for (const auto& name : key.columns)
+      if (const auto column = table.find(name)) columns.push_back(*column);
+    table.keys.push_back(std::move(columns));
+  }
+  return table;
+}
 
 std::optional<std::size_t> TableInfo::find(const std::string& column) const {
   for (std::size_t i = 0; i < columns.size(); ++i)
@@ -95,13 +107,8 @@ const Catalogue::Entry* Catalogue::lookUp(std::size_t database, const std::strin
 }
 
 Object Catalogue::find(const tsql::ObjectName& name, std::size_t currentDatabase) const {
-  std::size_t database = currentDatabase;
-  if (!name.database.empty()) {
-    const auto known = databaseByName(name.database);
-    if (!known) throw tsql::sqlFailure(911, "Database '" + name.database + "' does not exist.");
-    database = *known;
-  }
-  const Entry* entry = lookUp(database, name.name);
+  const auto database = name.database.empty() ? std::optional(currentDatabase) : databaseByName(name.database);
+  const Entry* entry = database && isOwner(name.owner) ? lookUp(*database, name.name) : nullptr;
   // A synonym names a table or a view, never another synonym, so one step is enough.
   if (entry)
     if (const auto* synonym = std::get_if<SynonymInfo>(entry))
@@ -110,7 +117,7 @@ Object Catalogue::find(const tsql::ObjectName& name, std::size_t currentDatabase
     if (const auto* table = std::get_if<TableInfo>(entry)) return table;
     if (const auto* view = std::get_if<ViewInfo>(entry)) return view;
   }
-  throw tsql::sqlFailure(208, "Invalid object name '" + name.name + "'.");
+  throw tsql::sqlFailure(208, "Invalid object name '" + dotted(name) + "'.");
 }
 
 bool Catalogue::exists(std::size_t database, const std::string& name) const {
@@ -121,6 +128,8 @@ const SynonymInfo* Catalogue::synonym(std::size_t database, const std::string& n
   const Entry* entry = lookUp(database, name);
   return entry ? std::get_if<SynonymInfo>(entry) : nullptr;
 }
+
+bool isOwner(const std::string& name) { return name.empty() || sameName(name, "dbo"); }
 
 std::optional<std::size_t> databaseByName(const std::string& name) {
   for (std::size_t i = 0; i < databaseNames.size(); ++i)

@@ -24,10 +24,14 @@ struct TableInfo {
   std::size_t database = 0;  // position in databaseNames
   std::string name;
   std::vector<ColumnInfo> columns;
-  std::optional<std::size_t> identity;  // the identity column, which is the row's key in the file as well
+  std::optional<std::size_t> identity;         // the identity column, which is the row's key in the file as well
+  std::vector<std::vector<std::size_t>> keys;  // the columns of each of its keys; indices are not known here
 
   std::optional<std::size_t> find(const std::string& column) const;
 };
+
+// What a definition makes; its defaults go over.
+TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition);
 
 struct ViewInfo {
   std::size_t database = 0;
@@ -51,7 +55,7 @@ class Catalogue {
   // A catalogue of another version than the handle's is out of date.
   std::int64_t version() const { return version_; }
 
-  // The table or view of that name, through synonyms. Throws 208 where there is none, 911 for an unknown database.
+  // The table or view of that name, through synonyms. Throws 208 where there is none.
   Object find(const tsql::ObjectName& name, std::size_t currentDatabase) const;
   // Whether a name is taken in a database by a table, a view or a synonym.
   bool exists(std::size_t database, const std::string& name) const;
@@ -66,6 +70,9 @@ class Catalogue {
   std::int64_t version_ = 0;
   std::map<std::pair<std::size_t, std::string>, Entry> entries_;
 };
+
+// Everything belongs to one owner, "dbo", who need not be named.
+bool isOwner(const std::string& name);
 
 // The position of a database by its name, any case; nothing for an unknown one.
 std::optional<std::size_t> databaseByName(const std::string& name);

@@ -27,11 +27,12 @@ constexpr int low = 3;
 constexpr int high = 5;
 constexpr int inItem = 6;
 constexpr int inSelect = 4;
-constexpr int exists = 4;
+constexpr int exists = 3;
 constexpr int item = 4;
 constexpr int derived = 6;
 constexpr int on = 9;
-constexpr int where = 7;
+constexpr int firstWhere = 5;
+constexpr int nextWhere = 7;
 constexpr int groupBy = 9;
 constexpr int having = 7;
 constexpr int orderBy = 11;
@@ -58,9 +59,9 @@ class Writer {
   void write(const BoundDelete& erase);
 
   Emitted take() {
-    std::ranges::sort(emitted_.parameters);
-    const auto repeated = std::ranges::unique(emitted_.parameters);
-    emitted_.parameters.erase(repeated.begin(), repeated.end());
+    auto& parameters = emitted_.parameters;
+    std::sort(parameters.begin(), parameters.end());
+    parameters.erase(std::unique(parameters.begin(), parameters.end()), parameters.end());
     emitted_.databases.assign(databases_.begin(), databases_.end());
     return std::move(emitted_);
   }
@@ -148,7 +149,7 @@ void Writer::write(const BoundExpression& expression) {
       return add(expression.text);
     case Kind::rowid:
       add(expression.source);
-      return add(".rowid");
+      return add("._rowid_");
     case Kind::constant:
       return add(expression.text);
     case Kind::call:
@@ -180,7 +181,7 @@ void Writer::write(const BoundExpression& expression) {
     case Kind::inSelect:
       return writeIn(expression);
     case Kind::exists:
-      add(expression.negated ? "(not exists (" : "(exists (");
+      add("(exists (");
       inside(places::exists, *expression.select);
       return add("))");
     case Kind::subquery:
@@ -327,7 +328,9 @@ void Writer::writeFrom(const std::vector<BoundSource>& from) {
 void Writer::writeWhere(const std::vector<BoundPtr>& where) {
   if (where.empty()) return;
   add(" where ");
-  list(where, " and ", [&](const BoundPtr& condition) { inside(places::where, *condition); });
+  list(where, " and ", [&](const BoundPtr& condition) {
+    inside(&condition == &where.front() ? places::firstWhere : places::nextWhere, *condition);
+  });
 }
 
 void Writer::write(const BoundCore& core) {
@@ -435,7 +438,7 @@ void Writer::write(const BoundUpdate& update) {
   inside(places::updateFrom, *update.from);
   add(") as n where ");
   add(update.alias);
-  add(".rowid=n.c0");
+  add("._rowid_=n.c0");
 }
 
 void Writer::write(const BoundDelete& erase) {
@@ -446,7 +449,7 @@ void Writer::write(const BoundDelete& erase) {
     add(erase.alias);
     return writeWhere(erase.where);
   }
-  add(" where rowid in (");
+  add(" where _rowid_ in (");
   inside(places::deleteFrom, *erase.from);
   add(")");
 }

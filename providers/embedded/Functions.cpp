@@ -45,7 +45,13 @@ void scopeIdentity(Call& call) {
   if (call.session().hasScopeIdentity) call.give(storedDecimal(call.session().scopeIdentity));
 }
 
-constexpr Function sessionFunctions[] = {{"t_convert", 5, convertValue}, {"t_scope_identity", 0, scopeIdentity, false}};
+void refuseNoIdentity(Call&) {
+  throw tsql::sqlFailure(339, "DEFAULT or NULL are not allowed as explicit identity values.");
+}
+
+constexpr Function sessionFunctions[] = {{"t_no_identity", 0, refuseNoIdentity, false},
+                                         {"t_convert", 5, convertValue},
+                                         {"t_scope_identity", 0, scopeIdentity, false}};
 
 void registerAll(sqlite3* handle, FunctionContext& session, std::span<const Function> functions) {
   const auto destroy = [](void* registered) { delete static_cast<Registered*>(registered); };

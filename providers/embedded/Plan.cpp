@@ -69,7 +69,11 @@ Step compileWrite(const BoundWrite& bound) {
 Step compileStatement(tsql::Statement& statement, Binder& binder, bool updatable) {
   if (const auto* select = std::get_if<tsql::SelectPtr>(&statement)) return compileQuery(**select, binder, updatable);
   if (const auto* insert = std::get_if<tsql::Insert>(&statement)) return compileInsert(*insert, binder);
-  if (const auto* update = std::get_if<tsql::Update>(&statement)) return compileWrite(binder.bindUpdate(*update));
+  if (auto* update = std::get_if<tsql::Update>(&statement)) {
+    Step step = compileWrite(binder.bindUpdate(*update));
+    step.update = std::move(*update);
+    return step;
+  }
   if (const auto* erase = std::get_if<tsql::Delete>(&statement)) return compileWrite(binder.bindDelete(*erase));
   Step step;
   step.control = std::move(statement);

@@ -21,6 +21,7 @@ class Compiled {
   Prepared take(Handle& handle);
   void giveBack(Prepared statement) noexcept;
   // The parameters that the text takes, by their place in the step's list.
+  const std::string& text() const { return emitted_.text; }
   const std::vector<std::size_t>& parameters() const { return emitted_.parameters; }
   // The databases that the text names.
   const std::vector<std::size_t>& databases() const { return emitted_.databases; }
@@ -50,8 +51,9 @@ struct Step {
   bool locks = false;                // xlock
   bool skips = false;                // readpast
   bool givesIdentity = false;
-  bool updatable = false;   // the row's key stands behind the last column
-  tsql::Statement control;  // of kind control: run as it is
+  bool updatable = false;              // the row's key stands behind the last column
+  tsql::Statement control;             // of kind control: run as it is
+  std::optional<tsql::Update> update;  // of an update: needed again where its rows exchange their keys
 };
 
 // What a batch of one shape runs, with the catalogue that it was bound against.

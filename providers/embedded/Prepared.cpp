@@ -36,6 +36,18 @@ void Prepared::reset() noexcept { sqlite3_reset(statement_); }
 
 Value Prepared::column(int ordinal) const { return readColumn(statement_, ordinal); }
 
+std::vector<Value> Prepared::row() const {
+  std::vector<Value> values;
+  for (int i = 0; i < columnCount(); ++i) values.push_back(column(i));
+  return values;
+}
+
+void Prepared::runWith(const std::vector<Value>& values) {
+  for (std::size_t i = 0; i < values.size(); ++i) bind(static_cast<int>(i + 1), values[i]);
+  while (step()) continue;
+  reset();
+}
+
 int Prepared::columnCount() const { return sqlite3_column_count(statement_); }
 
 void Prepared::fail(int code) {

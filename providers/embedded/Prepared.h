@@ -27,6 +27,9 @@ class Prepared {
   // Of the current row, counted from 0.
   Value column(int ordinal) const;
   int columnCount() const;
+  std::vector<Value> row() const;
+  // Runs a statement that gives no rows, with values for its first parameters.
+  void runWith(const std::vector<Value>& values);
   sqlite3_stmt* get() const { return statement_; }
 
  private:

@@ -3,9 +3,11 @@
 #include <algorithm>
 
 #include "platform/Services.h"
+#include "providers/embedded/Binder.h"
 #include "providers/embedded/Definitions.h"
 #include "providers/embedded/Literal.h"
 #include "providers/embedded/Rows.h"
+#include "providers/embedded/Savepoint.h"
 #include "providers/tsql/Parser.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -70,6 +72,9 @@ class TimeLimit {
 
 constexpr std::chrono::seconds rowWriteLimit{30};
 
+constexpr Long duplicateKey = 2627;
+constexpr Long duplicateRow = 2601;
+
 Failure deadlock() {
   return tsql::sqlFailure(1205,
                           "Transaction was deadlocked on lock resources with another process and has been chosen as "
@@ -101,11 +106,13 @@ EmbeddedSession::~EmbeddedSession() {
 void EmbeddedSession::refreshCatalogue() {
   const std::uint64_t mark = handle_->mark().value();
   if (cache_->catalogue && cache_->mark == mark && CatalogueMark::isSettled(mark)) return;
+  // Who reads already goes on seeing what was there before: the mark says nothing of that.
+  const bool readsAlready = sqlite3_txn_state(handle_->get(), nullptr) != SQLITE_TXN_NONE;
   if (!cache_->catalogue || cache_->catalogue->version() != handle_->catalogueVersion()) {
     for (auto& plans : cache_->plans) plans.clear();
     cache_->catalogue = std::make_shared<const Catalogue>(*handle_);
   }
-  cache_->mark = mark;
+  if (!readsAlready) cache_->mark = mark;
 }
 
 BatchResult EmbeddedSession::run(const Batch& batch) {
@@ -122,13 +129,17 @@ BatchResult EmbeddedSession::run(const Batch& batch) {
 }
 
 BatchResult EmbeddedSession::runStatements(const Batch& batch) {
-  auto tokens = tsql::tokenize(batch.text, tsql::Deadline(handle_->deadline()));
+  const tsql::Deadline deadline(handle_->deadline());
+  refreshCatalogue();
+  auto tokens = tsql::tokenize(batch.text, deadline);
+  const auto plan = planFor(batch, tokens);
+  std::vector<tsql::Statement> statements;
+  if (!plan) statements = tsql::parse(tokens, deadline);
+  std::erase_if(tokens, [](const tsql::Token& token) { return !tsql::isLiteral(token.kind); });
   BatchResult result;
-  if (const auto plan = planFor(batch, tokens)) {
-    for (auto& step : plan->steps) runStep(plan, step, tokens, result);
-    return result;
-  }
-  return runUncached(tsql::parse(tokens, tsql::Deadline(handle_->deadline())), batch, tokens);
+  if (!plan) return runUncached(std::move(statements), batch, tokens);
+  for (auto& step : plan->steps) runStep(plan, step, tokens, result);
+  return result;
 }
 
 std::shared_ptr<Plan> EmbeddedSession::planFor(const Batch& batch, std::vector<tsql::Token>& tokens) {
@@ -171,6 +182,7 @@ BatchResult EmbeddedSession::runUncached(std::vector<tsql::Statement> statements
 
 void EmbeddedSession::runStep(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens,
                               BatchResult& result) {
+  tsql::Deadline(handle_->deadline()).look();
   handle_->context().statementTicks = ticksOf(platform::services().localTime());
   for (const std::size_t database : step.databases) enter(database);
   if (step.kind == Step::Kind::control) return control(step.control);
@@ -197,10 +209,6 @@ std::unique_ptr<Rows> EmbeddedSession::query(const std::shared_ptr<Plan>& plan, 
 
 void EmbeddedSession::bind(Prepared& statement, const Compiled& compiled, const std::vector<Parameter>& parameters,
                            const std::vector<tsql::Token>& tokens, const std::shared_ptr<const ValueList>& locked) {
-  // Literals are numbered in their order, so one pass finds them all.
-  std::vector<const tsql::Token*> literals;
-  for (const auto& token : tokens)
-    if (tsql::isLiteral(token.kind)) literals.push_back(&token);
   for (const std::size_t place : compiled.parameters()) {
     const Parameter& parameter = parameters[place];
     const int number = static_cast<int>(place + 1);
@@ -208,7 +216,7 @@ void EmbeddedSession::bind(Prepared& statement, const Compiled& compiled, const 
       statement.bind(number, locked);
       continue;
     }
-    const tsql::Token& token = parameter.own ? *parameter.own : *literals.at(parameter.literal);
+    const tsql::Token& token = parameter.own ? *parameter.own : tokens.at(parameter.literal);
     if (parameter.source == Parameter::Source::list)
       statement.bind(number, listValue(parameter, token));
     else
@@ -277,11 +285,26 @@ void EmbeddedSession::takeWriter(std::size_t database) {
 }
 
 Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) {
-  if (step.givesIdentity && identityInsert_ != tableKey(*step.table))
+  const bool takesIdentity = identityInsert_ == tableKey(*step.table);
+  if (step.givesIdentity && !takesIdentity)
     throw tsql::sqlFailure(544, "Cannot insert explicit value for identity column in table '" + step.table->name +
                                     "' when IDENTITY_INSERT is set to OFF.");
+  if (step.kind == Step::Kind::insert && !step.givesIdentity && takesIdentity)
+    throw tsql::sqlFailure(545, "Explicit value must be specified for identity column in table '" + step.table->name +
+                                    "' either when IDENTITY_INSERT is set to ON or when a replication user is "
+                                    "inserting into a NOT FOR REPLICATION identity column.");
   if (step.candidates) awaitRows(step, tokens);
   prepareWrite(step.table->database);
+  if (!step.update) return runWrite(step, tokens);
+  try {
+    return runWrite(step, tokens);
+  } catch (const Failure& failure) {
+    if (failure.native() != duplicateKey && failure.native() != duplicateRow) throw;
+  }
+  return moveKeys(step, tokens);
+}
+
+Long EmbeddedSession::runWrite(Step& step, const std::vector<tsql::Token>& tokens) {
   Prepared statement = step.main->take(*handle_);
   bind(statement, *step.main, step.parameters, tokens);
   skipResult(statement);
@@ -294,6 +317,36 @@ Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) 
   return changes;
 }
 
+// SQLite checks keys row by row, the dialect at the end of the statement: a row may get the key of another that gets a
+// new one as well. So the new values are read first, then the old ones are replaced by what collides with nothing, then
+// the new ones come.
+Long EmbeddedSession::moveKeys(Step& step, const std::vector<tsql::Token>& tokens) {
+  Binder binder(*cache_->catalogue, database_);
+  const Compiled select(emit(*binder.bindNewValues(*step.update)));
+  const auto parameters = binder.takeParameters();
+  const std::string table = std::string(databaseNames[step.table->database]) + "." + quoteName(step.table->name);
+  std::string away, back;
+  for (const auto& assignment : step.update->assignments) {
+    const std::string column = quoteName(step.table->columns[*step.table->find(assignment.column)].name);
+    away += (away.empty() ? "" : ",") + column + "=cast('moved away, row ' || _rowid_ as blob)";
+    back += (back.empty() ? "" : ",") + column + "=?";
+  }
+  Savepoint savepoint(*handle_, step.table->database);
+  std::vector<std::vector<Value>> rows;
+  Prepared read(handle_->get(), select.text());
+  bind(read, select, parameters, tokens);
+  while (read.step()) rows.push_back(read.row());
+  Prepared moveAway(handle_->get(), "update " + table + " set " + away + " where _rowid_=?");
+  for (const auto& row : rows) moveAway.runWith({row.front()});
+  Prepared moveBack(handle_->get(), "update " + table + " set " + back + " where _rowid_=?");
+  for (auto& row : rows) {
+    std::rotate(row.begin(), row.begin() + 1, row.end());
+    moveBack.runWith(row);
+  }
+  savepoint.release();
+  return static_cast<Long>(rows.size());
+}
+
 void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
                                const std::vector<std::pair<std::size_t, Value>>& values) {
   const TimeLimit limit(*handle_, rowWriteLimit);
@@ -303,7 +356,7 @@ void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
   for (const auto& [column, value] : values)
     text += (text.empty() ? "" : ",") + quoteName(table.columns[column].name) + "=?";
   Prepared statement(handle_->get(), std::string("update ") + databaseNames[table.database] + "." +
-                                         quoteName(table.name) + " set " + text + " where rowid=?");
+                                         quoteName(table.name) + " set " + text + " where _rowid_=?");
   int place = 0;
   for (const auto& [column, value] : values) statement.bind(++place, value);
   statement.bind(++place, key);
@@ -314,6 +367,7 @@ void EmbeddedSession::control(const tsql::Statement& statement) {
   if (const auto* option = std::get_if<tsql::SetOption>(&statement)) return setOption(*option);
   if (const auto* transaction = std::get_if<tsql::Transaction>(&statement)) {
     using Kind = tsql::Transaction::Kind;
+    if (transaction->kind == Kind::begin && marked_) return static_cast<void>(++inner_);
     if (transaction->kind == Kind::begin) return begin();
     return transaction->kind == Kind::commit ? commit() : rollback();
   }
@@ -342,7 +396,12 @@ void EmbeddedSession::setOption(const tsql::SetOption& option) {
     throw tsql::sqlFailure(8106, "Table '" + option.table->name +
                                      "' does not have the identity property. Cannot perform "
                                      "SET operation.");
-  identityInsert_ = option.on ? tableKey(**table) : std::pair<std::size_t, std::string>();
+  const auto key = tableKey(**table);
+  const bool isOther = !identityInsert_.second.empty() && identityInsert_ != key;
+  if (option.on && isOther)
+    throw tsql::sqlFailure(8107, "IDENTITY_INSERT is already ON for table '" + identityInsert_.second +
+                                     "'. Cannot perform SET operation for table '" + option.table->name + "'.");
+  if (!isOther) identityInsert_ = option.on ? key : std::pair<std::size_t, std::string>();
 }
 
 void EmbeddedSession::defineObject(const tsql::Statement& statement) {
@@ -401,6 +460,7 @@ void EmbeddedSession::begin() {
 
 void EmbeddedSession::commit() {
   if (!marked_) throw tsql::sqlFailure(3902, "The COMMIT TRANSACTION request has no corresponding BEGIN TRANSACTION.");
+  if (inner_ > 0) return static_cast<void>(--inner_);
   // A failed statement for want of room ends the storage library's transaction by itself.
   if (started_ && !handle_->inTransaction()) {
     endTransaction();
@@ -424,6 +484,7 @@ void EmbeddedSession::rollback() {
 
 void EmbeddedSession::endTransaction() {
   marked_ = started_ = false;
+  inner_ = 0;
   change_.reset();
   writing_.clear();
   handle_->releaseLocks();

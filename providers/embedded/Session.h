@@ -38,6 +38,7 @@ class EmbeddedSession : public ProviderSession {
 
   BatchResult runStatements(const Batch& batch);
   std::shared_ptr<Plan> planFor(const Batch& batch, std::vector<tsql::Token>& tokens);
+  // `tokens` are the literals of the batch from here on, each in the place of its number.
   // A batch that changes names on its way is bound statement by statement, as it runs.
   BatchResult runUncached(std::vector<tsql::Statement> statements, const Batch& batch,
                           const std::vector<tsql::Token>& tokens);
@@ -45,6 +46,8 @@ class EmbeddedSession : public ProviderSession {
                BatchResult& result);
   std::unique_ptr<Rows> query(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens);
   Long write(Step& step, const std::vector<tsql::Token>& tokens);
+  Long runWrite(Step& step, const std::vector<tsql::Token>& tokens);
+  Long moveKeys(Step& step, const std::vector<tsql::Token>& tokens);
   void control(const tsql::Statement& statement);
   void setOption(const tsql::SetOption& option);
   void use(const std::string& database);
@@ -78,6 +81,7 @@ class EmbeddedSession : public ProviderSession {
   std::size_t database_;
   bool administrator_;
   bool marked_ = false;                    // begin was called
+  std::size_t inner_ = 0;                  // transactions within the one that counts
   bool started_ = false;                   // the storage library's transaction is open
   std::set<std::size_t> writing_;          // databases whose writer's place is taken
   std::optional<CatalogueChange> change_;  // from the transaction's first definition on

@@ -17,9 +17,11 @@ std::ptrdiff_t rankOf(const Type& type) {
   return std::find(std::begin(precedence), std::end(precedence), type.base) - std::begin(precedence);
 }
 
-// Digits before the point and behind it, at most 38 in all; a sum gives up digits behind the point for those before it.
-Type decimalType(int whole, int scale) {
-  return {Base::decimal, std::min(whole + scale, mostDecimalDigits), std::min(scale, mostDecimalDigits - whole)};
+// Digits before the point and behind it, at most 38 in all: those before it come first. A sum may carry one over, for
+// which nothing is given up.
+Type decimalType(int whole, int scale, int carry = 0) {
+  return {Base::decimal, std::min(whole + scale + carry, mostDecimalDigits),
+          std::min(scale, mostDecimalDigits - whole)};
 }
 
 // A product or quotient of too many digits keeps six behind the point, and of those before it what is left.
@@ -40,7 +42,7 @@ Type decimalResult(char op, const Type& a, const Type& b) {
     case '%':
       return decimalType(std::min(wholeA, wholeB), scale);
     default:
-      return decimalType(std::min(std::max(wholeA, wholeB) + 1, mostDecimalDigits), scale);
+      return decimalType(std::max(wholeA, wholeB), scale, 1);
   }
 }
 

@@ -30,7 +30,7 @@ std::vector<Statement> Parser::batch() {
   for (;;) {
     while (takeSymbol(";")) continue;
     if (now().kind == TokenKind::end) return statements;
-    operators_ = joins_ = 0;
+    operators_ = 0;
     statements.push_back(statement());
   }
 }

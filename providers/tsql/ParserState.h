@@ -161,7 +161,7 @@ class Parser {
   std::size_t at_ = 0;
   std::size_t depth_ = 0;
   std::size_t operators_ = 0;          // of the statement
-  std::size_t joins_ = 0;              // of the statement
+  std::size_t tables_ = 0;             // of the from list
   std::vector<std::size_t> caseEnds_;  // for each token that is a case, its end; empty until the first chain
 };
 

@@ -142,6 +142,7 @@ TEST_F(Administration, AWarmHandleKnowsWhatHasChangedSinceItsLastSession) {
   }
   EXPECT_EQ(value(*open("QVSys"), "select a from v").toLong(), 2);
   session->run({"drop login QVUser"});
+  EXPECT_EQ(native(*session, "drop login QVUser"), 15151);
   EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
   session->run({"create login QVUser with password=N'another'"});
   EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
