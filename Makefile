@@ -8,7 +8,7 @@ JOBS ?= $(shell nproc)
 export CTEST_PARALLEL_LEVEL ?= $(JOBS)
 say = @printf '\n== %s\n'
 
-.PHONY: help packages build demo test test-long sanitize bench fuzz format lint clean
+.PHONY: help packages build demo test test-long sanitize bench fuzz docs format lint clean
 
 help:  ## List the targets
 	@grep -hE '^[a-z-]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
@@ -60,6 +60,12 @@ fuzz:  ## Fuzz statements of T-SQL up to SQLite for a minute (build/fuzz)
 	@cmake --build --preset fuzz -j $(JOBS) --target statement_fuzz
 	@test -d build/fuzz/corpus || { mkdir build/fuzz/corpus; split -l 1 -a 3 tests/tsql/statements.txt build/fuzz/corpus/; }
 	@build/fuzz/tests/fuzz/statement_fuzz -max_total_time=60 -dict=tests/fuzz/tsql.dict build/fuzz/corpus
+
+docs:  ## Print the table of functions and operators into docs/dialect.md
+	@cmake --preset release --log-level=NOTICE
+	@cmake --build --preset release -j $(JOBS) --target dialect_table
+	@sed -i -e '/^<!-- table -->$$/,/^<!-- end of the table -->$$/{//!d}' docs/dialect.md
+	@build/release/tools/dialect_table | sed -i '/^<!-- table -->$$/r /dev/stdin' docs/dialect.md
 
 sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h')
 

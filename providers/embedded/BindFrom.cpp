@@ -2,6 +2,7 @@
 #include <set>
 
 #include "providers/embedded/Binder.h"
+#include "providers/embedded/StorageFailure.h"
 #include "providers/tsql/OuterJoins.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -55,7 +56,7 @@ void Binder::bindJoin(const tsql::TableSource& join, Scope& scope, BoundCore& co
   const tsql::TableSource& second = turned ? *join.left : *join.right;
   const bool outer = turned || join.join == Join::left;
   if (join.join == Join::full || (outer && second.kind == tsql::TableSource::Kind::join))
-    throw tsql::sqlFailure(40515, "This form of outer join is not supported by the embedded engine.");
+    throw unsupported("This form of outer join");
   bindSource(first, scope, core);
   bindSource(second, scope, core);
   core.from.back().crossJoin = join.join == Join::cross;

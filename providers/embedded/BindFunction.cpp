@@ -2,6 +2,7 @@
 
 #include "providers/embedded/Binder.h"
 #include "providers/embedded/Decimal.h"
+#include "providers/embedded/StorageFailure.h"
 #include "providers/embedded/TypeRules.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -155,6 +156,8 @@ BoundPtr Binder::bindAggregate(const Operation& row, const tsql::Expression& exp
     throw tsql::sqlFailure(130,
                            "Cannot perform an aggregate function on an expression containing an aggregate or a "
                            "subquery.");
+  if (readsColumn(*operand) && !readsOwn(*operand, scope))
+    throw unsupported("An aggregate over a column of the query outside");
   operand = collate(taken(row, 0, std::move(operand)));
   const Type type = operand->type.base == Base::unknown ? whole : operand->type;
   Type result = row.gives == Gives::first ? type : whole;

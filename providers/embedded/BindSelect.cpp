@@ -2,6 +2,7 @@
 
 #include "providers/embedded/Binder.h"
 #include "providers/embedded/EntryOrder.h"
+#include "providers/embedded/StorageFailure.h"
 #include "providers/embedded/TypeRules.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -134,7 +135,11 @@ BoundPtr Binder::bindSubquery(const tsql::Select& select, const Scope& scope) {
     one->aggregate = true;
     return one;
   };
-  if (isPlain) {
+  // An aggregate over a column from outside would be one of the select outside.
+  const BoundExpression& item = *core.items.front().expression;
+  const bool isOwn = item.kind == BoundExpression::Kind::column &&
+                     std::ranges::find(core.from, item.source, &BoundSource::alias) != core.from.end();
+  if (isPlain && isOwn) {
     core.items.front().expression = single(std::move(core.items.front().expression));
     return subquery;
   }
@@ -219,7 +224,7 @@ BoundPtr Binder::bindWhere(const tsql::Expression& where, const Scope& scope) {
 BoundCore Binder::bindCore(const tsql::SelectCore& core, Scope& scope) {
   BoundCore bound;
   bound.distinct = core.distinct;
-  if (core.topPercent) throw tsql::sqlFailure(40515, "TOP PERCENT is not supported by the embedded engine.");
+  if (core.topPercent) throw unsupported("TOP PERCENT");
   bindFrom(core.from, scope, bound);
   if (core.top) {
     Parameter top = literalParameter(*core.top, Parameter::Source::literal);
@@ -235,6 +240,9 @@ BoundCore Binder::bindCore(const tsql::SelectCore& core, Scope& scope) {
   if (core.groupBy.size() > mostColumns) refuseSize();
   for (const auto& expression : core.groupBy) {
     bound.groupBy.push_back(collate(bind(*expression, scope)));
+    if (!readsOwn(*bound.groupBy.back(), scope))
+      throw tsql::sqlFailure(
+          164, "Each GROUP BY expression must contain at least one column that is not an outer reference.");
     if (bound.groupBy.back()->aggregate)
       throw tsql::sqlFailure(144,
                              "Cannot use an aggregate or a subquery in an expression used for the group by list of a "
@@ -288,6 +296,25 @@ void Binder::addStar(const tsql::Expression& star, const Scope& scope, BoundCore
                                   "alias name used in the query.");
 }
 
+bool Binder::readsColumn(const BoundExpression& expression) {
+  return expression.kind == BoundExpression::Kind::column ||
+         std::ranges::any_of(expression.operands, [](const BoundPtr& operand) { return readsColumn(*operand); });
+}
+
+bool Binder::readsOwn(const BoundExpression& expression, const Scope& scope) {
+  const bool isOwn =
+      expression.kind == BoundExpression::Kind::column &&
+      std::ranges::any_of(scope.sources, [&](const ScopeSource& source) { return source.alias == expression.source; });
+  return isOwn ||
+         std::ranges::any_of(expression.operands, [&](const BoundPtr& operand) { return readsOwn(*operand, scope); });
+}
+
+bool Binder::readsOutside(const BoundExpression& expression, const Scope& scope) {
+  if (expression.kind == BoundExpression::Kind::column) return !readsOwn(expression, scope);
+  return std::ranges::any_of(expression.operands,
+                             [&](const BoundPtr& operand) { return readsOutside(*operand, scope); });
+}
+
 bool Binder::isGrouped(const BoundCore& core) {
   return !core.groupBy.empty() || core.having ||
          std::ranges::any_of(core.items, [](const BoundItem& item) { return item.expression->aggregate; });
@@ -307,10 +334,7 @@ void Binder::checkGrouped(const BoundExpression& expression, const BoundCore& co
   const bool isAggregate = expression.kind == BoundExpression::Kind::call && expression.aggregate &&
                            std::ranges::none_of(expression.operands, [](const BoundPtr& o) { return o->aggregate; });
   if (isAggregate) return;
-  const bool own =
-      expression.kind == BoundExpression::Kind::column &&
-      std::ranges::any_of(scope.sources, [&](const ScopeSource& s) { return s.alias == expression.source; });
-  if (own)
+  if (expression.kind == BoundExpression::Kind::column && readsOwn(expression, scope))
     throw tsql::sqlFailure(number, "Column " + expression.text + " is invalid in the " + clause +
                                        " because it is not contained in either an aggregate function or the GROUP BY "
                                        "clause.");
@@ -405,6 +429,12 @@ void Binder::bindOrder(const tsql::Select& select, BoundSelect& bound, const Sco
       checkGrouped(*order.expression, core, scope, 8127, "ORDER BY clause");
     } else if (order.expression->aggregate) {
       for (const auto& result : core.items) checkGrouped(*result.expression, core, scope, 8120, "select list");
+      throw unsupported("An aggregate in the ORDER BY clause of a query without groups");
+    }
+    if (readsOutside(*order.expression, scope)) {
+      // The same for all rows, if it reads nothing else.
+      if (!readsOwn(*order.expression, scope)) continue;
+      throw unsupported("An ORDER BY clause with a column of the query outside");
     }
     if (core.distinct) {
       const auto same = std::ranges::find_if(core.items, [&](const BoundItem& candidate) {

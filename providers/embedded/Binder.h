@@ -84,6 +84,10 @@ class Binder {
   void checkGrouped(const BoundExpression& expression, const BoundCore& core, const Scope& scope, Long number,
                     const std::string& clause);
   static bool isGrouped(const BoundCore& core);
+  // Whether the expression itself reads a column, or one of this scope's own sources.
+  static bool readsColumn(const BoundExpression& expression);
+  static bool readsOwn(const BoundExpression& expression, const Scope& scope);
+  static bool readsOutside(const BoundExpression& expression, const Scope& scope);
   bool sameExpression(const BoundExpression& first, const BoundExpression& second);
   void unifyParts(BoundSelect& select);
   void collateResult(BoundSelect& select);

@@ -6,6 +6,7 @@
 #include "platform/PasswordDigest.h"
 #include "providers/embedded/Binder.h"
 #include "providers/embedded/NullIndex.h"
+#include "providers/embedded/StorageFailure.h"
 #include "providers/tsql/Parser.h"
 #include "providers/tsql/Printer.h"
 #include "providers/tsql/SqlFailure.h"
@@ -66,8 +67,7 @@ bool isInFile(Handle& handle, std::size_t database, const std::string& name) {
 }
 
 void refuseTaken(Handle& handle, const Catalogue& catalogue, std::size_t database, const std::string& name) {
-  if (name.starts_with('#'))
-    throw tsql::sqlFailure(40515, "A temporary table, '" + name + "', is not supported by the embedded engine.");
+  if (name.starts_with('#')) throw unsupported("A temporary table, '" + name + "',");
   if (catalogue.exists(database, name) || isReserved(name) || isInFile(handle, database, name))
     throw tsql::sqlFailure(2714, "There is already an object named '" + name + "' in the database.");
 }
@@ -134,9 +134,7 @@ void checkIdentity(const tsql::ColumnDefinition& column, const std::string& tabl
     throw tsql::sqlFailure(1754, "Defaults cannot be created on columns with an IDENTITY attribute. Table '" + table +
                                      "', column '" + column.name + "'.");
   if (column.increment != 1 || column.seed < 1)
-    throw tsql::sqlFailure(40515,
-                           "An identity increment other than 1, or a seed below it, is not supported by the embedded "
-                           "engine.");
+    throw unsupported("An identity increment other than 1, or a seed below it,");
 }
 
 void checkColumns(const tsql::CreateTable& table) {

@@ -173,6 +173,10 @@ Failure failureOf(sqlite3* handle, int code, const std::string& message) {
 
 }  // namespace
 
+Failure unsupported(const std::string& what) {
+  return sqlFailure(40515, what + " is not supported by the embedded engine.");
+}
+
 Failure valueTooLarge() {
   return sqlFailure(7119, "Attempting to grow LOB beyond maximum allowed size of 1000000000 bytes.");
 }

@@ -18,6 +18,9 @@ void requireMemory(int code);
 
 using tsql::timeExpired;
 
+// 40515: something of T-SQL that the engine does not have.
+Failure unsupported(const std::string& what);
+
 // A value is larger than SQLite can hold.
 Failure valueTooLarge();
 
