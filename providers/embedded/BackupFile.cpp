@@ -9,6 +9,9 @@
 #include <unistd.h>
 
 #include "platform/Files.h"
+#include "platform/Services.h"
+#include "providers/embedded/BackupTrailer.h"
+#include "providers/embedded/Definitions.h"
 #include "providers/embedded/Layout.h"
 #include "providers/embedded/StorageFailure.h"
 #include "providers/tsql/SqlFailure.h"
@@ -57,11 +60,11 @@ void BackupFile::open() {
   struct stat state {};
   if (::stat(file.c_str(), &state) != 0 || ::access(file.c_str(), R_OK) != 0) throw cannotOpenDevice(path_, errno);
   // An empty file would pass for an empty database.
-  if (!S_ISREG(state.st_mode) || state.st_size == 0) refuse();
+  if (!S_ISREG(state.st_mode) || state.st_size == 0) refuse("It is no file with something in it.");
   const int flags = SQLITE_OPEN_READONLY | SQLITE_OPEN_NOMUTEX | SQLITE_OPEN_PRIVATECACHE | SQLITE_OPEN_EXRESCODE;
   const int code = sqlite3_open_v2(file.c_str(), &handle_, flags, nullptr);
   requireMemory(code);
-  if (code != SQLITE_OK) refuse();
+  if (code != SQLITE_OK) refuse("It can't be read.");
   sqlite3_db_config(handle_, SQLITE_DBCONFIG_TRUSTED_SCHEMA, 0, nullptr);
   sqlite3_progress_handler(handle_, stepsBetweenLooks, onProgress, this);
   registerFunctions(handle_, context_);
@@ -69,9 +72,12 @@ void BackupFile::open() {
 
 // A page of another size would need the file's own pages cut anew, which a restore in one step cannot do.
 void BackupFile::checkForm() {
-  if (read("pragma application_id") != std::to_string(applicationId) || read("pragma page_size") != pageSize) refuse();
+  if (read("pragma application_id") != std::to_string(applicationId) || read("pragma page_size") != pageSize)
+    refuse("It is no backup of this system.");
+  const int mark = markOfDatabase();
+  if (mark < 0 || mark > static_cast<int>(databaseNames.size())) refuse("It is of no database of this system.");
   const int layout = wholeNumber(read("select layout from engine"));
-  if (layout < 1) refuse();
+  if (layout < 1) refuse("It has no layout that any release has written.");
   if (layout > layoutVersion)
     throw sqlFailure(3169, "The database was backed up with layout " + std::to_string(layout) +
                                ". This program knows layouts up to " + std::to_string(layoutVersion) +
@@ -79,14 +85,62 @@ void BackupFile::checkForm() {
 }
 
 bool BackupFile::isOf(std::size_t database) {
-  const int mark = wholeNumber(read("pragma user_version"));
+  const int mark = markOfDatabase();
   return mark == 0 || mark == static_cast<int>(database) + 1;
 }
 
+int BackupFile::markOfDatabase() { return wholeNumber(read("pragma user_version")); }
+
 void BackupFile::check() {
+  checkSum();
   const auto isWhole = [this] { return read("pragma integrity_check(1)") == "ok"; };
-  // To the storage library a page that it has no memory for is damage, too. Such damage is not found twice.
-  if (!isWhole() && !isWhole()) refuse();
+  // To SQLite a page that it has no memory for is damage, too. Such damage is not found twice.
+  if (!isWhole() && !isWhole()) refuse("Its structure is damaged.");
+  checkDefinitions();
+  if (!isSummed())
+    platform::services().eventLog("The backup '" + path_ +
+                                  "' is of an earlier release and has no checksum: damage may go unnoticed.");
+}
+
+bool BackupFile::isSummed() { return size() != sizeOfPages(); }
+
+void BackupFile::checkSum() {
+  const std::int64_t pages = sizeOfPages();
+  const std::int64_t all = size();
+  if (all == pages) return;
+  if (all != pages + static_cast<std::int64_t>(trailerSize)) refuse("It was cut off, or something was added to it.");
+  sqlite3_file* file = nullptr;
+  sqlite3_file_control(handle_, "main", SQLITE_FCNTL_FILE_POINTER, &file);
+  const auto readBytes = [&](void* bytes, std::size_t count, std::int64_t place) {
+    if (isLate()) throw timeExpired();
+    if (file->pMethods->xRead(file, bytes, static_cast<int>(count), place) != SQLITE_OK) refuse("It can't be read.");
+  };
+  Trailer written{};
+  readBytes(written.data(), written.size(), pages);
+  if (written != trailerOf(readBytes, pages)) refuse("Its checksum is wrong: it is damaged.");
+}
+
+// What a copy holds is right in itself or wrong in itself: a definition that does not fit its table would be found out
+// only once the copy has taken the place of a database that worked.
+void BackupFile::checkDefinitions() {
+  try {
+    requireFittingDefinitions(handle_);
+  } catch (const Failure& failure) {
+    if (failure.number() == number::timeout) throw;
+    refuse("Its definitions are damaged: " + failure.description());
+  }
+}
+
+std::int64_t BackupFile::sizeOfPages() {
+  return std::int64_t{wholeNumber(read("pragma page_count"))} * wholeNumber(read("pragma page_size"));
+}
+
+std::int64_t BackupFile::size() {
+  sqlite3_file* file = nullptr;
+  sqlite3_file_control(handle_, "main", SQLITE_FCNTL_FILE_POINTER, &file);
+  sqlite3_int64 bytes = 0;
+  if (file->pMethods->xFileSize(file, &bytes) != SQLITE_OK) refuse("It can't be read.");
+  return bytes;
 }
 
 // The first column of the first row; empty without one, for NULL, and where the file cannot be read.
@@ -103,14 +157,13 @@ std::string BackupFile::read(const std::string& query) {
   return reinterpret_cast<const char*>(text);
 }
 
-void BackupFile::refuse() const {
+bool BackupFile::isLate() const { return deadline_ && std::chrono::steady_clock::now() >= *deadline_; }
+
+void BackupFile::refuse(const std::string& reason) const {
   throw sqlFailure(3241, "The media family on device '" + path_ +
-                             "' is incorrectly formed. SQL Server cannot process this media family.");
+                             "' is incorrectly formed. SQL Server cannot process this media family. " + reason);
 }
 
-int BackupFile::onProgress(void* self) {
-  const Deadline& deadline = static_cast<BackupFile*>(self)->deadline_;
-  return deadline && std::chrono::steady_clock::now() >= *deadline;
-}
+int BackupFile::onProgress(void* self) { return static_cast<BackupFile*>(self)->isLate(); }
 
 }  // namespace QVSa::embedded

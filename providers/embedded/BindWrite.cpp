@@ -236,7 +236,6 @@ BoundUpdate Binder::bindUpdate(const tsql::Update& update) {
     bound.where = std::move(core.where);
   else
     bound.from = std::move(rows);
-  bound.claim = {bound.table, keysOf(update.target, update.from, update.where.get()), false, false};
   return bound;
 }
 
@@ -251,7 +250,6 @@ BoundDelete Binder::bindDelete(const tsql::Delete& erase) {
   } else {
     bound.from = keysOf(erase.target, erase.from, erase.where.get());
   }
-  bound.claim = {bound.table, keysOf(erase.target, erase.from, erase.where.get()), false, false};
   return bound;
 }
 

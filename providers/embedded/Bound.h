@@ -125,7 +125,7 @@ struct BoundSelect {
   std::vector<BoundOrder> orderBy;
 };
 
-// The rows that a select with lock hints takes, or that a write must wait for.
+// The rows that a select with lock hints takes.
 struct RowClaim {
   const TableInfo* table = nullptr;
   BoundSelectPtr candidates;  // their keys
@@ -155,7 +155,6 @@ struct BoundUpdate {
   std::vector<BoundPtr> where;
   // With a from clause: key and new values come from this query; `assignments` then name its columns in order.
   BoundSelectPtr from;
-  RowClaim claim;
 };
 
 struct BoundDelete {
@@ -163,7 +162,6 @@ struct BoundDelete {
   std::string alias;
   std::vector<BoundPtr> where;
   BoundSelectPtr from;  // the keys of the rows to delete
-  RowClaim claim;
 };
 
 }  // namespace QVSa::embedded

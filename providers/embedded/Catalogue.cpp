@@ -8,6 +8,7 @@
 
 #include "providers/embedded/CaseFolding.h"
 #include "providers/embedded/Decimal.h"
+#include "providers/embedded/OpeningFailure.h"
 #include "providers/embedded/Utf8.h"
 #include "providers/tsql/Parser.h"
 #include "providers/tsql/SqlFailure.h"
@@ -81,9 +82,26 @@ Catalogue::Catalogue(Handle& handle) : version_(handle.catalogueVersion()) {
 }
 
 void Catalogue::load(Handle& handle, std::size_t database) {
-  Prepared query(handle.get(), std::string("select text from ") + databaseNames[database] + ".definitions");
-  while (query.step()) loadText(database, std::get<std::string>(query.column(0)));
+  unreadable_[database] = handle.whyReplaced(database);
+  try {
+    Prepared query(handle.get(), std::string("select text from ") + databaseNames[database] + ".definitions");
+    while (query.step()) {
+      const Value text = query.column(0);
+      if (!std::holds_alternative<std::string>(text)) throw tsql::sqlFailure(824, "A definition is no text.");
+      loadText(database, std::get<std::string>(text));
+    }
+  } catch (const Failure& failure) {
+    if (failure.number() == number::timeout) throw;
+    const Failure told = cannotOpen(handle.folder(), database, "a definition can't be read: " + failure.description());
+    if (database == 0 || !handle.replacesUnreadable()) throw told;
+    unreadable_[database] = told;
+    std::erase_if(entries_, [&](const auto& entry) { return entry.first.first == database; });
+  }
   loadText(database, filesView(handle.folder(), databaseNames[database]));
+}
+
+void Catalogue::requireReadable(std::size_t database) const {
+  if (unreadable_[database]) throw *unreadable_[database];
 }
 
 void Catalogue::loadText(std::size_t database, const std::string& definition) {
@@ -117,6 +135,7 @@ Object Catalogue::find(const tsql::ObjectName& name, std::size_t currentDatabase
     if (const auto* table = std::get_if<TableInfo>(entry)) return table;
     if (const auto* view = std::get_if<ViewInfo>(entry)) return view;
   }
+  requireReadable(database);
   throw tsql::sqlFailure(208, "Invalid object name '" + dotted(name) + "'.");
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <map>
 #include <memory>
 #include <optional>
@@ -25,7 +26,7 @@ struct TableInfo {
   std::string name;
   std::vector<ColumnInfo> columns;
   std::optional<std::size_t> identity;         // the identity column, which is the row's key in the file as well
-  std::vector<std::vector<std::size_t>> keys;  // the columns of each of its keys; indices are not known here
+  std::vector<std::vector<std::size_t>> keys;  // primary and unique, by the places of their columns
 
   std::optional<std::size_t> find(const std::string& column) const;
 };
@@ -50,16 +51,20 @@ using Object = std::variant<const TableInfo*, const ViewInfo*>;
 // What the databases of an installation hold, as it was when it was loaded.
 class Catalogue {
  public:
+  // Throws 4060 for a database whose definitions can't be read, if the handle does not replace such ones.
   explicit Catalogue(Handle& handle);
 
   // A catalogue of another version than the handle's is out of date.
   std::int64_t version() const { return version_; }
 
-  // The table or view of that name, through synonyms. Throws 208 where there is none.
+  // The table or view of that name, through synonyms. Throws 208 where there is none, 4060 for a database that can't be
+  // read.
   Object find(const tsql::ObjectName& name, std::size_t currentDatabase) const;
   // Whether a name is taken in a database by a table, a view or a synonym.
   bool exists(std::size_t database, const std::string& name) const;
   const SynonymInfo* synonym(std::size_t database, const std::string& name) const;
+  // Throws 4060 for a database that can't be read.
+  void requireReadable(std::size_t database) const;
 
  private:
   using Entry = std::variant<TableInfo, ViewInfo, SynonymInfo>;
@@ -69,6 +74,7 @@ class Catalogue {
 
   std::int64_t version_ = 0;
   std::map<std::pair<std::size_t, std::string>, Entry> entries_;
+  std::array<std::optional<Failure>, databaseNames.size()> unreadable_;
 };
 
 // Everything belongs to one owner, "dbo", who need not be named.

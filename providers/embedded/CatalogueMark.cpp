@@ -4,10 +4,9 @@
 #include <fcntl.h>
 #include <sys/mman.h>
 #include <sys/stat.h>
-#include <system_error>
 #include <unistd.h>
 
-#include "providers/tsql/SqlFailure.h"
+#include "providers/embedded/OpeningFailure.h"
 
 namespace QVSa::embedded {
 
@@ -33,9 +32,7 @@ void* mapped(const std::filesystem::path& path) {
 
 CatalogueMark::CatalogueMark(const std::filesystem::path& file) {
   void* const memory = mapped(file);
-  if (memory == MAP_FAILED)
-    throw tsql::sqlFailure(4060, "Cannot open database \"" + file.stem().string() +
-                                     "\": its lock file: " + std::generic_category().message(errno) + ".");
+  if (memory == MAP_FAILED) throw cannotOpenLockFile(file);
   place_ = static_cast<std::uint64_t*>(memory);
 }
 

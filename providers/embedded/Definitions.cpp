@@ -51,6 +51,12 @@ void forget(Handle& handle, std::size_t database, const std::string& name) {
   changed(handle, database);
 }
 
+// Empty for a value that is no text, which only a damaged file has in such a place.
+std::string textOf(const Value& value) {
+  const auto* const text = std::get_if<std::string>(&value);
+  return text ? *text : std::string();
+}
+
 // What a file holds beside the tables of the dialect, and what SQLite keeps for itself.
 bool isReserved(const std::string& name) {
   static constexpr std::string_view own[] = {"definitions", "engine", "gate", "list", "logins"};
@@ -325,7 +331,54 @@ void drop(Handle& handle, const Catalogue& catalogue, std::size_t current, const
   forget(handle, database, name);
 }
 
+std::vector<std::string> columnsOf(sqlite3* handle, const std::string& table) {
+  Prepared columns(handle, "select name from pragma_table_info(?)");
+  columns.bind(1, table);
+  std::vector<std::string> names;
+  while (columns.step()) names.push_back(textOf(columns.column(0)));
+  return names;
+}
+
+std::vector<std::string> columnsOf(const tsql::CreateTable& table) {
+  std::vector<std::string> names;
+  for (const auto& column : table.columns) {
+    typeOf(column.type);
+    names.push_back(column.name);
+  }
+  return names;
+}
+
+void requireFitting(sqlite3* handle, const std::string& name, const std::string& text) {
+  const auto statements = tsql::parse(tsql::tokenize(text));
+  const tsql::Statement* const only = statements.size() == 1 ? &statements.front() : nullptr;
+  const auto* const table = only ? std::get_if<tsql::CreateTable>(only) : nullptr;
+  const auto* const view = only ? std::get_if<tsql::CreateView>(only) : nullptr;
+  const auto* const synonym = only ? std::get_if<tsql::CreateSynonym>(only) : nullptr;
+  const tsql::ObjectName* const object = table     ? &table->table
+                                         : view    ? &view->view
+                                         : synonym ? &synonym->synonym
+                                                   : nullptr;
+  if (!object || foldName(object->name) != name || (table && columnsOf(*table) != columnsOf(handle, object->name)))
+    throw tsql::sqlFailure(3241, "'" + name + "' is not what its definition says.");
+}
+
 }  // namespace
+
+void requireFittingDefinitions(sqlite3* handle) {
+  Prepared definitions(handle, "select name, text from definitions");
+  std::set<std::string> names;
+  while (definitions.step()) {
+    const std::string name = textOf(definitions.column(0));
+    requireFitting(handle, name, textOf(definitions.column(1)));
+    names.insert(name);
+  }
+  Prepared tables(handle,
+                  "select name from sqlite_schema where type='table' and name not like 'sqlite\\_%' escape '\\' and "
+                  "name not in ('engine','gate','definitions','logins')");
+  while (tables.step())
+    if (const std::string name = textOf(tables.column(0)); !names.contains(foldName(name)))
+      throw tsql::sqlFailure(3241, "'" + name + "' has no definition.");
+}
 
 void prepareDefinitions(Handle& handle, std::size_t database) {
   handle.execute(std::string("create table if not exists ") + databaseNames[database] +

@@ -20,4 +20,8 @@ std::size_t definedDatabase(const tsql::Statement& statement, std::size_t curren
 // binder's failures for a view that cannot be bound.
 void define(Handle& handle, const Catalogue& catalogue, std::size_t currentDatabase, const tsql::Statement& statement);
 
+// Throws where a database that is open as the handle's first holds a definition that can't be read, that goes by
+// another name, or whose columns are not those of its table, and where a table has none.
+void requireFittingDefinitions(sqlite3* handle);
+
 }  // namespace QVSa::embedded

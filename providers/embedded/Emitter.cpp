@@ -38,6 +38,7 @@ constexpr int having = 7;
 constexpr int orderBy = 11;
 constexpr int unionPart = 2;
 constexpr int commonTable = 8;
+constexpr int tableOfValues = 11;
 constexpr int behindWith = 3;
 constexpr int values = 9;
 constexpr int assignment = 10;
@@ -51,10 +52,20 @@ constexpr std::size_t linksInARow = 16;
 // SQLite's functions take 127 operands at most.
 constexpr std::size_t mostOperands = 100;
 
+// Keys of a table, each by the places of its columns.
+using Keys = std::vector<const std::vector<std::size_t>*>;
+
+std::size_t placeIn(const BoundInsert& insert, std::size_t column) {
+  return static_cast<std::size_t>(std::ranges::find(insert.columns, column) - insert.columns.begin());
+}
+
+bool isGiven(const BoundInsert& insert, std::size_t column) { return placeIn(insert, column) < insert.columns.size(); }
+
 class Writer {
  public:
   void write(const BoundSelect& select);
   void write(const BoundInsert& insert);
+  void writeTwins(const BoundInsert& insert, const Keys& keys);
   void write(const BoundUpdate& update);
   void write(const BoundDelete& erase);
 
@@ -103,6 +114,7 @@ class Writer {
   void write(const BoundExpression& expression);
   void writeParameter(std::size_t parameter);
   void writeTable(const TableInfo& table);
+  void writeRows(const BoundInsert& insert, int depth);
   void writeCall(const BoundExpression& call);
   void writeArguments(const BoundExpression& call, std::size_t begin, std::size_t end);
   void writeCalculation(const BoundExpression& call);
@@ -410,11 +422,36 @@ void Writer::write(const BoundInsert& insert) {
   add("(");
   list(insert.columns, ",", [&](std::size_t column) { add(quoteName(insert.table->columns[column].name)); });
   add(") ");
-  if (insert.select) return inside(places::values, *insert.select);
+  writeRows(insert, places::values);
+}
+
+void Writer::writeRows(const BoundInsert& insert, int depth) {
+  if (insert.select) return inside(depth, *insert.select);
   add("values ");
   list(insert.rows, ",", [&](const std::vector<BoundPtr>& row) {
     add("(");
-    list(row, ",", [&](const BoundPtr& value) { inside(places::values, *value); });
+    list(row, ",", [&](const BoundPtr& value) { inside(depth, *value); });
+    add(")");
+  });
+}
+
+void Writer::writeTwins(const BoundInsert& insert, const Keys& keys) {
+  add("with n");
+  for (std::size_t i = 0; i < insert.columns.size(); ++i) {
+    add(i == 0 ? "(c" : ",c");
+    addNumber(i);
+  }
+  add(") as (");
+  writeRows(insert, places::tableOfValues);
+  add(") select t._rowid_ from n,");
+  writeTable(*insert.table);
+  add(" as t where ");
+  list(keys, " or ", [&](const auto* key) {
+    add("(");
+    list(*key, " and ", [&](std::size_t column) {
+      add("t." + quoteName(insert.table->columns[column].name) + "=n.c");
+      addNumber(placeIn(insert, column));
+    });
     add(")");
   });
 }
@@ -467,5 +504,15 @@ Emitted emit(const BoundSelect& select) { return emitted(select); }
 Emitted emit(const BoundInsert& insert) { return emitted(insert); }
 Emitted emit(const BoundUpdate& update) { return emitted(update); }
 Emitted emit(const BoundDelete& erase) { return emitted(erase); }
+
+std::optional<Emitted> emitTwins(const BoundInsert& insert) {
+  Keys keys;
+  for (const auto& key : insert.table->keys)
+    if (std::ranges::all_of(key, [&](std::size_t column) { return isGiven(insert, column); })) keys.push_back(&key);
+  if (keys.empty()) return std::nullopt;
+  Writer writer;
+  writer.writeTwins(insert, keys);
+  return writer.take();
+}
 
 }  // namespace QVSa::embedded

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -20,5 +21,8 @@ Emitted emit(const BoundSelect& select);
 Emitted emit(const BoundInsert& insert);
 Emitted emit(const BoundUpdate& update);
 Emitted emit(const BoundDelete& erase);
+// The keys of the rows in the table that have a key, primary or unique, of a row to insert; nothing where the table has
+// no key that the insert gives.
+std::optional<Emitted> emitTwins(const BoundInsert& insert);
 
 }  // namespace QVSa::embedded

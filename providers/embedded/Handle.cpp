@@ -1,61 +1,22 @@
 #include "providers/embedded/Handle.h"
 
-#include <cerrno>
-#include <sys/stat.h>
-#include <system_error>
+#include <algorithm>
 #include <thread>
 #include <unistd.h>
 
+#include "providers/embedded/OpeningFailure.h"
 #include "providers/embedded/StorageFailure.h"
-#include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
 
 namespace {
 
 using std::chrono::steady_clock;
-using tsql::sqlFailure;
 
 // How many steps of its machine the library makes between two looks at the clock: some tens of microseconds.
 constexpr int stepsBetweenLooks = 1000;
 // Opening waits for another process that recovers or checkpoints a file, not for writers.
 constexpr std::chrono::seconds openingLimit{15};
-
-Failure cannotOpen(const std::string& database, const std::string& reason) {
-  return sqlFailure(4060, "Cannot open database \"" + database + "\": " + reason + ".");
-}
-
-// What a code of the library means while a file is being opened.
-std::string openingReason(sqlite3* handle, int code) {
-  requireMemory(code);
-  const int system = sqlite3_system_errno(handle);
-  switch (code & 0xFF) {
-    case SQLITE_NOTADB:
-      return "the file is no database";
-    case SQLITE_CORRUPT:
-      return "the file is damaged";
-    case SQLITE_READONLY:
-      return "the file or its folder is read-only for this user";
-    case SQLITE_CANTOPEN:
-      return system == 0 ? "the file or its folder cannot be written" : std::generic_category().message(system);
-    case SQLITE_BUSY:
-      return "another process keeps the file locked";
-    default:
-      return sqlite3_errmsg(handle);
-  }
-}
-
-// The first column of a query's one row.
-std::int64_t readNumber(sqlite3* handle, const std::string& database, const std::string& query) {
-  sqlite3_stmt* statement = nullptr;
-  int code = sqlite3_prepare_v2(handle, query.c_str(), -1, &statement, nullptr);
-  if (code == SQLITE_OK) code = sqlite3_step(statement);
-  const std::int64_t result = code == SQLITE_ROW ? sqlite3_column_int64(statement, 0) : 0;
-  sqlite3_finalize(statement);
-  if (code == SQLITE_ROW) return result;
-  if (code == SQLITE_DONE || code == SQLITE_ERROR) throw cannotOpen(database, "the file is no database of this system");
-  throw cannotOpen(database, openingReason(handle, code));
-}
 
 void configure(sqlite3* handle) {
   sqlite3_db_config(handle, SQLITE_DBCONFIG_MAINDBNAME, databaseNames[0]);
@@ -74,18 +35,18 @@ Failure usedAfterFork() {
       "or fork before the first connection.");
 }
 
-Handle::Handle(const std::filesystem::path& folder)
+Handle::Handle(const std::filesystem::path& folder, Unreadable unreadable)
     : folder_(std::filesystem::absolute(folder)),
       process_(::getpid()),
-      master_(databaseFile(folder_, databaseNames[0])),
+      files_(folder_),
+      unreadable_(unreadable),
       random_(std::random_device{}()) {
   try {
     deadline_ = steady_clock::now() + openingLimit;
     open();
     deadline_.reset();
   } catch (...) {
-    gates_.clear();
-    schemas_.clear();
+    for (auto& gate : gates_) gate.reset();
     sqlite3_close_v2(handle_);
     throw;
   }
@@ -96,34 +57,34 @@ Handle::~Handle() {
   // A forked child has the library's record of its locks but not the locks: even closing could harm the files.
   if (::getpid() != process_) return;
   for (auto* const statement : {&begin_, &commit_, &login_, &version_}) statement->reset();
-  gates_.clear();
+  for (auto& gate : gates_) gate.reset();
   schemas_.clear();
   sqlite3_close_v2(handle_);
 }
 
 void Handle::open() {
-  struct stat file {};
-  if (::stat(master_.c_str(), &file) != 0 && (errno == ENOENT || errno == ENOTDIR))
-    throw sqlFailure(17, "SQL Server does not exist or access denied.");
-  if (const std::string problem = lengthProblem(folder_); !problem.empty()) throw cannotOpen(databaseNames[0], problem);
-  masterDevice_ = file.st_dev;
-  masterNumber_ = file.st_ino;
+  if (const auto failure = missingMaster(folder_)) throw *failure;
+  if (const std::string problem = lengthProblem(folder_); !problem.empty())
+    throw cannotOpen(folder_, 0, problem, "Move the installation.");
+  const std::string master = databaseFile(folder_, databaseNames[0]).string();
   const int flags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX | SQLITE_OPEN_PRIVATECACHE | SQLITE_OPEN_EXRESCODE;
-  const int code = sqlite3_open_v2(master_.c_str(), &handle_, flags, nullptr);
+  const int code = sqlite3_open_v2(master.c_str(), &handle_, flags, nullptr);
   if (handle_ == nullptr) throw std::bad_alloc();
-  if (code != SQLITE_OK) throw cannotOpen(databaseNames[0], openingReason(handle_, code));
+  if (code != SQLITE_OK) throw cannotOpen(folder_, 0, handle_, code);
   configure(handle_);
   sqlite3_busy_handler(handle_, onBusy, this);
   sqlite3_progress_handler(handle_, stepsBetweenLooks, onProgress, this);
   registerFunctions(handle_, context_);
-  for (std::size_t i = 0; i < databaseNames.size(); ++i) attach(i);
+  for (std::size_t i = 0; i < databaseNames.size(); ++i) {
+    try {
+      attach(i);
+    } catch (const Failure& failure) {
+      if (i == 0 || !replacesUnreadable()) throw;
+      replace(i, failure);
+    }
+  }
   execute("pragma temp_store=memory");
   mark_.emplace(lockFile(folder_, databaseNames[0]));
-}
-
-bool Handle::isCurrent() const {
-  struct stat file {};
-  return ::stat(master_.c_str(), &file) == 0 && file.st_dev == masterDevice_ && file.st_ino == masterNumber_;
 }
 
 void Handle::requireOwnProcess() const {
@@ -131,31 +92,88 @@ void Handle::requireOwnProcess() const {
 }
 
 void Handle::attach(std::size_t database) {
+  if (database != 0) attachFile(database);
+  check(database);
   const std::string name = databaseNames[database];
-  if (database != 0) {
-    const std::string file = databaseFile(folder_, name).string();
-    sqlite3_stmt* statement = nullptr;
-    int code = sqlite3_prepare_v2(handle_, ("attach ? as \"" + name + "\"").c_str(), -1, &statement, nullptr);
-    if (code != SQLITE_OK) throwStorageFailure(handle_, code);
-    code = sqlite3_bind_text(statement, 1, file.c_str(), -1, SQLITE_STATIC);
-    if (code == SQLITE_OK) code = sqlite3_step(statement);
-    sqlite3_finalize(statement);
-    if (code != SQLITE_DONE) throw cannotOpen(name, openingReason(handle_, code));
-  }
-  check(name);
   execute("pragma \"" + name + "\".synchronous=full; pragma \"" + name + "\".cache_size=-16000");
-  gates_.emplace_back(handle_, "delete from \"" + name + "\".gate where 0");
+  gates_.at(database).emplace(handle_, "delete from \"" + name + "\".gate where 0");
 }
 
-void Handle::check(const std::string& database) {
-  if (readNumber(handle_, database, "pragma \"" + database + "\".application_id") != applicationId)
-    throw cannotOpen(database, "the file is no database of this system");
-  if (sqlite3_db_readonly(handle_, database.c_str()) == 1)
-    throw cannotOpen(database, "the file or its folder is read-only for this user");
-  const std::int64_t layout = readNumber(handle_, database, "select layout from \"" + database + "\".engine");
-  if (layout > layoutVersion)
-    throw cannotOpen(database, "the file has layout " + std::to_string(layout) + ", this program knows layouts up to " +
-                                   std::to_string(layoutVersion) + "; a newer release has to open it");
+void Handle::attachFile(std::size_t database) {
+  const std::string file = databaseFile(folder_, databaseNames[database]).string();
+  Prepared statement(handle_, std::string("attach ? as \"") + databaseNames[database] + "\"");
+  statement.bind(1, file);
+  const int code = sqlite3_step(statement.get());
+  if (code != SQLITE_DONE) throw cannotOpen(folder_, database, handle_, code);
+}
+
+void Handle::replace(std::size_t database, const Failure& reason) {
+  const std::string name = databaseNames[database];
+  gates_.at(database).reset();
+  // A file that could be read but is not the right one is attached.
+  sqlite3_exec(handle_, ("detach \"" + name + "\"").c_str(), nullptr, nullptr, nullptr);
+  execute("attach ':memory:' as \"" + name + "\"");
+  execute("create table \"" + name + "\".engine(layout,catalogue); insert into \"" + name + "\".engine values(" +
+          std::to_string(layoutVersion) + ",0); create table \"" + name + "\".gate(n); create table \"" + name +
+          "\".definitions(name,text)");
+  gates_.at(database).emplace(handle_, "delete from \"" + name + "\".gate where 0");
+  replaced_.at(database) = reason;
+}
+
+bool Handle::hasReplaced() const {
+  return std::ranges::any_of(replaced_, [](const auto& reason) { return reason.has_value(); });
+}
+
+void Handle::replaceOutdated(const Failure& reason) {
+  for (std::size_t i = 1; i < databaseNames.size(); ++i)
+    if (layout(i) != layoutVersion) replace(i, reason);
+}
+
+void Handle::check(std::size_t database) {
+  const std::string name = databaseNames[database];
+  if (readNumber(database, "pragma \"" + name + "\".application_id") != applicationId)
+    throw cannotOpen(folder_, database, "the file is no database of this system");
+  if (sqlite3_db_readonly(handle_, name.c_str()) == 1) throw cannotOpen(folder_, database, handle_, SQLITE_READONLY);
+  const std::int64_t mark = readNumber(database, "pragma \"" + name + "\".user_version");
+  const auto other = static_cast<std::size_t>(mark - 1);
+  if (mark != 0 && other != database)
+    throw cannotOpen(folder_, database,
+                     other < databaseNames.size() ? std::string("the file is the one of ") + databaseNames[other]
+                                                  : "the file is the one of a database that is not known here");
+  isUpToDate_ = requireKnownLayout(database) == layoutVersion && isUpToDate_;
+}
+
+int Handle::requireKnownLayout(std::size_t database) {
+  const int version = layout(database);
+  if (version < 1) throw cannotOpen(folder_, database, "the file has a layout that no release has written");
+  if (version > layoutVersion)
+    throw cannotOpen(folder_, database,
+                     "the file has layout " + std::to_string(version) + ", and this program knows layouts up to " +
+                         std::to_string(layoutVersion),
+                     "A newer release has to open it.");
+  return version;
+}
+
+int Handle::layout(std::size_t database) {
+  return static_cast<int>(
+      readNumber(database, std::string("select layout from \"") + databaseNames[database] + "\".engine"));
+}
+
+// The first column of a query's one row, of a file that may be anything.
+std::int64_t Handle::readNumber(std::size_t database, const std::string& query) {
+  sqlite3_stmt* statement = nullptr;
+  int code = sqlite3_prepare_v2(handle_, query.c_str(), -1, &statement, nullptr);
+  if (code == SQLITE_OK) code = sqlite3_step(statement);
+  const std::int64_t result = code == SQLITE_ROW ? sqlite3_column_int64(statement, 0) : 0;
+  sqlite3_finalize(statement);
+  if (code != SQLITE_ROW) throw cannotOpen(folder_, database, handle_, code);
+  return result;
+}
+
+void Handle::stamp(std::size_t database) {
+  const std::string name = databaseNames[database];
+  execute("update " + name + ".engine set layout=" + std::to_string(layoutVersion) + "; pragma " + name +
+          ".user_version=" + std::to_string(database + 1));
 }
 
 RowLocks& Handle::locks(std::size_t database) {
@@ -175,7 +193,7 @@ void Handle::waitShortly() {
 }
 
 void Handle::takeWriter(std::size_t database) {
-  Prepared& gate = gates_.at(database);
+  Prepared& gate = *gates_.at(database);
   gate.step();
   gate.reset();
 }
@@ -209,14 +227,19 @@ void Handle::commit() {
 // be newer than the version says, never older.
 std::int64_t Handle::catalogueVersion() {
   constexpr int definitionBits = 32;
+  if (!isCurrent())
+    throw cannotOpen(folder_, 0, "other files have taken the place of those that were opened", "Connect again.");
   const std::int64_t schemas = schemaVersion();
   Prepared& statement = kept(version_,
-                             "select m.catalogue+s.catalogue+a.catalogue+u.catalogue "
+                             "select m.catalogue+s.catalogue+a.catalogue+u.catalogue,"
+                             "max(m.layout,s.layout,a.layout,u.layout) "
                              "from master.engine m, QVSys.engine s, QVApp.engine a, QVUpdate.engine u");
   statement.step();
-  const Value version = statement.column(0);
+  const auto version = std::get<std::int64_t>(statement.column(0));
+  const auto newestLayout = std::get<std::int64_t>(statement.column(1));
   statement.reset();
-  return (schemas << definitionBits) + std::get<std::int64_t>(version);
+  for (std::size_t i = 0; newestLayout > layoutVersion && i < databaseNames.size(); ++i) requireKnownLayout(i);
+  return (schemas << definitionBits) + version;
 }
 
 std::string Handle::loginDigest(const std::string& user) {

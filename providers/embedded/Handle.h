@@ -14,6 +14,7 @@
 #include "QVSa/frame/Failure.h"
 #include "providers/embedded/CatalogueMark.h"
 #include "providers/embedded/Functions.h"
+#include "providers/embedded/InstalledFiles.h"
 #include "providers/embedded/Layout.h"
 #include "providers/embedded/Prepared.h"
 #include "providers/embedded/RowLocks.h"
@@ -29,9 +30,15 @@ Failure usedAfterFork();
 // and stops a statement that runs over it.
 class Handle {
  public:
+  // What becomes of a database other than master that cannot be opened: the handle is not made, or has an empty one in
+  // memory in its place.
+  enum class Unreadable { refused, replaced };
+
   // Opens the files of an installation that exists. Throws 17 for a folder that is missing or no installation, 4060 for
-  // a file that is no database, is damaged, cannot be read or written, has too long a path or a newer layout.
-  explicit Handle(const std::filesystem::path& folder);
+  // Opens the files of an installation that exists. Throws 17 for a folder that is missing or no installation, 4060 for
+  // a file that is missing, is no database or another one, is damaged, cannot be read or written, has too long a path
+  // or a newer layout.
+  explicit Handle(const std::filesystem::path& folder, Unreadable unreadable = Unreadable::refused);
   ~Handle();
   Handle(const Handle&) = delete;
   Handle& operator=(const Handle&) = delete;
@@ -40,23 +47,40 @@ class Handle {
   sqlite3* get() const { return handle_; }
   FunctionContext& context() { return context_; }
   RowLocks& locks(std::size_t database);
+  // Takes over the locks that another handle of this installation holds.
+  void adoptLocks(Handle& other) { locks_ = std::move(other.locks_); }
   // Lets the row locks on all databases go.
   void releaseLocks();
 
   // The moment after which a wait ends with SQLITE_BUSY and a running statement with SQLITE_INTERRUPT; none: no limit.
   void deadline(std::optional<std::chrono::steady_clock::time_point> value) { deadline_ = value; }
   std::optional<std::chrono::steady_clock::time_point> deadline() const { return deadline_; }
+  bool isLate() const;
 
   // What the user of the handle keeps with it from session to session. It goes before the handle does.
   std::shared_ptr<void>& attachment() { return attachment_; }
 
+  // Whether databases that cannot be read are replaced, and why this one was.
+  bool replacesUnreadable() const { return unreadable_ == Unreadable::replaced; }
+  const std::optional<Failure>& whyReplaced(std::size_t database) const { return replaced_.at(database); }
+  bool hasReplaced() const;
+  // Replaces the databases of an older layout as well: they could not be upgraded, for this reason.
+  void replaceOutdated(const Failure& reason);
+
   // Throws 0x80004005 in a process that was forked from the one that opened the handle.
   void requireOwnProcess() const;
-  // Whether the folder still holds the installation that this handle has open: a look at its first file.
-  bool isCurrent() const;
+  // Whether the folder still holds the files that this handle has open.
+  bool isCurrent() { return files_.areCurrent(); }
 
   // Sleeps for a moment, random and short. Throws the time-out where the deadline has passed.
   void waitShortly();
+  // The layout of a database's file, as it is now.
+  int layout(std::size_t database);
+  // Whether all files had this build's layout when they were opened.
+  bool isUpToDate() const { return isUpToDate_; }
+  // Writes this build's layout and the mark of the database into its file.
+  void stamp(std::size_t database);
+
   // Takes the writer's place of one database, inside a transaction of the handle: a write that changes nothing.
   void takeWriter(std::size_t database);
   // Begins and ends a transaction of the storage library.
@@ -77,7 +101,8 @@ class Handle {
 
   const CatalogueMark& mark() const { return *mark_; }
   // As the files tell it. Changes with every definition in any database, by whichever session, and with every restore.
-  // What was read under one value is never the truth under it again.
+  // What was read under one value is never the truth under it again. Throws 4060 where other files have taken the place
+  // of those that the handle has open, or a newer release has changed their layout.
   std::int64_t catalogueVersion();
 
   // Ends what a session may have left: running statements, a transaction, row locks, its place in the databases, the
@@ -90,23 +115,27 @@ class Handle {
 
   void open();
   void attach(std::size_t database);
-  void check(const std::string& database);
+  void attachFile(std::size_t database);
+  void replace(std::size_t database, const Failure& reason);
+  void check(std::size_t database);
+  int requireKnownLayout(std::size_t database);
+  std::int64_t readNumber(std::size_t database, const std::string& query);
   std::int64_t schemaVersion();
   Prepared& kept(std::optional<Prepared>& statement, const char* text);
   void resetStatements();
-  bool isLate() const;
   void sleep();
 
   std::filesystem::path folder_;
   pid_t process_;
-  std::string master_;  // the path of the first file, and which file that is
-  dev_t masterDevice_ = 0;
-  ino_t masterNumber_ = 0;
+  InstalledFiles files_;
+  Unreadable unreadable_;
+  std::array<std::optional<Failure>, databaseNames.size()> replaced_;
+  bool isUpToDate_ = true;
   std::optional<CatalogueMark> mark_;
   sqlite3* handle_ = nullptr;
   FunctionContext context_;
   std::array<std::unique_ptr<RowLocks>, databaseNames.size()> locks_;
-  std::vector<Prepared> gates_;
+  std::array<std::optional<Prepared>, databaseNames.size()> gates_;
   // Statements that every session runs, compiled at their first use.
   std::optional<Prepared> begin_;
   std::optional<Prepared> commit_;

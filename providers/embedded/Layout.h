@@ -13,10 +13,11 @@ namespace QVSa::embedded {
 using platform::databaseNames;
 
 // The layout of the files that this build writes, and the mark that tells an installation's file from any other.
-// Each file holds engine(layout, catalogue), one row: its layout and a count of changed definitions; and gate(n),
-// empty, which is written to where the writer's place has to be taken and nothing else is to change. The library's
-// user_version says which database it is: its place above plus 1; 0 in a file that was made before this was written.
-inline constexpr int layoutVersion = 1;
+// Each file holds engine(layout, catalogue), one row: its layout and a count of changed definitions; definitions(name,
+// text), the T-SQL of its objects; and gate(n), empty, which is written to where the write lock has to be taken and
+// nothing else is to change. The library's user_version says which database it is: its place above plus 1; 0 in some
+// files of layout 1. Upgrade.cpp has what brings a file from one layout to the next.
+inline constexpr int layoutVersion = 2;
 inline constexpr int applicationId = 0x51565361;
 
 std::filesystem::path databaseFile(const std::filesystem::path& folder, const std::string& database);

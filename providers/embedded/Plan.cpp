@@ -54,6 +54,7 @@ Step compileInsert(const tsql::Insert& insert, Binder& binder) {
   step.table = bound.table;
   step.givesIdentity = bound.givesIdentity;
   step.main = std::make_unique<Compiled>(emit(bound));
+  if (auto twins = emitTwins(bound)) step.candidates = std::make_unique<Compiled>(std::move(*twins));
   return step;
 }
 
@@ -61,8 +62,8 @@ template <class BoundWrite>
 Step compileWrite(const BoundWrite& bound) {
   Step step;
   step.kind = Step::Kind::write;
+  step.table = bound.table;
   step.main = std::make_unique<Compiled>(emit(bound));
-  setClaim(step, bound.claim);
   return step;
 }
 

@@ -42,8 +42,9 @@ struct Step {
 
   Kind kind = Kind::control;
   std::unique_ptr<Compiled> main;
-  std::unique_ptr<Compiled> candidates;  // keys of the rows that the statement is about
-  std::vector<std::size_t> databases;    // that `main` reads and writes
+  // Keys of the rows that a select with lock hints may give, and of those that have a key of a row to insert.
+  std::unique_ptr<Compiled> candidates;
+  std::vector<std::size_t> databases;  // that `main` reads and writes
   std::vector<Parameter> parameters;
   std::vector<Column> columns;
   std::vector<ResultColumn> results;

@@ -4,6 +4,8 @@
 #include <mutex>
 #include <unistd.h>
 
+#include "providers/embedded/Upgrade.h"
+
 namespace QVSa::embedded {
 
 namespace {
@@ -71,7 +73,7 @@ Pool& pool() {
 
 void GiveBack::operator()(Handle* handle) const noexcept {
   std::unique_ptr<Handle> owned(handle);
-  if (!isFirstProcess()) return;
+  if (!isFirstProcess() || !owned->isUpToDate() || owned->replacesUnreadable()) return;
   try {
     owned->clear();
   } catch (...) {
@@ -85,7 +87,30 @@ PooledHandle acquireHandle(const std::filesystem::path& folder) {
   if (!isFirstProcess()) throw usedAfterFork();
   const std::filesystem::path place = placeOf(folder);
   if (auto idle = pool().take(place); idle && idle->isCurrent()) return PooledHandle(idle.release());
+  if (PooledHandle handle(new Handle(place)); handle->isUpToDate()) return handle;
+  upgradeInstallation(place);
   return PooledHandle(new Handle(place));
+}
+
+PooledHandle acquirePartialHandle(const std::filesystem::path& folder, const Failure& reason) {
+  if (!isFirstProcess()) throw usedAfterFork();
+  const std::filesystem::path place = placeOf(folder);
+  const auto open = [&] { return PooledHandle(new Handle(place, Handle::Unreadable::replaced)); };
+  PooledHandle handle = open();
+  if (handle->isUpToDate()) return handle;
+  // Where all files can be read, the upgrade is what has failed.
+  std::optional<Failure> failure = reason;
+  if (handle->hasReplaced()) {
+    try {
+      failure.reset();
+      upgradeInstallation(place);
+    } catch (const Failure& upgradeFailure) {
+      failure.emplace(upgradeFailure);
+    }
+    handle = open();
+  }
+  if (failure) handle->replaceOutdated(*failure);
+  return handle;
 }
 
 void discardIdleHandle(const std::filesystem::path& folder) { pool().take(placeOf(folder)); }

@@ -13,9 +13,14 @@ struct GiveBack {
 
 using PooledHandle = std::unique_ptr<Handle, GiveBack>;
 
-// The idle handle of this folder, if its files are still the same, or a new one. Throws as Handle does, and 0x80004005
-// in a process that was forked from one that had used the engine. Threads may call it at once.
+// The idle handle of this folder, if its files are still the same, or a new one; an installation of an older layout is
+// upgraded first. Throws as Handle and upgradeInstallation do, and 0x80004005 in a process that was forked from one
+// that had used the engine. Threads may call it at once.
 PooledHandle acquireHandle(const std::filesystem::path& folder);
+
+// A new handle that replaces what cannot be read or upgraded, after acquireHandle has failed for a reason. It does not
+// go into the pool.
+PooledHandle acquirePartialHandle(const std::filesystem::path& folder, const Failure& reason);
 
 // Closes the idle handle of the folder, before its files are moved or removed.
 void discardIdleHandle(const std::filesystem::path& folder);

@@ -22,17 +22,25 @@ bool givesMovables(const BoundCore& core) {
 
 bool reads(const BoundSource& source, const std::string& commonTable) { return source.commonTable == commonTable; }
 
-// A single block without selects inside its expressions, over at most one common table that is read once, directly.
-bool isPlain(const BoundSelect& select) {
-  if (select.parts.size() != 1) return false;
-  const BoundCore& core = select.parts.front().core;
-  if (!givesMovables(core) || !std::ranges::all_of(core.where, [](const BoundPtr& p) { return isMovable(*p); }))
-    return false;
-  if (!std::ranges::all_of(core.from, [](const BoundSource& s) { return !s.on || isMovable(*s.on); })) return false;
-  if (select.with.empty()) return true;
-  const auto readsIt = [&](const BoundSource& source) { return reads(source, select.with.front().name); };
-  return select.with.size() == 1 && std::ranges::count_if(core.from, readsIt) == 1 &&
-         std::ranges::none_of(core.from, [](const BoundSource& source) { return source.derived != nullptr; });
+// Whether no select stands in the block, neither in an expression nor as a source.
+bool isOpen(const BoundCore& core) {
+  return givesMovables(core) && std::ranges::all_of(core.where, [](const BoundPtr& p) { return isMovable(*p); }) &&
+         std::ranges::all_of(core.from, [](const BoundSource& s) { return !s.derived && (!s.on || isMovable(*s.on)); });
+}
+
+// Whether one source alone reads a common table, itself aside.
+bool isReadOnce(const BoundSelect& select, const BoundSelect::CommonTable& table) {
+  std::vector<const BoundCore*> readers;
+  for (const auto& part : select.parts) readers.push_back(&part.core);
+  for (const auto& other : select.with)
+    if (&other != &table)
+      for (const auto& part : other.select->parts) readers.push_back(&part.core);
+  std::ptrdiff_t sources = 0;
+  for (const BoundCore* core : readers) {
+    if (!isOpen(*core)) return false;
+    sources += std::ranges::count_if(core->from, [&](const BoundSource& source) { return reads(source, table.name); });
+  }
+  return sources == 1;
 }
 
 void addColumns(const BoundExpression& expression, std::vector<const BoundExpression*>& columns) {
@@ -94,11 +102,15 @@ bool handsOn(const BoundCore& core, const BoundSource& itself, std::size_t place
   return item.kind == Kind::column && item.source == itself.alias && placeOf(item) == place;
 }
 
-void askWhereItBegins(BoundSelect& recursion, const std::string& name, const BoundExpression& condition) {
+void ask(BoundSelect& select, const BoundExpression& condition);
+void askSubject(BoundSelect& select, BoundCore& core, const BoundExpression& condition);
+
+void askWhereItBegins(BoundSelect& select, BoundSelect::CommonTable& table, const BoundExpression& condition) {
   std::vector<BoundCore*> beginnings;
-  for (auto& part : recursion.parts) {
+  for (auto& part : table.select->parts) {
     if (!givesMovables(part.core)) return;
-    const auto itself = std::ranges::find_if(part.core.from, [&](const auto& source) { return reads(source, name); });
+    const auto itself =
+        std::ranges::find_if(part.core.from, [&](const auto& source) { return reads(source, table.name); });
     if (itself == part.core.from.end())
       beginnings.push_back(&part.core);
     else if (!std::ranges::all_of(columnsOf(condition), [&](const BoundExpression* column) {
@@ -106,19 +118,26 @@ void askWhereItBegins(BoundSelect& recursion, const std::string& name, const Bou
              }))
       return;
   }
-  for (BoundCore* core : beginnings) core->where.push_back(inside(*core, condition));
+  for (BoundCore* core : beginnings) {
+    core->where.push_back(inside(*core, condition));
+    askSubject(select, *core, *core->where.back());
+  }
+}
+
+// Asks a condition in a block of the select of the one source that it speaks of.
+void askSubject(BoundSelect& select, BoundCore& core, const BoundExpression& condition) {
+  BoundSource* const subject = subjectOf(condition, core);
+  if (!subject) return;
+  if (subject->derived) return ask(*subject->derived, condition);
+  for (auto& table : select.with)
+    if (reads(*subject, table.name) && isReadOnce(select, table)) return askWhereItBegins(select, table, condition);
 }
 
 // `condition` is one on the results of the select.
 void ask(BoundSelect& select, const BoundExpression& condition) {
-  if (!isPlain(select)) return;
+  if (select.parts.size() != 1 || !givesMovables(select.parts.front().core)) return;
   BoundCore& core = select.parts.front().core;
-  const BoundPtr moved = inside(core, condition);
-  BoundSource* const subject = subjectOf(*moved, core);
-  if (!subject) return;
-  if (subject->derived) return ask(*subject->derived, *moved);
-  if (!select.with.empty() && reads(*subject, select.with.front().name))
-    askWhereItBegins(*select.with.front().select, subject->commonTable, *moved);
+  askSubject(select, core, *inside(core, condition));
 }
 
 void askOfSources(const BoundExpression& condition, BoundCore& core) {

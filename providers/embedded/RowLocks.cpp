@@ -6,8 +6,8 @@
 #include <unistd.h>
 
 #include "providers/embedded/CaseFolding.h"
+#include "providers/embedded/OpeningFailure.h"
 #include "providers/embedded/Utf8.h"
-#include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
 
@@ -47,32 +47,42 @@ struct flock rangeLock(short type, std::int64_t start, std::int64_t length) {
 }  // namespace
 
 RowLocks::RowLocks(const std::filesystem::path& lockFile) : file_(::open(lockFile.c_str(), O_RDWR | O_CLOEXEC)) {
-  if (file_ < 0)
-    throw tsql::sqlFailure(4060, "Cannot open database \"" + lockFile.stem().string() +
-                                     "\": its lock file: " + std::generic_category().message(errno) + ".");
+  if (file_ < 0) throw cannotOpenLockFile(lockFile);
 }
 
 RowLocks::~RowLocks() { ::close(file_); }
 
 bool RowLocks::tryLock(const std::string& table, std::int64_t row) {
   const std::int64_t range = rangeOf(table);
-  Held& held = held_[range];
-  if (held.whole || held.rows.contains(row)) return true;
-  if (held.rows.size() >= mostRows && take(range, rangeLength)) {
-    held.whole = true;
-    return true;
-  }
-  // Noted first: a lock that nobody knows of would never be let go.
-  const auto noted = held.rows.insert(row).first;
-  if (take(byteOf(range, row), 1)) return true;
-  held.rows.erase(noted);
-  return false;
+  const std::int64_t byte = byteOf(range, row);
+  Rows& claimed = held_[range].claimed;
+  if (claimed.holds(byte)) return true;
+  if (claimed.bytes.size() >= mostRows && setLock(F_WRLCK, range, rangeLength)) return claimed.all = true;
+  return take(F_WRLCK, byte, claimed);
 }
 
-bool RowLocks::othersHold(const std::string& table) const { return isTaken(rangeOf(table), rangeLength); }
+bool RowLocks::tryMark(const std::string& table, std::int64_t row) {
+  const std::int64_t range = rangeOf(table);
+  const std::int64_t byte = byteOf(range, row);
+  Held& held = held_[range];
+  if (held.claimed.holds(byte) || held.marked.holds(byte)) return true;
+  if (held.marked.bytes.size() >= mostRows && tryMark(table)) return true;
+  return take(F_RDLCK, byte, held.marked);
+}
+
+bool RowLocks::tryMark(const std::string& table) {
+  const std::int64_t range = rangeOf(table);
+  Held& held = held_[range];
+  if (held.claimed.all || held.marked.all) return true;
+  // A mark over this session's own claims would let them go.
+  if (!held.claimed.bytes.empty()) return held.claimed.all = setLock(F_WRLCK, range, rangeLength);
+  return held.marked.all = setLock(F_RDLCK, range, rangeLength);
+}
 
 bool RowLocks::othersHold(const std::string& table, std::int64_t row) const {
-  return isTaken(byteOf(rangeOf(table), row), 1);
+  struct flock lock = rangeLock(F_WRLCK, byteOf(rangeOf(table), row), 1);
+  if (::fcntl(file_, F_OFD_GETLK, &lock) != 0) throwLockFailure();
+  return lock.l_type != F_UNLCK;
 }
 
 void RowLocks::release() {
@@ -108,12 +118,12 @@ bool RowLocks::setLock(short type, std::int64_t start, std::int64_t length) {
   throwLockFailure();
 }
 
-bool RowLocks::take(std::int64_t start, std::int64_t length) { return setLock(F_WRLCK, start, length); }
-
-bool RowLocks::isTaken(std::int64_t start, std::int64_t length) const {
-  struct flock lock = rangeLock(F_WRLCK, start, length);
-  if (::fcntl(file_, F_OFD_GETLK, &lock) != 0) throwLockFailure();
-  return lock.l_type != F_UNLCK;
+bool RowLocks::take(short type, std::int64_t byte, Rows& rows) {
+  // Noted first: a lock that nobody knows of would never be let go.
+  const auto noted = rows.bytes.insert(byte).first;
+  if (setLock(type, byte, 1)) return true;
+  rows.bytes.erase(noted);
+  return false;
 }
 
 }  // namespace QVSa::embedded

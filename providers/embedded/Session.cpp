@@ -8,6 +8,7 @@
 #include "providers/embedded/Literal.h"
 #include "providers/embedded/Rows.h"
 #include "providers/embedded/Savepoint.h"
+#include "providers/embedded/StorageFailure.h"
 #include "providers/tsql/Parser.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -72,23 +73,29 @@ class TimeLimit {
 
 constexpr std::chrono::seconds rowWriteLimit{30};
 
-constexpr Long duplicateKey = 2627;
-constexpr Long duplicateRow = 2601;
+// What an update that exchanges keys ends with in SQLite.
+constexpr Long sameKey = 2627;
+constexpr Long sameIndex = 2601;
 
-Failure deadlock() {
-  return tsql::sqlFailure(1205,
-                          "Transaction was deadlocked on lock resources with another process and has been chosen as "
-                          "the deadlock victim. Rerun the transaction.");
+bool isRollback(const Step& step) {
+  const auto* transaction = std::get_if<tsql::Transaction>(&step.control);
+  return step.kind == Step::Kind::control && transaction && transaction->kind == tsql::Transaction::Kind::rollback;
 }
 
 }  // namespace
 
 EmbeddedSession::EmbeddedSession(PooledHandle handle, std::size_t database, bool administrator)
-    : handle_(std::move(handle)), database_(database), administrator_(administrator) {
-  if (!handle_->attachment()) handle_->attachment() = std::make_shared<Cache>();
-  cache_ = std::static_pointer_cast<Cache>(handle_->attachment());
+    : database_(database), administrator_(administrator) {
+  useHandle(std::move(handle));
   enter(database_);
   refreshCatalogue();
+  cache_->catalogue->requireReadable(database_);
+}
+
+void EmbeddedSession::useHandle(PooledHandle handle) {
+  handle_ = std::move(handle);
+  if (!handle_->attachment()) handle_->attachment() = std::make_shared<Cache>();
+  cache_ = std::static_pointer_cast<Cache>(handle_->attachment());
 }
 
 EmbeddedSession::~EmbeddedSession() {
@@ -115,17 +122,27 @@ void EmbeddedSession::refreshCatalogue() {
   if (!readsAlready) cache_->mark = mark;
 }
 
-BatchResult EmbeddedSession::run(const Batch& batch) {
+template <class Work>
+auto EmbeddedSession::guarded(Work work) {
   handle_->requireOwnProcess();
-  const TimeLimit limit(*handle_, batch.timeout);
   try {
-    BatchResult result = runStatements(batch);
+    auto result = work();
     leaveOthers();
     return result;
+  } catch (const Failure& failure) {
+    afterFailure(failure.native());
+    throw;
   } catch (...) {
-    leaveOthers();
+    afterFailure(0);
     throw;
   }
+}
+
+BatchResult EmbeddedSession::run(const Batch& batch) {
+  return guarded([&] {
+    const TimeLimit limit(*handle_, batch.timeout);
+    return runStatements(batch);
+  });
 }
 
 BatchResult EmbeddedSession::runStatements(const Batch& batch) {
@@ -182,12 +199,13 @@ BatchResult EmbeddedSession::runUncached(std::vector<tsql::Statement> statements
 
 void EmbeddedSession::runStep(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens,
                               BatchResult& result) {
+  if (!isRollback(step)) refuseAfterLoss();
   tsql::Deadline(handle_->deadline()).look();
   handle_->context().statementTicks = ticksOf(platform::services().localTime());
   for (const std::size_t database : step.databases) enter(database);
   if (step.kind == Step::Kind::control) return control(step.control);
   if (step.kind != Step::Kind::query) {
-    result.affected = write(step, tokens);
+    result.affected = write(plan, step, tokens);
     return;
   }
   auto rows = query(plan, step, tokens);
@@ -204,6 +222,7 @@ std::unique_ptr<Rows> EmbeddedSession::query(const std::shared_ptr<Plan>& plan, 
     rows->buffer();
     handle_->locks(step.table->database).release();
   }
+  if (started_) settle();
   return rows;
 }
 
@@ -235,56 +254,32 @@ ValueList EmbeddedSession::candidates(Step& step, const std::vector<tsql::Token>
 
 // The rows that a select with lock hints may give: each is locked first, and the select then reads it again.
 std::shared_ptr<const ValueList> EmbeddedSession::claimRows(Step& step, const std::vector<tsql::Token>& tokens) {
-  RowLocks& locks = handle_->locks(step.table->database);
+  const TableInfo& table = *step.table;
+  RowLocks& locks = handle_->locks(table.database);
+  const auto taken = [&](std::int64_t row) {
+    if (!step.locks) return !locks.othersHold(table.name, row);
+    // Who has the write lock is the only one to change rows. One that waits for it may have marked them already.
+    return writing_.contains(table.database) ? locks.tryMark(table.name, row) : locks.tryLock(table.name, row);
+  };
   auto mine = std::make_shared<ValueList>();
   for (auto& key : candidates(step, tokens)) {
     const std::int64_t row = std::get<std::int64_t>(key);
-    const auto taken = [&] {
-      return step.locks ? locks.tryLock(step.table->name, row) : !locks.othersHold(step.table->name, row);
-    };
-    bool have = taken();
-    while (!have && !step.skips) {
+    bool have = taken(row);
+    for (; !have && !step.skips; have = taken(row)) {
+      if (started_) giveWriteLockBack();
       handle_->waitShortly();
-      have = taken();
     }
-    if (have) mine->push_back(std::move(key));
+    if (have)
+      mine->push_back(std::move(key));
+    else if (marked_)
+      passedOver_[tableKey(table)].push_back(std::move(key));
   }
+  if (undone_) prepareWrite(table.database);
   std::ranges::sort(*mine);
   return mine;
 }
 
-// A write waits for rows that another session holds before it takes the writer's place: the holder may need that place
-// to finish. Who has the place already cannot wait.
-void EmbeddedSession::awaitRows(Step& step, const std::vector<tsql::Token>& tokens) {
-  RowLocks& locks = handle_->locks(step.table->database);
-  while (locks.othersHold(step.table->name)) {
-    const auto keys = candidates(step, tokens);
-    const bool free = std::ranges::none_of(
-        keys, [&](const Value& key) { return locks.othersHold(step.table->name, std::get<std::int64_t>(key)); });
-    if (free) return;
-    if (!writing_.empty()) throw deadlock();
-    handle_->waitShortly();
-  }
-}
-
-void EmbeddedSession::prepareWrite(std::size_t database) {
-  for (auto* rows : rows_) rows->buffer();
-  if (marked_) takeWriter(database);
-}
-
-void EmbeddedSession::takeWriter(std::size_t database) {
-  if (!started_) handle_->begin();
-  started_ = true;
-  if (!writing_.insert(database).second) return;
-  try {
-    handle_->takeWriter(database);
-  } catch (...) {
-    writing_.erase(database);
-    throw;
-  }
-}
-
-Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) {
+Long EmbeddedSession::write(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens) {
   const bool takesIdentity = identityInsert_ == tableKey(*step.table);
   if (step.givesIdentity && !takesIdentity)
     throw tsql::sqlFailure(544, "Cannot insert explicit value for identity column in table '" + step.table->name +
@@ -293,18 +288,28 @@ Long EmbeddedSession::write(Step& step, const std::vector<tsql::Token>& tokens) 
     throw tsql::sqlFailure(545, "Explicit value must be specified for identity column in table '" + step.table->name +
                                     "' either when IDENTITY_INSERT is set to ON or when a replication user is "
                                     "inserting into a NOT FOR REPLICATION identity column.");
-  if (step.candidates) awaitRows(step, tokens);
-  prepareWrite(step.table->database);
-  if (!step.update) return runWrite(step, tokens);
+  const bool inserts = step.kind == Step::Kind::insert;
+  if (inserts) refusePassedOver(step, tokens);
+  if (!marked_)
+    return change({step.table->database, step.table->name, inserts, [&] { return runWrite(step, tokens); }});
+  const std::int64_t now = handle_->context().statementTicks;
+  return change({step.table->database, step.table->name, inserts, [this, plan, &step, tokens, now] {
+                   handle_->context().statementTicks = now;
+                   return runWrite(step, tokens);
+                 }});
+}
+
+Long EmbeddedSession::runWrite(Step& step, const std::vector<tsql::Token>& tokens) {
+  if (!step.update) return runOnce(step, tokens);
   try {
-    return runWrite(step, tokens);
+    return runOnce(step, tokens);
   } catch (const Failure& failure) {
-    if (failure.native() != duplicateKey && failure.native() != duplicateRow) throw;
+    if (failure.native() != sameKey && failure.native() != sameIndex) throw;
   }
   return moveKeys(step, tokens);
 }
 
-Long EmbeddedSession::runWrite(Step& step, const std::vector<tsql::Token>& tokens) {
+Long EmbeddedSession::runOnce(Step& step, const std::vector<tsql::Token>& tokens) {
   Prepared statement = step.main->take(*handle_);
   bind(statement, *step.main, step.parameters, tokens);
   skipResult(statement);
@@ -347,20 +352,35 @@ Long EmbeddedSession::moveKeys(Step& step, const std::vector<tsql::Token>& token
   return static_cast<Long>(rows.size());
 }
 
+// Who passes over a row and then inserts one of its key has collided, and need not wait for the write lock to hear of
+// it: whoever holds the row may have that lock for long.
+void EmbeddedSession::refusePassedOver(Step& step, const std::vector<tsql::Token>& tokens) {
+  const auto passed = passedOver_.find(tableKey(*step.table));
+  if (passed == passedOver_.end() || !step.candidates) return;
+  for (const Value& key : candidates(step, tokens))
+    if (std::ranges::find(passed->second, key) != passed->second.end()) throw duplicateKey(step.table->name);
+}
+
 void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
                                const std::vector<std::pair<std::size_t, Value>>& values) {
-  const TimeLimit limit(*handle_, rowWriteLimit);
-  enter(table.database);
-  prepareWrite(table.database);
   std::string text;
   for (const auto& [column, value] : values)
     text += (text.empty() ? "" : ",") + quoteName(table.columns[column].name) + "=?";
-  Prepared statement(handle_->get(), std::string("update ") + databaseNames[table.database] + "." +
-                                         quoteName(table.name) + " set " + text + " where _rowid_=?");
-  int place = 0;
-  for (const auto& [column, value] : values) statement.bind(++place, value);
-  statement.bind(++place, key);
-  skipResult(statement);
+  text = std::string("update ") + databaseNames[table.database] + "." + quoteName(table.name) + " set " + text +
+         " where _rowid_=?";
+  guarded([&] {
+    const TimeLimit limit(*handle_, rowWriteLimit);
+    refuseAfterLoss();
+    enter(table.database);
+    return change({table.database, table.name, false, [this, text, key, values] {
+                     Prepared statement(handle_->get(), text);
+                     int place = 0;
+                     for (const auto& [column, value] : values) statement.bind(++place, value);
+                     statement.bind(++place, key);
+                     skipResult(statement);
+                     return static_cast<Long>(sqlite3_changes(handle_->get()));
+                   }});
+  });
 }
 
 void EmbeddedSession::control(const tsql::Statement& statement) {
@@ -414,8 +434,10 @@ void EmbeddedSession::defineObject(const tsql::Statement& statement) {
   try {
     if (!change_) change_.emplace(handle_->mark());
     const std::size_t database = definedDatabase(statement, database_);
+    cache_->catalogue->requireReadable(database);
     enter(database);
     prepareWrite(database);
+    settle();
     define(*handle_, *cache_->catalogue, database_, statement);
     refreshCatalogue();
     if (own) commit();
@@ -451,44 +473,6 @@ void EmbeddedSession::leaveOthers() {
     handle_->locks(database).leave();
     return true;
   });
-}
-
-void EmbeddedSession::begin() {
-  if (marked_) throw tsql::sqlFailure(3988, "New transaction is not allowed because another one is open.");
-  marked_ = true;
-}
-
-void EmbeddedSession::commit() {
-  if (!marked_) throw tsql::sqlFailure(3902, "The COMMIT TRANSACTION request has no corresponding BEGIN TRANSACTION.");
-  if (inner_ > 0) return static_cast<void>(--inner_);
-  // A failed statement for want of room ends the storage library's transaction by itself.
-  if (started_ && !handle_->inTransaction()) {
-    endTransaction();
-    throw tsql::sqlFailure(3930,
-                           "The current transaction cannot be committed and cannot support operations that write to "
-                           "the log file. Roll back the transaction.");
-  }
-  if (started_) handle_->commit();
-  started_ = false;
-  endTransaction();
-}
-
-void EmbeddedSession::rollback() {
-  if (!marked_)
-    throw tsql::sqlFailure(3903, "The ROLLBACK TRANSACTION request has no corresponding BEGIN TRANSACTION.");
-  for (auto* rows : rows_) rows->buffer();
-  if (handle_->inTransaction()) handle_->execute("rollback");
-  endTransaction();
-  refreshCatalogue();
-}
-
-void EmbeddedSession::endTransaction() {
-  marked_ = started_ = false;
-  inner_ = 0;
-  change_.reset();
-  writing_.clear();
-  handle_->releaseLocks();
-  leaveOthers();
 }
 
 }  // namespace QVSa::embedded

@@ -1,8 +1,10 @@
 #include <algorithm>
 
 #include "providers/embedded/Backup.h"
+#include "providers/embedded/OpeningFailure.h"
 #include "providers/embedded/Restore.h"
 #include "providers/embedded/Session.h"
+#include "providers/embedded/Upgrade.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
@@ -111,12 +113,48 @@ void EmbeddedSession::restoreDatabase(const tsql::RestoreDatabase& restore) {
                                "' because it is in use by this session. It is recommended that the master database be "
                                "used when performing this operation.");
   checkMoves(restore, handle_->folder(), database);
+  const AloneMeanwhile alone(handle_->locks(database), restore.database);
   {
-    const AloneMeanwhile alone(handle_->locks(database), restore.database);
     const CatalogueChange change(handle_->mark());
     restoreCopy(*handle_, database, restore.file.text);
   }
+  if (!handle_->isCurrent()) reopen();
   refreshCatalogue();
+  const std::size_t before = database_;
+  use(databaseNames[database]);
+  try {
+    upgrade();
+  } catch (...) {
+    database_ = before;
+    throw;
+  }
+  database_ = before;
+}
+
+// A database that could not be read has got a new file.
+void EmbeddedSession::reopen() {
+  bufferRows();
+  PooledHandle fresh(new Handle(handle_->folder(), Handle::Unreadable::replaced));
+  fresh->adoptLocks(*handle_);
+  retired_ = std::move(handle_);
+  useHandle(std::move(fresh));
+}
+
+void EmbeddedSession::upgrade() {
+  const int from = handle_->layout(database_);
+  if (from == layoutVersion) return;
+  begin();
+  try {
+    prepareWrite(database_);
+    for (const auto& batch : upgradeBatches(databaseNames[database_], from))
+      run({batch, false, std::chrono::seconds(0)});
+    handle_->stamp(database_);
+    commit();
+  } catch (const Failure& failure) {
+    rollback();
+    throw cannotOpen(handle_->folder(), database_,
+                     "the file is of an older release, and its upgrade failed: " + failure.description());
+  }
 }
 
 void EmbeddedSession::verifyBackup(const tsql::VerifyBackup& verify) {

@@ -19,13 +19,6 @@ namespace {
 
 using tsql::sqlFailure;
 
-Failure deadlock() {
-  return sqlFailure(
-      1205,
-      "Transaction was deadlocked on lock resources with another process and has been chosen as the deadlock "
-      "victim. Rerun the transaction.");
-}
-
 Failure notRunnable() { return Failure(number::statement, "SQL Server", "The statement can't be run here."); }
 
 // Of an object that another session has dropped since this one looked.
@@ -179,6 +172,18 @@ Failure unsupported(const std::string& what) {
 
 Failure valueTooLarge() {
   return sqlFailure(7119, "Attempting to grow LOB beyond maximum allowed size of 1000000000 bytes.");
+}
+
+Failure deadlock() {
+  return sqlFailure(
+      1205,
+      "Transaction was deadlocked on lock resources with another process and has been chosen as the deadlock "
+      "victim. Rerun the transaction.");
+}
+
+Failure duplicateKey(const std::string& table) {
+  return sqlFailure(2627,
+                    "Violation of PRIMARY KEY constraint. Cannot insert duplicate key in object '" + table + "'.");
 }
 
 void requireMemory(int code) {

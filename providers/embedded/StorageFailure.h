@@ -1,5 +1,7 @@
 #pragma once
 
+#include <string>
+
 #include "providers/tsql/SqlFailure.h"
 
 struct sqlite3;
@@ -23,5 +25,11 @@ Failure unsupported(const std::string& what);
 
 // A value is larger than SQLite can hold.
 Failure valueTooLarge();
+
+// 1205: the transaction stands in the way of another one, and is undone.
+Failure deadlock();
+
+// 2627 for a row of a table that has the key of one that is there.
+Failure duplicateKey(const std::string& table);
 
 }  // namespace QVSa::embedded

@@ -57,6 +57,24 @@ TEST(Pool, AHandleWhoseFilesWereReplacedIsNotUsedAgain) {
             number::noTable);
 }
 
+TEST(Pool, AFileThatAnotherOneHasReplacedIsNoticedWhicheverItIs) {
+  InstallationFolder folder;
+  const auto replace = [&](const char* name) {
+    const auto file = databaseFile(folder.data(), name);
+    std::filesystem::copy_file(file, folder.root() / "copy");
+    std::filesystem::rename(folder.root() / "copy", file);
+  };
+  for (const char* name : databaseNames) {
+    acquireHandle(folder.data())->attachment() = std::make_shared<int>();
+    EXPECT_TRUE(acquireHandle(folder.data())->attachment());
+    replace(name);
+    const PooledHandle open = acquireHandle(folder.data());
+    EXPECT_FALSE(open->attachment()) << name;
+    replace(name);
+    EXPECT_EQ(failureOf([&] { open->catalogueVersion(); }).native(), 4060) << name;
+  }
+}
+
 TEST(Pool, ThreadsHaveAHandleEach) {
   InstallationFolder folder;
   acquireHandle(folder.data())->execute("create table QVSys.t(x integer)");
