@@ -135,7 +135,7 @@ Object Catalogue::find(const tsql::ObjectName& name, std::size_t currentDatabase
     if (const auto* table = std::get_if<TableInfo>(entry)) return table;
     if (const auto* view = std::get_if<ViewInfo>(entry)) return view;
   }
-  requireReadable(database);
+  if (database) requireReadable(*database);
   throw tsql::sqlFailure(208, "Invalid object name '" + dotted(name) + "'.");
 }
 

@@ -8,7 +8,8 @@
 #include <system_error>
 #include <unistd.h>
 
-#include "platform/Files.h"
+#include "platform/FileDescriptor.h"
+#include "platform/NewFile.h"
 #include "providers/embedded/StorageFailure.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -23,17 +24,16 @@ constexpr mode_t fileMode = S_IRUSR | S_IWUSR | S_IRGRP | S_IWGRP;
 fs::path with(const fs::path& file, const std::string& ending) { return file.string() + ending; }
 
 bool syncFile(const fs::path& path) {
-  const int file = ::open(path.c_str(), O_RDONLY | O_CLOEXEC);
-  const bool synced = file >= 0 && ::fsync(file) == 0;
-  const int reason = errno;
-  if (file >= 0) ::close(file);
-  errno = reason;
-  return synced;
+  const platform::FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
+  return file.isOpen() && ::fsync(file.get()) == 0;
 }
 
 }  // namespace
 
-ReplacedFile::ReplacedFile(const fs::path& target) : target_(target), beside_(with(target, ".new")) {
+ReplacedFile::ReplacedFile(const fs::path& target)
+    : target_(target),
+      beside_(with(target, ".new")),
+      passing_{beside_, with(beside_, "-wal"), with(beside_, "-shm"), with(beside_, "-journal")} {
   ::unlink(beside_.c_str());
   const int file = ::open(beside_.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, fileMode);
   if (file < 0) fail();
@@ -49,7 +49,7 @@ ReplacedFile::ReplacedFile(const fs::path& target) : target_(target), beside_(wi
 
 ReplacedFile::~ReplacedFile() {
   close();
-  for (const char* ending : {"", "-wal", "-shm", "-journal"}) ::unlink(with(beside_, ending).c_str());
+  for (const fs::path& file : passing_) ::unlink(file.c_str());
 }
 
 void ReplacedFile::takePlace() {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <filesystem>
 #include <sqlite3.h>
 
@@ -27,6 +28,8 @@ class ReplacedFile {
 
   std::filesystem::path target_;
   std::filesystem::path beside_;
+  // With what SQLite keeps beside it: made before, since what must go has to go without memory.
+  std::array<std::filesystem::path, 4> passing_;
   sqlite3* handle_ = nullptr;
 };
 
