@@ -74,8 +74,10 @@ format:  ## Format all sources
 	@clang-format -i $(sources)
 	@echo 'The sources are formatted.'
 
-lint:  ## Check format and run clang-tidy over all sources
+lint:  ## Check layers and format, and run clang-tidy over all sources
 	@tools/install-packages.sh lint
+	$(say) 'Checking the layers'
+	@tools/check_layers.py
 	$(say) 'Checking the format'
 	@clang-format --dry-run --Werror $(sources)
 	$(say) 'Running clang-tidy'

@@ -1,9 +1,9 @@
 #include "bench/StoragePlan.h"
 
-#include "providers/embedded/Binder.h"
-#include "providers/embedded/Catalogue.h"
-#include "providers/embedded/Emitter.h"
-#include "providers/embedded/Handle.h"
+#include "providers/embedded/bind/Binder.h"
+#include "providers/embedded/bind/Emitter.h"
+#include "providers/embedded/storage/Catalogue.h"
+#include "providers/embedded/storage/Handle.h"
 #include "providers/tsql/Lexer.h"
 #include "providers/tsql/OuterJoins.h"
 #include "providers/tsql/Parser.h"

@@ -5,8 +5,8 @@
 #include <new>
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/Failure.h"
 #include "QVSa/hosting/SafeTexts.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::console {
 

@@ -5,7 +5,7 @@
 #include <string_view>
 #include <sys/stat.h>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 #include "platform/FileDescriptor.h"
 
 namespace QVSa::platform {

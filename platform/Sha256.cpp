@@ -17,9 +17,7 @@ Sha256::Sha256() : context_(EVP_MD_CTX_new()) {
   require(context_ && method && EVP_DigestInit_ex2(context_.get(), method.get(), nullptr) == 1);
 }
 
-void Sha256::add(const void* bytes, std::size_t count) {
-  require(EVP_DigestUpdate(context_.get(), bytes, count) == 1);
-}
+void Sha256::add(const void* bytes, std::size_t count) { require(EVP_DigestUpdate(context_.get(), bytes, count) == 1); }
 
 Sha256::Digest Sha256::digest() {
   Digest result{};

@@ -1,8 +1,8 @@
 #include "QVSa/frame/Connection.h"
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/Provider.h"
-#include "QVSa/frame/Providers.h"
+#include "QVSa/frame/internal/Providers.h"
+#include "providers/Provider.h"
 
 namespace QVSa {
 

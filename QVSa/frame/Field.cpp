@@ -1,7 +1,7 @@
 #include <algorithm>
 
-#include "QVSa/frame/Provider.h"
 #include "QVSa/frame/Recordset.h"
+#include "providers/Provider.h"
 
 namespace QVSa {
 

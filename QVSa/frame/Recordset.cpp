@@ -3,8 +3,8 @@
 #include <algorithm>
 
 #include "QVSa/frame/Connection.h"
-#include "QVSa/frame/Provider.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
+#include "providers/Provider.h"
 
 namespace QVSa {
 

@@ -4,9 +4,9 @@
 #include <memory>
 #include <vector>
 
-#include "QVSa/frame/Date.h"
-#include "QVSa/frame/Values.h"
-#include "QVSa/frame/Variant.h"
+#include "QVSa/values/Date.h"
+#include "QVSa/values/Values.h"
+#include "QVSa/values/Variant.h"
 
 namespace QVSa {
 

@@ -4,8 +4,8 @@
 #include <random>
 #include <thread>
 
-#include "QVSa/frame/Failure.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Failure.h"
+#include "QVSa/values/Text.h"
 
 namespace QVSa {
 

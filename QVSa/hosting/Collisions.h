@@ -3,7 +3,7 @@
 #include <chrono>
 #include <type_traits>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa {
 

@@ -4,7 +4,7 @@
 #include "QVSa/frame/DeploymentSecrets.h"
 #include "QVSa/identity/User.h"
 #include "database/Scripts.h"
-#include "providers/embedded/Installation.h"
+#include "providers/Installation.h"
 
 namespace QVSa {
 

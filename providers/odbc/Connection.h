@@ -3,7 +3,7 @@
 #include <chrono>
 #include <memory>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/odbc/Statement.h"
 
 namespace QVSa::odbc {

@@ -3,7 +3,7 @@
 #include <chrono>
 #include <vector>
 
-#include "QVSa/frame/Provider.h"
+#include "providers/Provider.h"
 #include "providers/odbc/Column.h"
 #include "providers/odbc/Parameter.h"
 

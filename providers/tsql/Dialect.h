@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <span>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 // The dialect in one table: every function and operator that a statement can use, with its counts, its types and the
 // form in which it is handed on. The parser takes names and counts from it, a binder the types, and the reference of

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::tsql {
 

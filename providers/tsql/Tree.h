@@ -5,7 +5,7 @@
 #include <variant>
 #include <vector>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 #include "providers/tsql/Lexer.h"
 
 // The syntax tree of the dialect. The parser makes it, the printer writes it back as T-SQL, a binder annotates it.

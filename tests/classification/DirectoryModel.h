@@ -3,7 +3,7 @@
 #include <map>
 #include <optional>
 
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
 
 namespace QVSa::test {
 

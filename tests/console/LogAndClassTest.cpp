@@ -1,6 +1,6 @@
 #include <filesystem>
 
-#include "console/ClassTree.h"
+#include "console/commands/ClassTree.h"
 #include "tests/console/Program.h"
 
 namespace QVSa::console {

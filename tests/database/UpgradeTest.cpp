@@ -1,6 +1,6 @@
 #include <thread>
 
-#include "providers/embedded/Pool.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/database/Shipped.h"
 #include "tests/support/Failures.h"
 

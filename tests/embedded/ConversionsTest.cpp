@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Failure.h"
-#include "providers/embedded/Conversions.h"
+#include "QVSa/values/Failure.h"
+#include "providers/embedded/functions/Conversions.h"
 #include "tests/embedded/ScratchHandle.h"
 
 namespace QVSa::embedded {

@@ -3,7 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "QVSa/frame/ConnectionString.h"
-#include "providers/embedded/Provider.h"
+#include "providers/embedded/session/Provider.h"
 #include "providers/tsql/Dialect.h"
 #include "tests/support/Failures.h"
 #include "tests/support/TestInstallation.h"

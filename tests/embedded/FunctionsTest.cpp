@@ -4,7 +4,7 @@
 #include <chrono>
 #include <gtest/gtest.h>
 
-#include "providers/embedded/Functions.h"
+#include "providers/embedded/functions/Functions.h"
 #include "tests/embedded/ScratchHandle.h"
 
 namespace QVSa::embedded {

@@ -5,7 +5,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "providers/embedded/Handle.h"
+#include "providers/embedded/storage/Handle.h"
 #include "tests/embedded/ChildProcess.h"
 #include "tests/embedded/InstallationFolder.h"
 

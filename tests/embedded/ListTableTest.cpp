@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "providers/embedded/ListTable.h"
+#include "providers/embedded/functions/ListTable.h"
 #include "tests/embedded/ScratchHandle.h"
 
 namespace QVSa::embedded {

@@ -2,8 +2,8 @@
 #include <thread>
 #include <vector>
 
-#include "providers/embedded/Login.h"
-#include "providers/embedded/Pool.h"
+#include "providers/embedded/administration/Login.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/embedded/ChildProcess.h"
 #include "tests/embedded/InstallationFolder.h"
 

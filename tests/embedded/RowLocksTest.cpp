@@ -2,8 +2,8 @@
 #include <fstream>
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Failure.h"
-#include "providers/embedded/RowLocks.h"
+#include "QVSa/values/Failure.h"
+#include "providers/embedded/storage/RowLocks.h"
 #include "tests/embedded/ChildProcess.h"
 #include "tests/embedded/InstallationFolder.h"
 

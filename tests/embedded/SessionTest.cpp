@@ -2,8 +2,8 @@
 #include <thread>
 
 #include "QVSa/frame/ConnectionString.h"
-#include "providers/embedded/Pool.h"
-#include "providers/embedded/Provider.h"
+#include "providers/embedded/session/Provider.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/support/Failures.h"
 #include "tests/support/TestInstallation.h"
 

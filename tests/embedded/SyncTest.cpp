@@ -6,8 +6,8 @@
 #include <sys/syscall.h>
 #include <unistd.h>
 
-#include "providers/embedded/Backup.h"
-#include "providers/embedded/Restore.h"
+#include "providers/embedded/administration/Backup.h"
+#include "providers/embedded/administration/Restore.h"
 #include "tests/embedded/InstallationFolder.h"
 
 // This program's own calls to the system come by here first. A rename is on the disk only when the folder is synced,

@@ -2,7 +2,7 @@
 #include <array>
 #include <gtest/gtest.h>
 
-#include "providers/embedded/Pool.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/faults/Operations.h"
 #include "tests/support/FakeClock.h"
 #include "tests/support/PlainSession.h"

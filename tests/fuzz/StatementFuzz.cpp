@@ -5,10 +5,10 @@
 #include <iostream>
 
 #include "database/Scripts.h"
-#include "providers/embedded/Definitions.h"
-#include "providers/embedded/Plan.h"
-#include "providers/embedded/Provider.h"
-#include "providers/embedded/Script.h"
+#include "providers/embedded/administration/Script.h"
+#include "providers/embedded/session/Plan.h"
+#include "providers/embedded/session/Provider.h"
+#include "providers/embedded/storage/Definitions.h"
 #include "providers/tsql/OuterJoins.h"
 #include "tests/embedded/InstallationFolder.h"
 #include "tests/tsql/TreeText.h"

@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Failure.h"
 #include "QVSa/hosting/Collisions.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::test {
 namespace {

@@ -2,14 +2,14 @@
 #include <fstream>
 
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/frame/Providers.h"
-#include "QVSa/frame/Text.h"
-#include "QVSa/maintenance/BackupLock.h"
-#include "QVSa/maintenance/RotatedKey.h"
+#include "QVSa/frame/internal/Providers.h"
+#include "QVSa/maintenance/internal/BackupLock.h"
+#include "QVSa/maintenance/internal/RotatedKey.h"
+#include "QVSa/values/Text.h"
 #include "platform/Files.h"
 #include "platform/SecretMessage.h"
-#include "providers/embedded/Pool.h"
-#include "providers/embedded/Provider.h"
+#include "providers/embedded/session/Provider.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
 

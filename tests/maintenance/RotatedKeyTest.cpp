@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/maintenance/RotatedKey.h"
+#include "QVSa/maintenance/internal/RotatedKey.h"
 
 namespace QVSa {
 namespace {

@@ -2,9 +2,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "providers/embedded/Handle.h"
-#include "providers/embedded/Layout.h"
-#include "providers/embedded/Pool.h"
+#include "providers/embedded/storage/Handle.h"
+#include "providers/embedded/storage/Layout.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/processes/Worker.h"
 #include "tests/support/Scene.h"
 
