@@ -18,7 +18,7 @@ std::vector<std::string> storagePlan(const std::filesystem::path& folder, const 
   tsql::rewriteOuterJoins(statements.front());
   embedded::Binder binder(catalogue, embedded::databaseByName(database).value());
   const auto bound = binder.bindQuery(*std::get<tsql::SelectPtr>(statements.front()), false);
-  embedded::Prepared plan(handle.get(), "explain query plan " + emit(*bound.select));
+  embedded::Prepared plan(handle.get(), "explain query plan " + emit(*bound.select).text);
   std::vector<std::string> steps;
   while (plan.step()) steps.push_back(std::get<std::string>(plan.column(3)));
   return steps;
