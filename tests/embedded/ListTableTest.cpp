@@ -60,10 +60,5 @@ TEST_F(ListTable, TheIndexOfTheOtherTableIsUsed) {
   EXPECT_NE(planOf("select id from t where id in (select value from list(?))").find("PRIMARY KEY"), std::string::npos);
 }
 
-TEST_F(ListTable, AnUnboundListIsEmpty) {
-  Prepared query(scratch_.get(), "select id from t where id in (select value from list(?))");
-  EXPECT_FALSE(query.step());
-}
-
 }  // namespace
 }  // namespace QVSa::embedded

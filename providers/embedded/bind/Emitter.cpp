@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <set>
+#include <unordered_map>
 
 #include "providers/tsql/SqlFailure.h"
 
@@ -70,9 +71,7 @@ class Writer {
   void write(const BoundDelete& erase);
 
   Emitted take() {
-    auto& parameters = emitted_.parameters;
-    std::sort(parameters.begin(), parameters.end());
-    parameters.erase(std::unique(parameters.begin(), parameters.end()), parameters.end());
+    numberParameters();
     emitted_.databases.assign(databases_.begin(), databases_.end());
     return std::move(emitted_);
   }
@@ -94,6 +93,12 @@ class Writer {
     int count_;
   };
 
+  // A place of a parameter.
+  struct Use {
+    std::size_t end;  // of its "?" in the text
+    std::size_t number;
+  };
+
   void add(std::string_view text) { emitted_.text += text; }
   void addNumber(std::size_t number) { add(std::to_string(number)); }
   template <class Node>
@@ -113,6 +118,7 @@ class Writer {
 
   void write(const BoundExpression& expression);
   void writeParameter(std::size_t parameter);
+  void numberParameters();
   void writeTable(const TableInfo& table);
   void writeRows(const BoundInsert& insert, int depth);
   void writeCall(const BoundExpression& call);
@@ -131,14 +137,32 @@ class Writer {
   void writeOrder(const std::vector<BoundOrder>& orderBy);
 
   Emitted emitted_;
+  std::unordered_map<std::size_t, std::size_t> numbers_;  // of the parameters
+  std::vector<Use> uses_;                                 // of all of them
   std::set<std::size_t> databases_;
   int pending_ = 0;
 };
 
 void Writer::writeParameter(std::size_t parameter) {
-  emitted_.parameters.push_back(parameter);
+  const auto [number, isNew] = numbers_.try_emplace(parameter, numbers_.size() + 1);
+  if (isNew) emitted_.parameters.push_back(parameter);
   add("?");
-  addNumber(parameter + 1);
+  uses_.push_back({emitted_.text.size(), number->second});
+}
+
+// SQLite looks for every number that is written through a list of all that are: only a parameter that stands in several
+// places needs its own.
+void Writer::numberParameters() {
+  std::vector<std::size_t> times(emitted_.parameters.size() + 1);
+  for (const Use& use : uses_) ++times[use.number];
+  std::string numbered;
+  std::size_t done = 0;
+  for (const Use& use : uses_) {
+    if (times[use.number] == 1) continue;
+    numbered.append(emitted_.text, done, use.end - done).append(std::to_string(use.number));
+    done = use.end;
+  }
+  emitted_.text = numbered.append(emitted_.text, done);
 }
 
 void Writer::writeTable(const TableInfo& table) {

@@ -10,7 +10,7 @@ namespace QVSa::embedded {
 
 struct Emitted {
   std::string text;
-  std::vector<std::size_t> parameters;  // that the text takes, by their place in the statement's list, each once
+  std::vector<std::size_t> parameters;  // by their place in the statement's list, in the order of the text's numbers
   std::vector<std::size_t> databases;   // that the text names
 };
 

@@ -20,8 +20,8 @@ class Compiled {
   // A statement for one run. Two runs at once have two of them.
   Prepared take(Handle& handle);
   void giveBack(Prepared statement) noexcept;
-  // The parameters that the text takes, by their place in the step's list.
   const std::string& text() const { return emitted_.text; }
+  // The parameters that the text takes, by their place in the step's list, in the order of its numbers.
   const std::vector<std::size_t>& parameters() const { return emitted_.parameters; }
   // The databases that the text names.
   const std::vector<std::size_t>& databases() const { return emitted_.databases; }

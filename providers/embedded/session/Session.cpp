@@ -228,9 +228,10 @@ std::unique_ptr<Rows> EmbeddedSession::query(const std::shared_ptr<Plan>& plan, 
 
 void EmbeddedSession::bind(Prepared& statement, const Compiled& compiled, const std::vector<Parameter>& parameters,
                            const std::vector<tsql::Token>& tokens, const std::shared_ptr<const ValueList>& locked) {
+  int number = 0;
   for (const std::size_t place : compiled.parameters()) {
     const Parameter& parameter = parameters[place];
-    const int number = static_cast<int>(place + 1);
+    ++number;
     if (parameter.source == Parameter::Source::lockedRows) {
       statement.bind(number, locked);
       continue;
