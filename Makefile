@@ -8,7 +8,7 @@ JOBS ?= $(shell nproc)
 export CTEST_PARALLEL_LEVEL ?= $(JOBS)
 say = @printf '\n== %s\n'
 
-.PHONY: help packages build demo test test-long mutate sanitize bench fuzz format lint clean
+.PHONY: help packages build demo test test-long mutate sanitize bench fuzz docs format lint clean
 
 help:  ## List the targets
 	@grep -hE '^[a-z-]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
@@ -57,14 +57,19 @@ bench: packages  ## Run the benchmarks, each operation beside its floor (build/b
 	@for program in $$(find build/bench/bench -maxdepth 1 -type f -executable | sort); do \
 	  printf '\n== %s\n' "$$program"; "$$program"; done
 
-fuzz:  ## Fuzz the T-SQL front end for a minute (build/fuzz)
+fuzz:  ## Fuzz statements of T-SQL up to SQLite for a minute (build/fuzz)
 	@tools/install-packages.sh fuzz
 	$(say) 'Building the fuzz target (build/fuzz)'
 	@cmake --preset fuzz --log-level=NOTICE
-	@cmake --build --preset fuzz -j $(JOBS)
-	@for program in $$(find build/fuzz -name '*_fuzz' -type f -executable); do \
-	  mkdir -p build/fuzz/corpus; "$$program" -max_total_time=60 $$(ls -1 tests/tsql/*.dict 2>/dev/null | \
-	  sed 's/^/-dict=/') build/fuzz/corpus; done
+	@cmake --build --preset fuzz -j $(JOBS) --target statement_fuzz
+	@test -d build/fuzz/corpus || { mkdir build/fuzz/corpus; split -l 1 -a 3 tests/tsql/statements.txt build/fuzz/corpus/; }
+	@build/fuzz/tests/fuzz/statement_fuzz -max_total_time=60 -dict=tests/fuzz/tsql.dict build/fuzz/corpus
+
+docs:  ## Print the table of functions and operators into docs/dialect.md
+	@cmake --preset release --log-level=NOTICE
+	@cmake --build --preset release -j $(JOBS) --target dialect_table
+	@sed -i -e '/^<!-- table -->$$/,/^<!-- end of the table -->$$/{//!d}' docs/dialect.md
+	@build/release/tools/dialect_table | sed -i '/^<!-- table -->$$/r /dev/stdin' docs/dialect.md
 
 sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h')
 
@@ -73,8 +78,10 @@ format:  ## Format all sources
 	@clang-format -i $(sources)
 	@echo 'The sources are formatted.'
 
-lint:  ## Check format and run clang-tidy over all sources
+lint:  ## Check layers and format, and run clang-tidy over all sources
 	@tools/install-packages.sh lint
+	$(say) 'Checking the layers'
+	@tools/check_layers.py
 	$(say) 'Checking the format'
 	@clang-format --dry-run --Werror $(sources)
 	$(say) 'Running clang-tidy'

@@ -1,8 +1,18 @@
 #pragma once
 
-// Every public class of the library.
+// Every public class of the library, and what hosts need beside them.
 #include "QVSa/classification/AclRule.h"
 #include "QVSa/classification/Directory.h"
+#include "QVSa/hosting/Backups.h"
+#include "QVSa/hosting/Collisions.h"
+#include "QVSa/hosting/HomeKeeping.h"
+#include "QVSa/hosting/Installation.h"
+#include "QVSa/hosting/LogPages.h"
+#include "QVSa/hosting/PlanRuns.h"
+#include "QVSa/hosting/RuleKeeping.h"
+#include "QVSa/hosting/SafeTexts.h"
+#include "QVSa/hosting/SignOn.h"
+#include "QVSa/hosting/UserKeeping.h"
 #include "QVSa/identity/Session.h"
 #include "QVSa/identity/Sessions.h"
 #include "QVSa/identity/User.h"

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Date.h"
+#include "QVSa/values/Date.h"
 #include "bench/Storage.h"
 #include "tests/support/TestInstallation.h"
 

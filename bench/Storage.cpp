@@ -3,8 +3,8 @@
 #include <ctime>
 #include <stdexcept>
 
-#include "providers/embedded/Collation.h"
-#include "providers/embedded/Layout.h"
+#include "providers/embedded/functions/Collation.h"
+#include "providers/embedded/storage/Layout.h"
 
 namespace QVSa::bench {
 

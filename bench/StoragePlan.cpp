@@ -1,9 +1,9 @@
 #include "bench/StoragePlan.h"
 
-#include "providers/embedded/Binder.h"
-#include "providers/embedded/Catalogue.h"
-#include "providers/embedded/Emitter.h"
-#include "providers/embedded/Handle.h"
+#include "providers/embedded/bind/Binder.h"
+#include "providers/embedded/bind/Emitter.h"
+#include "providers/embedded/storage/Catalogue.h"
+#include "providers/embedded/storage/Handle.h"
 #include "providers/tsql/Lexer.h"
 #include "providers/tsql/OuterJoins.h"
 #include "providers/tsql/Parser.h"
@@ -18,7 +18,7 @@ std::vector<std::string> storagePlan(const std::filesystem::path& folder, const 
   tsql::rewriteOuterJoins(statements.front());
   embedded::Binder binder(catalogue, embedded::databaseByName(database).value());
   const auto bound = binder.bindQuery(*std::get<tsql::SelectPtr>(statements.front()), false);
-  embedded::Prepared plan(handle.get(), "explain query plan " + emit(*bound.select));
+  embedded::Prepared plan(handle.get(), "explain query plan " + emit(*bound.select).text);
   std::vector<std::string> steps;
   while (plan.step()) steps.push_back(std::get<std::string>(plan.column(3)));
   return steps;

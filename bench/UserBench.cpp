@@ -12,13 +12,15 @@ namespace {
 
 // A floor with the files that it stands on.
 struct OpenFloor {
-  Storage storage{office().folder()};
+  explicit OpenFloor(const Office& where = office()) : storage(where.folder()) {}
+
+  Storage storage;
   UserFloor users{storage};
 };
 
-std::shared_ptr<User> ann() {
+std::shared_ptr<User> ann(const Office& where = office()) {
   auto user = std::make_shared<User>();
-  user->connect(office().server(), "QVApp");
+  user->connect(where.server(), "QVApp");
   return user;
 }
 
@@ -40,12 +42,12 @@ Call signOnFloor() {
           [floor, id] { floor->users.endSession(*id); }};
 }
 
-Call load() {
-  return {[user = ann()] { require(user->GetOne(3, Office::login), *user); }};
+Call load(const Office& where) {
+  return {[user = ann(where)] { require(user->GetOne(3, Office::login), *user); }};
 }
 
-Call loadFloor() {
-  return {[floor = std::make_shared<OpenFloor>()] { floor->users.load(Office::login); }};
+Call loadFloor(const Office& where) {
+  return {[floor = std::make_shared<OpenFloor>(where)] { floor->users.load(Office::login); }};
 }
 
 Call save() {
@@ -64,7 +66,10 @@ Call saveFloor() {
 
 void addUserPairs() {
   addPair("User.loginAuth, 1,000 sessions open", signOn, signOnFloor);
-  addPair("User.GetOne", load, loadFloor);
+  addPair(
+      "User.GetOne", [] { return load(office()); }, [] { return loadFloor(office()); });
+  addPair(
+      "User.GetOne, 100,000 departments", [] { return load(largeOffice()); }, [] { return loadFloor(largeOffice()); });
   addPair("User.Save", save, saveFloor);
 }
 

@@ -3,7 +3,7 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::console {
 

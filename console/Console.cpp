@@ -5,7 +5,8 @@
 #include <new>
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/Failure.h"
+#include "QVSa/hosting/SafeTexts.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::console {
 
@@ -51,6 +52,7 @@ int Console::main(int argc, char** argv) {
   try {
     app_.parse(argc, argv);
     if (place_.server.empty()) place_.server = filePrefix + ownFolder();
+    if (!isPlainName(place_.database)) throw Misuse("The name of a database is letters, digits and _.");
     const Answer answer = run_();
     print(answer);
     return answer.exitCode;

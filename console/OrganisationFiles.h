@@ -3,7 +3,7 @@
 #include <filesystem>
 #include <vector>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::console {
 

@@ -2,7 +2,7 @@
 
 #include <chrono>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::console {
 

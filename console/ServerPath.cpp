@@ -9,8 +9,4 @@ String serverPath(const Console& console, const String& path) {
   return std::filesystem::absolute(path).lexically_normal().string();
 }
 
-String below(const Console& console, const String& folder, const String& name) {
-  return folder + (folderOf(console.place().server) ? "/" : "\\") + name;
-}
-
 }  // namespace QVSa::console

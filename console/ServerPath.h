@@ -6,7 +6,5 @@ namespace QVSa::console {
 
 // A path as the database server sees it: of an embedded installation one of this machine, made absolute; else as it is.
 String serverPath(const Console& console, const String& path);
-// The path of a file in a folder of the server.
-String below(const Console& console, const String& folder, const String& name);
 
 }  // namespace QVSa::console

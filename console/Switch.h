@@ -3,7 +3,7 @@
 #include <CLI/CLI.hpp>
 #include <optional>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::console {
 

@@ -5,7 +5,7 @@
 #include <mutex>
 #include <thread>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::console {
 

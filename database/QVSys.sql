@@ -20,6 +20,7 @@ create table departments (
 create index departments_deptNo on departments (deptNo)
 create index departments_path on departments (path)
 create index departments_superDept on departments (superDept)
+create index departments_isOrg on departments (isOrg)
 go
 
 -- roleSpec of "Report Owners" holds the lock of a backup.
@@ -494,11 +495,25 @@ select deptId, deptName, deptfullName, orgId, orgno from QV_v_DeptOrg_1WithLevel
 go
 
 -- For each job the departments on the path of its department, from that one upwards: x is 0 for the job's own department
--- and 1 above it. Starting from the tree keeps rings out, on which the way up would never end.
+-- and 1 above it, l the level in the tree. The way up is gone twice, since only its end tells how high the department lies.
+-- A way into a ring has no end, and is left out: mark is a department on the way, a new one each time that the way has
+-- doubled, and whoever comes back to it goes in a ring.
 create view QV_v_JobDeptPathWithLevel as
-with chain (jobid, deptid, x, pathDeptId, superDeptId, l) as (
-  select j.jobId, j.deptId, 0, d.deptId, d.superDept, d.l
-  from jobs j inner join QV_v_Dept d on d.deptId = j.deptId
+with way (jobid, deptid, superDeptId, l, mark, doubled) as (
+  select j.jobId, j.deptId, d.superDept, 1, d.deptId, 1
+  from jobs j inner join departments d on d.deptId = j.deptId
+  union all
+  select w.jobid, w.deptid, s.superDept, w.l + 1,
+    case when w.l = w.doubled then s.deptId else w.mark end, case when w.l = w.doubled then w.l * 2 else w.doubled end
+  from way w inner join departments s on s.deptId = w.superDeptId
+  where s.deptId <> w.mark
+),
+chain (jobid, deptid, x, pathDeptId, superDeptId, l) as (
+  select w.jobid, w.deptid, 0, d.deptId, d.superDept, w.l
+  from way w
+  left outer join departments s on s.deptId = w.superDeptId
+  inner join departments d on d.deptId = w.deptid
+  where s.deptId is null
   union all
   select c.jobid, c.deptid, 1, s.deptId, s.superDept, c.l - 1
   from chain c inner join departments s on s.deptId = c.superDeptId

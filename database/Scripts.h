@@ -11,4 +11,8 @@ extern const std::string_view qvSys;
 extern const std::string_view qvApp;
 extern const std::string_view qvUpdate;
 
+// What brings a database that was filled by an earlier release from one layout to the next: the number is the one that
+// it has afterwards.
+extern const std::string_view qvSys2;
+
 }  // namespace QVSa::database

@@ -3,7 +3,7 @@
 #include <cstdio>
 #include <exception>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 // A row of steps on one installation, each shown with what the library returned; whether all went as they should is the
 // program's exit code.

@@ -7,7 +7,7 @@
 #include <new>
 #include <strings.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "platform/LocaleName.h"
 
 namespace QVSa::platform {

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <span>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 #include "platform/FileDescriptor.h"
 
 namespace QVSa::platform {

@@ -3,8 +3,8 @@
 #include <filesystem>
 #include <optional>
 
-#include "QVSa/frame/Date.h"
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Date.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::platform {
 

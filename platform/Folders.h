@@ -2,7 +2,7 @@
 
 #include <vector>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::platform {
 

@@ -2,7 +2,7 @@
 
 #include <cstdlib>
 
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
 
 namespace QVSa::platform {
 

@@ -194,15 +194,13 @@ class PipeSignalBlocked {
   bool wasPending_;
 };
 
-// Whether the name of a file is on the disk with it; true as well where the folder is none that can be synced, which is
-// no failure: the file is in its place already. False leaves the reason in errno.
+}  // namespace
+
 bool syncFolderOf(const fs::path& file) {
   const FileDescriptor folder(::open(folderOf(file).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
   if (folder.isOpen() && ::fsync(folder.get()) == 0) return true;
   return errno == EINVAL || errno == ENOTSUP || errno == EACCES;
 }
-
-}  // namespace
 
 NewFile::NameBeside::NameBeside(fs::path file) : name(std::move(file)), journal(name.string() + journalEnding) {}
 

@@ -5,7 +5,7 @@
 #include <string_view>
 #include <sys/stat.h>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 #include "platform/FileDescriptor.h"
 
 namespace QVSa::platform {
@@ -61,6 +61,10 @@ class NewFile {
   FileDescriptor file_;
   FileDescriptor straight_;  // the target, where it can't be replaced
 };
+
+// Whether the name of a file is on the disk with it; true as well where the folder is none that can be synced, which is
+// no failure: the file is in its place already. False leaves the reason in errno.
+bool syncFolderOf(const std::filesystem::path& file);
 
 // Removes what a killed writer that was the only one left beside its target, and its journal. Leaves alone what is
 // being written, and is silent on what it can't remove.

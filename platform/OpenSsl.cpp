@@ -10,7 +10,7 @@
 #include <openssl/kdf.h>
 #include <openssl/provider.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::platform {
 

@@ -2,7 +2,7 @@
 
 #include <unistd.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::platform {
 

@@ -5,7 +5,7 @@
 #include <optional>
 #include <vector>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::platform {
 

@@ -2,7 +2,7 @@
 
 #include <openssl/crypto.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "platform/CodePage.h"
 #include "platform/OpenSsl.h"
 #include "platform/SecretMessageCipher.h"

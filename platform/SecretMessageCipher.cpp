@@ -5,7 +5,7 @@
 #include <new>
 #include <openssl/evp.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "platform/OpenSsl.h"
 #include "platform/RandomBytes.h"
 

@@ -2,8 +2,8 @@
 
 #include <functional>
 
-#include "QVSa/frame/Date.h"
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Date.h"
+#include "QVSa/values/Values.h"
 #include "platform/DirectoryLookup.h"
 #include "platform/SettingsStore.h"
 

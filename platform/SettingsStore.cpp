@@ -2,7 +2,7 @@
 
 #include <cstdlib>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "platform/Files.h"
 
 namespace QVSa::platform {

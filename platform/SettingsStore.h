@@ -3,7 +3,7 @@
 #include <memory>
 #include <optional>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::platform {
 

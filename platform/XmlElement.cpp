@@ -4,7 +4,7 @@
 #include <new>
 #include <pugixml.hpp>
 
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
 
 namespace QVSa::platform {
 

@@ -2,7 +2,7 @@
 
 #include <utility>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::platform {
 

@@ -1,7 +1,8 @@
 #include "QVSa/frame/Connection.h"
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/Providers.h"
+#include "QVSa/frame/internal/Providers.h"
+#include "providers/Provider.h"
 
 namespace QVSa {
 
@@ -11,7 +12,9 @@ constexpr Long clientCursor = 3;
 
 }  // namespace
 
+Connection::Connection() = default;
 Connection::~Connection() { disconnect(); }
+Connection::Connection(Connection&& other) noexcept = default;
 
 Connection& Connection::operator=(Connection&& other) noexcept {
   if (this == &other) return *this;

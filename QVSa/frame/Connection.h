@@ -1,9 +1,11 @@
 #pragma once
 
-#include "QVSa/frame/Provider.h"
 #include "QVSa/frame/Recordset.h"
 
 namespace QVSa {
+
+struct BatchResult;
+class ProviderSession;
 
 // A connection to a database, by ADO's names. Closes itself, and closing discards an open transaction.
 //   Connection connection;
@@ -13,9 +15,9 @@ namespace QVSa {
 // refused, 0x800A0E78 not open, 0x800A0E79 open already, else the statement's own number.
 class Connection {
  public:
-  Connection() = default;
+  Connection();
   ~Connection();
-  Connection(Connection&& other) noexcept = default;
+  Connection(Connection&& other) noexcept;
   Connection& operator=(Connection&& other) noexcept;
 
   void Open(const String& ConnectionString);

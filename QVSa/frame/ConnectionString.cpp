@@ -7,7 +7,8 @@
 #include <utility>
 
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
+#include "providers/Provider.h"
 
 namespace QVSa {
 

@@ -1,8 +1,10 @@
 #pragma once
 
-#include "QVSa/frame/Provider.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa {
+
+struct ConnectionOptions;
 
 // The connection string for `server` ("host", "host,port" or "file:folder", each optionally with "|" and a scrambled
 // password behind it) and `DBName` (empty: QVSys): the login QVUser with the password of `server` or the built-in one,

@@ -1,6 +1,7 @@
 #include <algorithm>
 
 #include "QVSa/frame/Recordset.h"
+#include "providers/Provider.h"
 
 namespace QVSa {
 

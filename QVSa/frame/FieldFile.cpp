@@ -1,5 +1,6 @@
 #include "QVSa/frame/FieldFile.h"
 
+#include "QVSa/values/Failure.h"
 #include "platform/Files.h"
 #include "platform/Services.h"
 

@@ -5,9 +5,9 @@
 #include <utility>
 
 #include "QVSa/frame/Connection.h"
-#include "QVSa/frame/Failure.h"
 #include "QVSa/frame/SQLFactory.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Failure.h"
+#include "QVSa/values/Text.h"
 
 namespace QVSa {
 

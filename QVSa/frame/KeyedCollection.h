@@ -6,9 +6,9 @@
 #include <unordered_map>
 #include <vector>
 
-#include "QVSa/frame/Failure.h"
-#include "QVSa/frame/Text.h"
-#include "QVSa/frame/Variant.h"
+#include "QVSa/values/Failure.h"
+#include "QVSa/values/Text.h"
+#include "QVSa/values/Variant.h"
 
 namespace QVSa {
 

@@ -3,7 +3,8 @@
 #include <algorithm>
 
 #include "QVSa/frame/Connection.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
+#include "providers/Provider.h"
 
 namespace QVSa {
 
@@ -26,6 +27,11 @@ bool canUpdate(Long cursorType, Long lockType) {
 }
 
 }  // namespace
+
+Recordset::Recordset() = default;
+Recordset::~Recordset() = default;
+Recordset::Recordset(Recordset&& other) noexcept = default;
+Recordset& Recordset::operator=(Recordset&& other) noexcept = default;
 
 void Recordset::Open(const String& Source, Connection& ActiveConnection, Long CursorType, Long LockType) {
   if (isOpen()) throw Failure(number::open, "Recordset", "Operation is not allowed when the object is open.");
@@ -192,6 +198,8 @@ std::size_t Recordset::ordinalOf(const String& name) {
   turn_ = asked_.size();
   return asked_.back().second;
 }
+
+bool Recordset::isOpen() const { return !columns_.empty() && (!source_ || *source_); }
 
 Recordset::Row Recordset::sourceRow() const {
   Row row;

@@ -4,12 +4,16 @@
 #include <memory>
 #include <vector>
 
-#include "QVSa/frame/Provider.h"
+#include "QVSa/values/Date.h"
+#include "QVSa/values/Values.h"
+#include "QVSa/values/Variant.h"
 
 namespace QVSa {
 
 class Connection;
 class Recordset;
+class Rows;
+struct Column;
 
 // A row set that lives on a connection, which empties it when it closes.
 using AttachedRows = std::shared_ptr<std::unique_ptr<Rows>>;
@@ -53,9 +57,10 @@ class Field {
 // Throws 0x800A0E78 on a closed one, 0x800A0CC1 for a field that it does not have.
 class Recordset {
  public:
-  Recordset() = default;
-  Recordset(Recordset&&) = default;
-  Recordset& operator=(Recordset&&) = default;
+  Recordset();
+  ~Recordset();
+  Recordset(Recordset&& other) noexcept;
+  Recordset& operator=(Recordset&& other) noexcept;
 
   // Cursor 0 forward-only, 1 keyset, 2 dynamic, 3 static; -1 takes the property. Lock 1 read-only, 2 pessimistic,
   // 3 optimistic; -1 takes the property. A keyset or dynamic cursor with lock 2 or 3 can be written back.
@@ -110,7 +115,7 @@ class Recordset {
   };
 
   void start(AttachedRows source, bool keep);
-  bool isOpen() const { return !columns_.empty() && (!source_ || *source_); }
+  bool isOpen() const;
   bool isCurrent() const { return position_ < fetched_; }
   void requireOpen() const;
   void requireRow() const;

@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <cmath>
 
-#include "QVSa/frame/Failure.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Failure.h"
+#include "QVSa/values/Text.h"
 
 namespace QVSa {
 

@@ -2,7 +2,7 @@
 
 #include <vector>
 
-#include "QVSa/frame/Variant.h"
+#include "QVSa/values/Variant.h"
 
 namespace QVSa {
 

@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
-#include "QVSa/frame/Text.h"
-#include "QVSa/frame/Variant.h"
+#include "QVSa/values/Text.h"
+#include "QVSa/values/Variant.h"
 
 namespace QVSa {
 

@@ -1,7 +1,5 @@
 #include "QVSa/identity/User.h"
 
-#include "QVSa/organisation/Department.h"
-
 namespace QVSa {
 namespace {
 
@@ -39,14 +37,6 @@ void User::Pwd(const String& value) {
 
 Boolean User::setJobs(const String& jobList) {
   jobList_ = jobList;
-  return true;
-}
-
-Boolean User::setDept(const Department& dept) {
-  deptInnerId_ = dept.InnerId();
-  deptId_ = dept.Id();
-  deptName_ = dept.Name();
-  deptFullName_ = dept.fullName();
   return true;
 }
 

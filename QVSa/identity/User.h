@@ -136,7 +136,8 @@ class User : private Frame {
   // change is allowed. errNumber is not cleared by a success: look at the result, then at `sI`.
   // Attempts at one account that run at the same moment each count for themselves and may all be answered before the
   // lock is written: a limit of 3 let 8 guesses at once through. A host that faces people makes them one after the
-  // other. Throws Failure 6 on level 1 where the stored password has a character of two bytes in the system's code page.
+  // other. Throws Failure 6 on level 1 where the stored password has a character of two bytes in the system's code
+  // page.
   Boolean loginAuth(const String& loginName, const String& Pwd, String* sI = nullptr, Boolean authLd = false,
                     const String& ipAddr = "", const String& hostName = "", const Integer* userVerifyLevel = nullptr);
   // Whether `pwdMd5` is the md5Hex of the user's password: no counter, no lock, no session. Throws as loginAuth does.

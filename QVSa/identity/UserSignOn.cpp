@@ -1,9 +1,9 @@
 #include <algorithm>
 #include <limits>
 
-#include "QVSa/identity/IpRules.h"
 #include "QVSa/identity/Sessions.h"
 #include "QVSa/identity/User.h"
+#include "QVSa/identity/internal/IpRules.h"
 #include "QVSa/identity/safeRule.h"
 #include "platform/SecretMessage.h"
 #include "platform/Services.h"

@@ -57,6 +57,7 @@ class BKPlan : private Frame {
 
  private:
   friend class BKPlans;
+  friend class PlanRuns;
 
   // Everything but delFiles, which its readers take differently.
   void read(Recordset& row);

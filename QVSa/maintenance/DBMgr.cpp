@@ -1,7 +1,7 @@
 #include "QVSa/maintenance/DBMgr.h"
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/maintenance/BackupLock.h"
+#include "QVSa/maintenance/internal/BackupLock.h"
 
 namespace QVSa {
 

@@ -1,7 +1,7 @@
 #pragma once
 
-#include "QVSa/frame/Date.h"
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Date.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa {
 

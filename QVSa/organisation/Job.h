@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa {
 

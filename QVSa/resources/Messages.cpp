@@ -1,7 +1,7 @@
 #include "QVSa/resources/Messages.h"
 
-#include "QVSa/frame/Failure.h"
-#include "QVSa/resources/MessageTable.h"
+#include "QVSa/resources/internal/MessageTable.h"
+#include "QVSa/values/Failure.h"
 #include "platform/LocaleName.h"
 
 namespace QVSa {

@@ -1,4 +1,4 @@
-#include "QVSa/resources/MessageTable.h"
+#include "QVSa/resources/internal/MessageTable.h"
 
 namespace QVSa {
 

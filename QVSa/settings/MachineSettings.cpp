@@ -1,7 +1,7 @@
 #include "QVSa/settings/MachineSettings.h"
 
-#include "QVSa/frame/Failure.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Failure.h"
+#include "QVSa/values/Text.h"
 #include "platform/Services.h"
 
 namespace QVSa {

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Variant.h"
+#include "QVSa/values/Variant.h"
 #include "providers/odbc/Wide.h"
 
 namespace QVSa::odbc {

@@ -3,6 +3,7 @@
 #include "providers/odbc/Environment.h"
 #include "providers/odbc/Failure.h"
 #include "providers/odbc/Rows.h"
+#include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::odbc {
 
@@ -28,22 +29,29 @@ Connection::~Connection() {
 }
 
 std::shared_ptr<Statement> Connection::statement(std::chrono::seconds timeout) {
+  refuseAfterLoss();
   makeRoom();
-  return std::make_shared<Statement>(handle_, timeout);
+  return std::make_shared<Statement>(*this, handle_, timeout);
 }
 
 void Connection::begin() {
+  refuseAfterLoss();
   makeRoom();
   autocommit(false);
   inTransaction_ = true;
 }
 
 void Connection::end(SQLSMALLINT completion) {
+  if (completion == SQL_COMMIT) refuseAfterLoss();
   makeRoom();
   check(SQLEndTran(SQL_HANDLE_DBC, handle_, completion));
   // Only behind a transaction that is over: with one open, this would commit it.
   autocommit(true);
-  inTransaction_ = false;
+  inTransaction_ = lost_ = false;
+}
+
+void Connection::refuseAfterLoss() const {
+  if (lost_) throw tsql::transactionLost();
 }
 
 void Connection::arrived(const Rows& rows) {

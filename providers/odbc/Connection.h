@@ -3,7 +3,7 @@
 #include <chrono>
 #include <memory>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/odbc/Statement.h"
 
 namespace QVSa::odbc {
@@ -23,6 +23,9 @@ class Connection {
   std::shared_ptr<Statement> statement(std::chrono::seconds timeout);
   void begin();
   void end(SQLSMALLINT completion);
+  // The server has rolled the open transaction back by itself. The next statement would begin another one and commit
+  // alone: until that is ended by a rollback, everything is refused with 3930.
+  void transactionLost() { lost_ = inTransaction_; }
 
   // These rows arrive from now on.
   void arriving(Rows& rows) { arriving_ = &rows; }
@@ -31,6 +34,7 @@ class Connection {
   void abandon() noexcept;
 
  private:
+  void refuseAfterLoss() const;
   void makeRoom();
   void autocommit(bool on);
   void check(SQLRETURN rc) const;
@@ -38,6 +42,7 @@ class Connection {
   SQLHDBC handle_ = SQL_NULL_HDBC;
   Rows* arriving_ = nullptr;
   bool inTransaction_ = false;
+  bool lost_ = false;
 };
 
 }  // namespace QVSa::odbc

@@ -2,7 +2,7 @@
 
 #include <vector>
 
-#include "QVSa/frame/Provider.h"
+#include "providers/Provider.h"
 
 namespace QVSa::odbc {
 

@@ -1,6 +1,6 @@
 #include "providers/odbc/Environment.h"
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::odbc {
 

@@ -2,7 +2,7 @@
 
 #include <vector>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/odbc/Wide.h"
 
 namespace QVSa::odbc {

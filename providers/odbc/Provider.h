@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Provider.h"
+#include "providers/Provider.h"
 
 namespace QVSa::odbc {
 

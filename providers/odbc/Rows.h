@@ -4,7 +4,7 @@
 #include <memory>
 #include <optional>
 
-#include "QVSa/frame/Provider.h"
+#include "providers/Provider.h"
 #include "providers/odbc/Connection.h"
 #include "providers/odbc/RowWriter.h"
 #include "providers/odbc/Statement.h"

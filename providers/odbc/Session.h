@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Provider.h"
+#include "providers/Provider.h"
 #include "providers/odbc/Connection.h"
 #include "providers/odbc/UpdatableSelect.h"
 

@@ -3,14 +3,15 @@
 #include <algorithm>
 #include <limits>
 
+#include "providers/odbc/Connection.h"
 #include "providers/odbc/Environment.h"
 #include "providers/odbc/Failure.h"
 
 namespace QVSa::odbc {
 
-Statement::Statement(SQLHDBC connection, std::chrono::seconds timeout) {
-  if (!SQL_SUCCEEDED(SQLAllocHandle(SQL_HANDLE_STMT, connection, &handle_))) {
-    throw failure(diagnostics(SQL_HANDLE_DBC, connection));
+Statement::Statement(Connection& connection, SQLHDBC handle, std::chrono::seconds timeout) : connection_(connection) {
+  if (!SQL_SUCCEEDED(SQLAllocHandle(SQL_HANDLE_STMT, handle, &handle_))) {
+    throw failure(diagnostics(SQL_HANDLE_DBC, handle));
   }
   // A driver that has no time-out, or sends texts unread anyway, refuses these; nothing is lost by that.
   SQLSetStmtAttrW(handle_, SQL_ATTR_QUERY_TIMEOUT, attributeValue(timeout.count()), SQL_IS_UINTEGER);
@@ -21,8 +22,11 @@ Statement::~Statement() { SQLFreeHandle(SQL_HANDLE_STMT, handle_); }
 
 bool Statement::check(SQLRETURN rc) const {
   if (rc == SQL_NO_DATA) return false;
-  if (!SQL_SUCCEEDED(rc)) throw failure(diagnostics(SQL_HANDLE_STMT, handle_));
-  return true;
+  if (SQL_SUCCEEDED(rc)) return true;
+  constexpr Long deadlocked = 1205;
+  const Failure told = failure(diagnostics(SQL_HANDLE_STMT, handle_));
+  if (told.native() == deadlocked) connection_.transactionLost();
+  throw told;
 }
 
 void Statement::execute(const String& text) {

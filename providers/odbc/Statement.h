@@ -3,16 +3,18 @@
 #include <chrono>
 #include <vector>
 
-#include "QVSa/frame/Provider.h"
+#include "providers/Provider.h"
 #include "providers/odbc/Column.h"
 #include "providers/odbc/Parameter.h"
 
 namespace QVSa::odbc {
 
+class Connection;
+
 // A statement handle; gives up its results when it goes. Throws the failures of the driver and the server.
 class Statement {
  public:
-  Statement(SQLHDBC connection, std::chrono::seconds timeout);
+  Statement(Connection& connection, SQLHDBC handle, std::chrono::seconds timeout);
   ~Statement();
   Statement(const Statement&) = delete;
   Statement& operator=(const Statement&) = delete;
@@ -40,6 +42,7 @@ class Statement {
   // False for SQL_NO_DATA.
   bool check(SQLRETURN rc) const;
 
+  Connection& connection_;
   SQLHSTMT handle_ = SQL_NULL_HSTMT;
 };
 

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/odbc/ObjectText.h"
 #include "providers/tsql/Parser.h"
 #include "providers/tsql/Printer.h"

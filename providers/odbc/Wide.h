@@ -3,7 +3,7 @@
 #include <sql.h>
 #include <sqlext.h>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 // ODBC's wide texts are UTF-16, the library's are UTF-8.
 namespace QVSa::odbc {

@@ -51,13 +51,16 @@ bool isSign(const Token& token) { return token.kind == TokenKind::symbol && (tok
 
 class Lexer {
  public:
-  explicit Lexer(const String& batch) : batch_(batch) {
+  Lexer(const String& batch, Deadline deadline) : batch_(batch), deadline_(deadline) {
     // Lists of columns have a token every three bytes; a long literal must not make room for thousands.
     tokens_.reserve(std::min<std::size_t>(batch.size() / 3 + 8, 400));
   }
 
   std::vector<Token> run() {
-    while (skipBlanks(), at_ < batch_.size()) cut();
+    while (skipBlanks(), at_ < batch_.size()) {
+      deadline_.check();
+      cut();
+    }
     add(TokenKind::end, batch_.size());
     return std::move(tokens_);
   }
@@ -96,6 +99,7 @@ class Lexer {
   void foldList();
 
   const String& batch_;
+  Deadline deadline_;
   std::size_t at_ = 0;
   std::vector<Token> tokens_;
   std::size_t literals_ = 0;
@@ -193,7 +197,12 @@ void Lexer::cutQuoted(TokenKind kind, std::size_t prefix, char close) {
     token.text += close;
     ++at_;
   }
-  if (kind == TokenKind::string) return;
+  if (kind == TokenKind::string) {
+    token.unicode = prefix == 2;
+    return;
+  }
+  if (token.text.find('\0') != String::npos)
+    throw sqlFailure(102, "Incorrect syntax near '" + batch_.substr(begin, 1) + "'.");
   if (token.text.empty()) throw sqlFailure(1038, "An object or column name is missing or empty.");
   listBegin_ = 0;
 }
@@ -273,7 +282,7 @@ void Lexer::foldList() {
 
 }  // namespace
 
-std::vector<Token> tokenize(const String& batch) { return Lexer(batch).run(); }
+std::vector<Token> tokenize(const String& batch, Deadline deadline) { return Lexer(batch, deadline).run(); }
 
 bool isLiteral(TokenKind kind) { return kind >= TokenKind::integer && kind <= TokenKind::list; }
 

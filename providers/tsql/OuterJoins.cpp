@@ -26,30 +26,22 @@ void split(ExpressionPtr condition, std::vector<ExpressionPtr>& conjuncts) {
     conjuncts.push_back(std::move(condition));
     return;
   }
-  split(std::move(condition->operands[0]), conjuncts);
-  split(std::move(condition->operands[1]), conjuncts);
+  for (ExpressionPtr& operand : condition->operands) split(std::move(operand), conjuncts);
 }
 
 ExpressionPtr combine(std::vector<ExpressionPtr> conjuncts) {
-  ExpressionPtr whole;
-  for (ExpressionPtr& conjunct : conjuncts) {
-    if (!whole) {
-      whole = std::move(conjunct);
-      continue;
-    }
-    auto both = std::make_unique<Expression>(Kind::logical, conjunct->position);
-    both->op = "and";
-    both->operands.push_back(std::move(whole));
-    both->operands.push_back(std::move(conjunct));
-    whole = std::move(both);
-  }
+  if (conjuncts.empty()) return nullptr;
+  if (conjuncts.size() == 1) return std::move(conjuncts.front());
+  auto whole = std::make_unique<Expression>(Kind::logical, conjuncts.front()->position);
+  whole->op = "and";
+  whole->operands = std::move(conjuncts);
   return whole;
 }
 
 bool holdsOldJoin(const ExpressionPtr& condition) {
   if (!condition) return false;
   if (!isConjunction(*condition)) return isOldJoin(*condition);
-  return holdsOldJoin(condition->operands[0]) || holdsOldJoin(condition->operands[1]);
+  return std::any_of(condition->operands.begin(), condition->operands.end(), holdsOldJoin);
 }
 
 TableSourcePtr joined(TableSourcePtr left, TableSource::Join join, TableSourcePtr right, ExpressionPtr on) {
@@ -95,12 +87,14 @@ class Block {
     TableSourcePtr source;
     bool isInner = false;
     std::vector<ExpressionPtr> on;
+    std::vector<bool> uses;  // the tables that these conditions speak of
   };
 
   Uses usesOf(const Expression& expression) const;
   void collect(const Expression& expression, std::vector<String>& hidden, bool isInside, Uses& uses) const;
   void collectColumn(const Expression& column, const std::vector<String>& hidden, bool isInside, Uses& uses) const;
   void takeOldJoin(ExpressionPtr condition);
+  static void give(Table& table, ExpressionPtr condition, const std::vector<bool>& uses);
   bool takeCondition(ExpressionPtr& condition);
   void refuseOrdinaryJoin(const Expression& condition) const;
   bool isReady(const Table& table, const std::vector<bool>& placed) const;
@@ -161,7 +155,13 @@ void Block::takeOldJoin(ExpressionPtr condition) {
   condition->op = "=";
   Table& joinedTable = tables_[static_cast<std::size_t>(table)];
   joinedTable.isInner = true;
-  joinedTable.on.push_back(std::move(condition));
+  give(joinedTable, std::move(condition), outer.tables);
+}
+
+void Block::give(Table& table, ExpressionPtr condition, const std::vector<bool>& uses) {
+  table.uses.resize(uses.size());
+  for (std::size_t i = 0; i < uses.size(); ++i) table.uses[i] = table.uses[i] || uses[i];
+  table.on.push_back(std::move(condition));
 }
 
 void Block::refuseOrdinaryJoin(const Expression& condition) const {
@@ -182,7 +182,7 @@ bool Block::takeCondition(ExpressionPtr& condition) {
   const Uses uses = usesOf(*condition);
   for (std::size_t i = 0; i < tables_.size(); ++i) {
     if (!tables_[i].isInner || !uses.isAlone(i)) continue;
-    tables_[i].on.push_back(std::move(condition));
+    give(tables_[i], std::move(condition), uses.tables);
     return true;
   }
   refuseOrdinaryJoin(*condition);
@@ -207,11 +207,8 @@ ExpressionPtr Block::sort(ExpressionPtr where) {
 }
 
 bool Block::isReady(const Table& table, const std::vector<bool>& placed) const {
-  for (const ExpressionPtr& condition : table.on) {
-    const Uses uses = usesOf(*condition);
-    for (std::size_t i = 0; i < tables_.size(); ++i)
-      if (uses.tables[i] && !placed[i] && &tables_[i] != &table) return false;
-  }
+  for (std::size_t i = 0; i < tables_.size(); ++i)
+    if (table.uses[i] && !placed[i] && &tables_[i] != &table) return false;
   return true;
 }
 

@@ -2,14 +2,15 @@
 
 #include "providers/tsql/ParserState.h"
 #include "providers/tsql/SqlFailure.h"
+#include "providers/tsql/Words.h"
 
 namespace QVSa::tsql {
 namespace {
 
 using Kind = Expression::Kind;
 
-// A chain such as a+b+c+... makes a tree as deep as it is long; whoever walks the tree must not run out of stack.
-constexpr std::size_t kMostOperators = 1000;
+// More than a statement of use has. What a chain of them costs later grows with its length.
+constexpr std::size_t kMostOperators = 10000;
 
 bool isCondition(const Expression& expression) {
   switch (expression.kind) {
@@ -41,17 +42,17 @@ void Parser::requireCondition(const Expression& expression) const {
                        near.text + "'.");
 }
 
+bool Parser::isOperator(Form form) const {
+  return now().kind == TokenKind::symbol && operatorNamed(now().text, form) != nullptr;
+}
+
 void Parser::countOperator() {
   if (++operators_ > kMostOperators) refuseDepth();
 }
 
 ExpressionPtr Parser::expression() {
   const Nesting nesting(*this);
-  if (expressionDepth_ == 0) operators_ = 0;
-  ++expressionDepth_;
-  ExpressionPtr whole = disjunction();
-  --expressionDepth_;
-  return whole;
+  return disjunction();
 }
 
 ExpressionPtr Parser::value() {
@@ -81,12 +82,17 @@ ExpressionPtr Parser::conjunction() {
 ExpressionPtr Parser::logical(ExpressionPtr left, ExpressionPtr (Parser::*right)()) {
   requireCondition(*left);
   countOperator();
-  auto whole = std::make_unique<Expression>(Kind::logical, now().position);
-  whole->op = isWord("or") ? "or" : "and";
+  const char* const op = isWord("or") ? "or" : "and";
+  ExpressionPtr whole = std::move(left);
+  if (whole->kind != Kind::logical || whole->op != op) {
+    auto chain = std::make_unique<Expression>(Kind::logical, now().position);
+    chain->op = op;
+    chain->operands.push_back(std::move(whole));
+    whole = std::move(chain);
+  }
   take();
-  whole->operands.push_back(std::move(left));
   whole->operands.push_back((this->*right)());
-  requireCondition(*whole->operands[1]);
+  requireCondition(*whole->operands.back());
   return whole;
 }
 
@@ -100,10 +106,8 @@ ExpressionPtr Parser::negation() {
 }
 
 ExpressionPtr Parser::predicate() {
-  static constexpr std::string_view kComparisons[] = {"=", "<>", "<", "<=", ">", ">=", "*=", "=*"};
   ExpressionPtr left = sum();
-  for (std::string_view op : kComparisons)
-    if (isSymbol(op)) return comparison(std::move(left));
+  if (isOperator(Form::comparison)) return comparison(std::move(left));
   if (isWord("is")) return nullTest(std::move(left));
   const bool negated = isWord("not") && (isWord("between", 1) || isWord("like", 1) || isWord("in", 1));
   if (negated) take();
@@ -179,34 +183,36 @@ ExpressionPtr Parser::operandValue() {
 }
 
 ExpressionPtr Parser::sum() {
-  static constexpr std::string_view kSums = "+-&|^";
   ExpressionPtr left = product();
-  while (now().kind == TokenKind::symbol && now().text.size() == 1 && kSums.find(now().text[0]) != String::npos)
-    left = binary(std::move(left), &Parser::product);
+  while (isOperator(Form::sum)) left = binary(std::move(left), Form::sum, &Parser::product);
   return left;
 }
 
 ExpressionPtr Parser::product() {
   ExpressionPtr left = sign();
-  while (isSymbol("*") || isSymbol("/") || isSymbol("%")) left = binary(std::move(left), &Parser::sign);
+  while (isOperator(Form::product)) left = binary(std::move(left), Form::product, &Parser::sign);
   return left;
 }
 
-ExpressionPtr Parser::binary(ExpressionPtr left, ExpressionPtr (Parser::*right)()) {
+ExpressionPtr Parser::binary(ExpressionPtr left, Form form, ExpressionPtr (Parser::*right)()) {
   requireValue(*left);
   countOperator();
-  auto whole = std::make_unique<Expression>(Kind::binary, now().position);
-  whole->op = take().text;
-  whole->operands.push_back(std::move(left));
+  ExpressionPtr whole = std::move(left);
+  if (whole->kind != Kind::binary || !operatorNamed(std::string_view(whole->op).substr(0, 1), form)) {
+    auto chain = std::make_unique<Expression>(Kind::binary, now().position);
+    chain->operands.push_back(std::move(whole));
+    whole = std::move(chain);
+  }
+  whole->op += take().text;
   whole->operands.push_back((this->*right)());
-  requireValue(*whole->operands[1]);
+  requireValue(*whole->operands.back());
   return whole;
 }
 
 // A sign binds weaker than * and / do: -a*b is -(a*b), and -100/-100*10 is -(100/-(100*10)).
 ExpressionPtr Parser::sign() {
+  if (!isOperator(Form::sign)) return primary();
   const bool isComplement = isSymbol("~");
-  if (!isComplement && !isSymbol("-") && !isSymbol("+")) return primary();
   const Nesting nesting(*this);
   auto whole = std::make_unique<Expression>(Kind::unary, now().position);
   whole->op = take().text;
@@ -265,20 +271,58 @@ ExpressionPtr Parser::column() {
 }
 
 ExpressionPtr Parser::caseOf() {
-  auto whole = std::make_unique<Expression>(Kind::caseOf, take().position);
-  const bool isSimple = !isWord("when");
-  if (isSimple) whole->operands.push_back(value());
+  auto whole = std::make_unique<Expression>(Kind::caseOf, now().position);
+  std::size_t open = 0;
+  do {
+    branches(*whole);
+    ++open;
+    countOperator();
+    if (!takeWord("else")) break;
+    if (!isElseOfCaseOnly()) whole->otherwise = value();
+  } while (!whole->otherwise);
+  while (open-- > 0) expectWord("end");
+  return whole;
+}
+
+// case [operand] when .. then .. when ..
+void Parser::branches(Expression& whole) {
+  take();
+  const std::size_t first = whole.branches.size();
+  ExpressionPtr operand = isWord("when") ? nullptr : value();
+  const bool isSimple = operand != nullptr;
   while (takeWord("when")) {
     WhenBranch branch;
     branch.when = isSimple ? value() : condition();
     expectWord("then");
     branch.then = value();
-    whole->branches.push_back(std::move(branch));
+    whole.branches.push_back(std::move(branch));
   }
-  if (whole->branches.empty()) refuse();
-  if (takeWord("else")) whole->otherwise = value();
-  expectWord("end");
-  return whole;
+  if (whole.branches.size() == first) refuse();
+  if (first > 0) {
+    whole.branches[first].inElse = true;
+    whole.branches[first].operand = std::move(operand);
+  } else if (isSimple) {
+    whole.operands.push_back(std::move(operand));
+  }
+}
+
+// Whether a case stands here and nothing more up to the end of the one around it. Its end is looked up, since looking
+// ahead at each case of a long chain would read the chain as many times.
+bool Parser::isElseOfCaseOnly() {
+  if (!isWord("case")) return false;
+  if (caseEnds_.empty()) {
+    caseEnds_.resize(tokens_.size());
+    std::vector<std::size_t> open;
+    for (std::size_t i = 0; i < tokens_.size(); ++i) {
+      if (tokens_[i].kind != TokenKind::word || !tokens_[i].reserved) continue;
+      if (sameWord(tokens_[i].text, "case")) open.push_back(i);
+      if (open.empty() || !sameWord(tokens_[i].text, "end")) continue;
+      caseEnds_[open.back()] = i;
+      open.pop_back();
+    }
+  }
+  const std::size_t end = caseEnds_[at_];
+  return end != 0 && isWord("end", end + 1 - at_);
 }
 
 }  // namespace QVSa::tsql

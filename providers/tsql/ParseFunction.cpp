@@ -9,54 +9,6 @@ namespace {
 
 using Kind = Expression::Kind;
 
-struct Rule {
-  std::string_view name;
-  std::size_t least;
-  std::size_t most;
-  enum class Form { plain, aggregate, date, open } form = Form::plain;  // open: any number from `least` on
-};
-
-constexpr Rule kRules[] = {
-    {"abs", 1, 1},
-    {"avg", 1, 1, Rule::Form::aggregate},
-    {"ceiling", 1, 1},
-    {"charindex", 2, 3},
-    {"coalesce", 2, 0, Rule::Form::open},
-    {"count", 1, 1, Rule::Form::aggregate},
-    {"dateadd", 3, 3, Rule::Form::date},
-    {"datediff", 3, 3, Rule::Form::date},
-    {"datepart", 2, 2, Rule::Form::date},
-    {"day", 1, 1},
-    {"floor", 1, 1},
-    {"getdate", 0, 0},
-    {"isnull", 2, 2},
-    {"left", 2, 2},
-    {"len", 1, 1},
-    {"lower", 1, 1},
-    {"ltrim", 1, 1},
-    {"max", 1, 1, Rule::Form::aggregate},
-    {"min", 1, 1, Rule::Form::aggregate},
-    {"month", 1, 1},
-    {"nullif", 2, 2},
-    {"replace", 3, 3},
-    {"replicate", 2, 2},
-    {"right", 2, 2},
-    {"round", 2, 3},
-    {"rtrim", 1, 1},
-    {"scope_identity", 0, 0},
-    {"str", 1, 3},
-    {"substring", 3, 3},
-    {"sum", 1, 1, Rule::Form::aggregate},
-    {"upper", 1, 1},
-    {"year", 1, 1},
-};
-
-const Rule* ruleOf(std::string_view name) {
-  const auto rule = std::find_if(std::begin(kRules), std::end(kRules),
-                                 [&](const Rule& candidate) { return sameWord(candidate.name, name); });
-  return rule == std::end(kRules) ? nullptr : rule;
-}
-
 struct DatePart {
   std::string_view name;
   std::string_view shorter[2];
@@ -68,27 +20,18 @@ constexpr DatePart kDateParts[] = {
     {"minute", {"mi", "n"}},  {"second", {"ss", "s"}},  {"millisecond", {"ms"}},
 };
 
-void checkCount(const Rule& rule, std::size_t count) {
-  const bool isOpen = rule.form == Rule::Form::open;
-  if (count >= rule.least && (isOpen || count <= rule.most)) return;
-  const String begin = "The " + String(rule.name) + " function requires ";
-  if (isOpen) throw sqlFailure(174, begin + "at least " + std::to_string(rule.least) + " argument(s).");
-  if (rule.least == rule.most) throw sqlFailure(174, begin + std::to_string(rule.least) + " argument(s).");
-  throw sqlFailure(189, begin + std::to_string(rule.least) + " to " + std::to_string(rule.most) + " arguments.");
-}
-
 }  // namespace
 
 // Some functions have reserved words as names, so that the parenthesis decides.
 bool Parser::isCall() const {
   if (now().kind != TokenKind::word || !isSymbol("(", 1)) return false;
-  return !now().reserved || isWord("convert") || ruleOf(now().text) != nullptr;
+  return !now().reserved || functionNamed(now().text) != nullptr;
 }
 
 ExpressionPtr Parser::function() {
   if (isWord("convert")) return convert();
   if (isWord("cast")) return cast();
-  if (ruleOf(now().text) == nullptr)
+  if (functionNamed(now().text) == nullptr)
     throw sqlFailure(195, "'" + now().text + "' is not a recognized built-in function name.");
   return knownFunction();
 }
@@ -118,15 +61,15 @@ ExpressionPtr Parser::cast() {
 
 ExpressionPtr Parser::knownFunction() {
   const Token& word = take();
-  const Rule& rule = *ruleOf(word.text);
+  const Operation& row = *functionNamed(word.text);
   auto call = std::make_unique<Expression>(Kind::function, word.position);
-  call->name = rule.name;
+  call->name = row.name;
   expectSymbol("(");
-  const bool isDate = rule.form == Rule::Form::date && !isSymbol(")");
-  if (isDate) call->datePart = datePart(rule.name);
-  if (!isDate || takeSymbol(",")) arguments(*call, rule.form == Rule::Form::aggregate);
+  const bool isDate = row.most > 0 && row.operand(0) == Takes::datePart && !isSymbol(")");
+  if (isDate) call->datePart = datePart(row.name);
+  if (!isDate || takeSymbol(",")) arguments(*call, row.form == Form::aggregate);
   expectSymbol(")");
-  checkCount(rule, call->operands.size() + (isDate ? 1 : 0));
+  checkCount(row, call->operands.size() + (isDate ? 1 : 0));
   return call;
 }
 

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <utility>
 
 #include "providers/tsql/ParserState.h"
 #include "providers/tsql/SqlFailure.h"
@@ -122,9 +123,11 @@ ExpressionPtr Parser::star() {
 
 std::vector<TableSourcePtr> Parser::from() {
   expectWord("from");
+  const std::size_t around = std::exchange(tables_, 0);
   std::vector<TableSourcePtr> sources;
   do sources.push_back(tableSource());
   while (takeSymbol(","));
+  tables_ = around;
   return sources;
 }
 
@@ -156,8 +159,6 @@ std::optional<TableSource::Join> Parser::joinWord() {
 
 // Of "a join b join c on .. on ..", the first condition belongs to the last join.
 TableSourcePtr Parser::joined(TableSourcePtr left, TableSource::Join join) {
-  if (++joins_ >= kMostTables)
-    throw sqlFailure(106, "Too many table names in the query. The maximum allowable is 256.");
   auto source = std::make_unique<TableSource>();
   source->kind = TableSource::Kind::join;
   source->join = join;
@@ -173,6 +174,9 @@ TableSourcePtr Parser::joined(TableSourcePtr left, TableSource::Join join) {
 }
 
 TableSourcePtr Parser::tablePrimary() {
+  if (!isSymbol("(") || isWord("select", 1))
+    if (++tables_ > kMostTables)
+      throw sqlFailure(106, "Too many table names in the query. The maximum allowable is 256.");
   if (isSymbol("(") && isWord("select", 1)) return derivedTable();
   if (takeSymbol("(")) {
     TableSourcePtr source = tableSource();

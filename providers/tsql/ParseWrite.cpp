@@ -4,6 +4,8 @@
 namespace QVSa::tsql {
 namespace {
 
+constexpr std::size_t kMostRows = 1000;
+
 void checkRow(const Insert& insert, std::size_t count) {
   if (!insert.columns.empty() && insert.columns.size() > count)
     throw sqlFailure(109,
@@ -15,6 +17,11 @@ void checkRow(const Insert& insert, std::size_t count) {
                      "There are fewer columns in the INSERT statement than values specified in the VALUES clause. The "
                      "number of values in the VALUES clause must match the number of columns specified in the INSERT "
                      "statement.");
+  if (insert.values.size() == kMostRows)
+    throw sqlFailure(
+        10738,
+        "The number of row value expressions in the INSERT statement exceeds the maximum allowed number of "
+        "1000 row values.");
   if (!insert.values.empty() && insert.values.front().size() != count)
     throw sqlFailure(10709, "The number of columns for each row in a table value constructor must be the same.");
 }

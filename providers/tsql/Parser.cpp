@@ -20,13 +20,6 @@ String dotted(const std::vector<String>& parts) {
 
 }  // namespace
 
-void refuseDepth() {
-  throw sqlFailure(
-      191,
-      "Some part of your SQL statement is nested too deeply. Rewrite the query or break it up into smaller "
-      "queries.");
-}
-
 Parser::Nesting::Nesting(Parser& parser, std::size_t weight) : parser_(parser), weight_(weight) {
   if (parser_.depth_ + weight_ > kDeepest) refuseDepth();
   parser_.depth_ += weight_;
@@ -37,7 +30,7 @@ std::vector<Statement> Parser::batch() {
   for (;;) {
     while (takeSymbol(";")) continue;
     if (now().kind == TokenKind::end) return statements;
-    joins_ = 0;
+    operators_ = 0;
     statements.push_back(statement());
   }
 }
@@ -88,13 +81,13 @@ bool Parser::isName(std::size_t distance) const {
 
 bool Parser::takeWord(std::string_view word) {
   if (!isWord(word)) return false;
-  ++at_;
+  take();
   return true;
 }
 
 bool Parser::takeSymbol(std::string_view symbol) {
   if (!isSymbol(symbol)) return false;
-  ++at_;
+  take();
   return true;
 }
 
@@ -189,6 +182,8 @@ std::int64_t Parser::digits() {
 
 std::int64_t Parser::wholeNumber() { return takeSymbol("-") ? -digits() : digits(); }
 
-std::vector<Statement> parse(const std::vector<Token>& tokens) { return Parser(tokens).batch(); }
+std::vector<Statement> parse(const std::vector<Token>& tokens, Deadline deadline) {
+  return Parser(tokens, deadline).batch();
+}
 
 }  // namespace QVSa::tsql

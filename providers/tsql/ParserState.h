@@ -3,6 +3,7 @@
 #include <string_view>
 #include <utility>
 
+#include "providers/tsql/Dialect.h"
 #include "providers/tsql/Tree.h"
 
 namespace QVSa::tsql {
@@ -11,7 +12,7 @@ namespace QVSa::tsql {
 // own; all of them work on this one state.
 class Parser {
  public:
-  explicit Parser(const std::vector<Token>& tokens) : tokens_(tokens) {}
+  Parser(const std::vector<Token>& tokens, Deadline deadline) : tokens_(tokens), deadline_(deadline) {}
 
   std::vector<Statement> batch();
 
@@ -21,7 +22,10 @@ class Parser {
   // Parser.cpp: the tokens
   const Token& now() const { return tokens_[at_]; }
   const Token& ahead(std::size_t distance) const;
-  const Token& take() { return tokens_[at_++]; }
+  const Token& take() {
+    deadline_.check();
+    return tokens_[at_++];
+  }
   bool isWord(std::string_view word, std::size_t distance = 0) const;
   bool isSymbol(std::string_view symbol, std::size_t distance = 0) const;
   bool isName(std::size_t distance = 0) const;
@@ -125,7 +129,7 @@ class Parser {
   ExpressionPtr primary();
   ExpressionPtr operandValue();
   ExpressionPtr logical(ExpressionPtr left, ExpressionPtr (Parser::*right)());
-  ExpressionPtr binary(ExpressionPtr left, ExpressionPtr (Parser::*right)());
+  ExpressionPtr binary(ExpressionPtr left, Form form, ExpressionPtr (Parser::*right)());
   ExpressionPtr comparison(ExpressionPtr left);
   ExpressionPtr nullTest(ExpressionPtr left);
   ExpressionPtr between(ExpressionPtr left, bool negated);
@@ -136,8 +140,11 @@ class Parser {
   ExpressionPtr literal();
   ExpressionPtr column();
   ExpressionPtr caseOf();
+  void branches(Expression& whole);
+  bool isElseOfCaseOnly();
   void requireValue(const Expression& expression) const;
   void requireCondition(const Expression& expression) const;
+  bool isOperator(Form form) const;
   void countOperator();
 
   // ParseFunction.cpp
@@ -150,11 +157,12 @@ class Parser {
   void arguments(Expression& call, bool aggregate);
 
   const std::vector<Token>& tokens_;
+  Deadline deadline_;
   std::size_t at_ = 0;
   std::size_t depth_ = 0;
-  std::size_t expressionDepth_ = 0;
-  std::size_t operators_ = 0;  // of the outermost expression
-  std::size_t joins_ = 0;      // of the statement
+  std::size_t operators_ = 0;          // of the statement
+  std::size_t tables_ = 0;             // of the from list
+  std::vector<std::size_t> caseEnds_;  // for each token that is a case, its end; empty until the first chain
 };
 
 // Guards the stack: parentheses, signs, selects and whatever else the parser calls itself for count by their weight.
@@ -169,7 +177,5 @@ class Parser::Nesting {
   Parser& parser_;
   std::size_t weight_;
 };
-
-[[noreturn]] void refuseDepth();
 
 }  // namespace QVSa::tsql

@@ -22,7 +22,7 @@ int strengthOf(const Expression& expression) {
     case Kind::in:
       return strength::predicate;
     case Kind::binary:
-      return String("*/%").find(expression.op) != String::npos ? strength::product : strength::sum;
+      return String("*/%").find(expression.op[0]) != String::npos ? strength::product : strength::sum;
     case Kind::unary:
       return expression.op == "~" ? strength::primary : strength::sign;
     default:
@@ -147,8 +147,13 @@ void Writer::writeQualified(const std::vector<String>& qualifier) {
 // Operators of one strength stand together from left to right, so that only the right one needs parentheses.
 void Writer::writeBinary(const Expression& expression, int own) {
   write(*expression.operands[0], own);
-  add(" " + expression.op + " ");
-  write(*expression.operands[1], own + 1);
+  for (std::size_t i = 1; i < expression.operands.size(); ++i) {
+    add(" ");
+    add(expression.kind == Kind::logical ? std::string_view(expression.op)
+                                         : std::string_view(expression.op).substr(i - 1, 1));
+    add(" ");
+    write(*expression.operands[i], own + 1);
+  }
 }
 
 void Writer::writeSigned(const Expression& expression) {
@@ -225,12 +230,21 @@ void Writer::writeConvert(const Expression& expression) {
 }
 
 void Writer::writeCase(const Expression& expression) {
+  std::size_t open = 1;
   add("case");
   for (const ExpressionPtr& operand : expression.operands) {
     add(" ");
     write(*operand);
   }
   for (const WhenBranch& branch : expression.branches) {
+    if (branch.inElse) {
+      ++open;
+      add(" else case");
+    }
+    if (branch.operand) {
+      add(" ");
+      write(*branch.operand);
+    }
     add(" when ");
     write(*branch.when);
     add(" then ");
@@ -240,7 +254,7 @@ void Writer::writeCase(const Expression& expression) {
     add(" else ");
     write(*expression.otherwise);
   }
-  add(" end");
+  while (open-- > 0) add(" end");
 }
 
 void Writer::writeSubquery(const Select& select) {

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <array>
 
 #include "providers/tsql/Lexer.h"
 #include "providers/tsql/Words.h"
@@ -37,6 +38,7 @@ class ShapeWriter {
   void writeSymbol(const String& symbol);
   void writeQuoted(char open, const String& text, char close);
   void writeLiteral(const Token& token);
+  void writeDigits(const LiteralSize& size);
   void writeList(const std::vector<Token>& items);
   void open();
   void close();
@@ -110,24 +112,42 @@ bool ShapeWriter::isForm(const Token& token) const {
          (!converts_.empty() && converts_.back().depth == depth_ && converts_.back().commas == 2);
 }
 
-char letterOf(TokenKind kind) {
-  constexpr std::string_view kLetters = "idrsb";
-  return kLetters[static_cast<std::size_t>(kind) - static_cast<std::size_t>(TokenKind::integer)];
+constexpr std::string_view kLetters = "idrsnSNb";
+
+char letterOf(const Token& token) {
+  if (token.kind == TokenKind::string) return (sizeOf(token).isLong ? "SN" : "sn")[token.unicode ? 1 : 0];
+  return "idr?b"[static_cast<std::size_t>(token.kind) - static_cast<std::size_t>(TokenKind::integer)];
+}
+
+void ShapeWriter::writeDigits(const LiteralSize& size) {
+  shape_ += std::to_string(size.whole) + "." + std::to_string(size.fraction);
 }
 
 // All kinds that a list holds, in their own order: its type follows from them, not from how many items there are.
 void ShapeWriter::writeList(const std::vector<Token>& items) {
+  std::array<bool, kLetters.size()> found{};
+  LiteralSize widest;
+  for (const Token& item : items) {
+    found[kLetters.find(letterOf(item))] = true;
+    if (item.kind != TokenKind::decimal) continue;
+    const LiteralSize size = sizeOf(item);
+    widest.whole = std::max(widest.whole, size.whole);
+    widest.fraction = std::max(widest.fraction, size.fraction);
+  }
   shape_ += "?l";
-  for (TokenKind kind : {TokenKind::integer, TokenKind::decimal, TokenKind::real, TokenKind::string, TokenKind::binary})
-    if (std::any_of(items.begin(), items.end(), [&](const Token& item) { return item.kind == kind; }))
-      shape_ += letterOf(kind);
+  for (std::size_t i = 0; i < found.size(); ++i) {
+    if (!found[i]) continue;
+    shape_ += kLetters[i];
+    if (kLetters[i] == 'd') writeDigits(widest);
+  }
 }
 
 void ShapeWriter::writeLiteral(const Token& token) {
   if (token.kind == TokenKind::list) return writeList(token.items);
   if (!isForm(token)) {
     shape_ += '?';
-    shape_ += letterOf(token.kind);
+    shape_ += letterOf(token);
+    if (token.kind == TokenKind::decimal) writeDigits(sizeOf(token));
   } else if (token.kind == TokenKind::string) {
     writeQuoted('\'', token.text, '\'');
   } else {
@@ -136,6 +156,21 @@ void ShapeWriter::writeLiteral(const Token& token) {
 }
 
 }  // namespace
+
+LiteralSize sizeOf(const Token& literal) {
+  LiteralSize size;
+  if (literal.kind == TokenKind::string) {
+    // Bytes are no fewer than characters: what counts as long too early is only not cut.
+    size.isLong = literal.text.size() > (literal.unicode ? 4000U : 8000U);
+    return size;
+  }
+  std::string_view digits = literal.text;
+  digits.remove_prefix(std::min(digits.find_first_not_of("-+0"), digits.size()));
+  const std::size_t point = digits.find('.');
+  size.whole = std::min(point, digits.size());
+  if (point != std::string_view::npos) size.fraction = digits.size() - point - 1;
+  return size;
+}
 
 String shapeOf(const std::vector<Token>& tokens) { return ShapeWriter(tokens).run(); }
 

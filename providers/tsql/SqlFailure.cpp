@@ -44,4 +44,19 @@ Long failureNumber(Long native) {
   }
 }
 
+Failure timeExpired() { return Failure(number::timeout, "SQL Server", "Timeout expired"); }
+
+Failure transactionLost() {
+  return sqlFailure(3930,
+                    "The current transaction cannot be committed and cannot support operations that write to the log "
+                    "file. Roll back the transaction.");
+}
+
+void refuseDepth() {
+  throw sqlFailure(
+      191,
+      "Some part of your SQL statement is nested too deeply. Rewrite the query or break it up into smaller "
+      "queries.");
+}
+
 }  // namespace QVSa::tsql

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 
 namespace QVSa::tsql {
 
@@ -11,5 +11,14 @@ Failure sqlFailure(Long native, const String& description);
 // The failure number for SQL Server's own: integrity for 2627, 2601 and 515, no table for 208, and so on; `statement`
 // for every other statement error.
 Long failureNumber(Long native);
+
+// A statement, or a wait of it, ran over its time-out.
+Failure timeExpired();
+
+// 191: what is nested deeper than whoever reads it has room for.
+[[noreturn]] void refuseDepth();
+// 3930: the server has rolled the transaction back, and the session has not said so yet: whatever it wrote now would be
+// committed alone.
+Failure transactionLost();
 
 }  // namespace QVSa::tsql

@@ -5,7 +5,7 @@
 #include <variant>
 #include <vector>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 #include "providers/tsql/Lexer.h"
 
 // The syntax tree of the dialect. The parser makes it, the printer writes it back as T-SQL, a binder annotates it.
@@ -33,6 +33,10 @@ struct TypeName {
 struct WhenBranch {
   ExpressionPtr when;
   ExpressionPtr then;
+  // Begins a case of its own in the else of the one before it: "case .. else case [`operand`] when .. end end". Such a
+  // chain may be thousands of cases long, and so stands in one node.
+  bool inElse = false;
+  ExpressionPtr operand;
 };
 
 // What a binder found an expression to be; empty in a tree that was only parsed. See the provider that binds.
@@ -48,10 +52,10 @@ struct Expression {
     column,      // `qualifier` (zero to three parts, the table last) and `name`
     star,        // * or qualifier.*; in a select list, in count(*) and in exists
     unary,       // `op` -, + or ~ on operands[0]
-    binary,      // `op` + - * / % & | ^ on two operands
+    binary,      // operands, from left to right, with the characters of `op` between them: + - & | ^ or * / %
     comparison,  // `op` = <> < <= > >= and the old joins *= and =* on two operands; != is read as <>, !< as >=, !> as
                  // <=
-    logical,     // `op` and, or on two operands
+    logical,     // operands with `op` and, or between them
     negation,    // not operands[0]
     isNull,      // operands[0] is [not] null
     between,     // operands[0] [not] between operands[1] and operands[2]
@@ -61,7 +65,7 @@ struct Expression {
     subquery,    // a scalar (`select`)
     function,    // `name`(operands); `distinct` for an aggregate; a date part stands in `datePart`
     convert,     // convert(`type`, operands[0] [, operands[1] as the style]) and cast, told apart by `name`
-    caseOf,      // case [operands[0]] `branches` [else `otherwise`] end
+    caseOf,      // case [operands[0]] `branches` [else `otherwise`] end; see WhenBranch::inElse
   };
 
   Kind kind = Kind::null;

@@ -14,6 +14,7 @@ void walkExpression(Node& expression, const Visit& visit) {
   };
   for (const ExpressionPtr& operand : expression.operands) below(operand);
   for (const WhenBranch& branch : expression.branches) {
+    below(branch.operand);
     below(branch.when);
     below(branch.then);
   }

@@ -2,7 +2,7 @@
 
 #include <string_view>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 // Words of the dialect: names and keywords, told apart without regard to the case of Latin letters.
 namespace QVSa::tsql {

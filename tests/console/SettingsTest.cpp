@@ -17,7 +17,8 @@ class SettingsProgram : public test::Program {
 };
 
 TEST_F(SettingsProgram, WhatIsNotNamedStaysPicturesAndSecretsToo) {
-  ASSERT_EQ(run("settings set --name 'Our Co' --login-title Hello --mail --mail-server smtp --mail-password "
+  ASSERT_EQ(run("settings set --name 'Our Co' --login-title Hello --login-news http://x --mail --mail-server smtp "
+                "--mail-password "
                 "--directory --directory-host box --directory-port 636 --directory-password",
                 "Mail-Secret\nabc\n")
                 .exitCode,
@@ -31,6 +32,7 @@ TEST_F(SettingsProgram, WhatIsNotNamedStaysPicturesAndSecretsToo) {
   EXPECT_EQ(after["name"], "Our Co");
   EXPECT_EQ(after["fax"], "12");
   EXPECT_EQ(after["login-title"], "Hello");
+  EXPECT_EQ(after["login-news"], "http://x");
   EXPECT_EQ(after["mail"], true);
   EXPECT_EQ(after["directory-port"], 636);
   EXPECT_EQ(after["login-image"], true);

@@ -3,8 +3,8 @@
 #include <random>
 #include <vector>
 
-#include "providers/embedded/Collation.h"
-#include "providers/embedded/Utf8.h"
+#include "providers/embedded/functions/Collation.h"
+#include "providers/embedded/functions/Utf8.h"
 
 namespace QVSa::embedded {
 namespace {

@@ -1,10 +1,11 @@
 #include <fstream>
 #include <future>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "providers/embedded/Handle.h"
+#include "providers/embedded/storage/Handle.h"
 #include "tests/embedded/ChildProcess.h"
 #include "tests/embedded/InstallationFolder.h"
 
@@ -39,8 +40,9 @@ class HandleOfAnInstallation : public testing::Test {
     const Failure failure = failureOf([&] { Handle handle(folder_.data()); });
     EXPECT_EQ(failure.number(), number::login);
     EXPECT_EQ(failure.native(), 4060);
-    EXPECT_NE(failure.description().find("Cannot open database \"" + database + "\""), std::string::npos);
-    EXPECT_NE(failure.description().find(reason), std::string::npos) << failure.description();
+    const std::string file = databaseFile(folder_.data(), database).string();
+    for (const std::string& told : {"Cannot open database \"" + database + "\": ", reason, file})
+      EXPECT_NE(failure.description().find(told), std::string::npos) << failure.description();
   }
 
   void fillTable() {
@@ -74,14 +76,16 @@ TEST_F(HandleOfAnInstallation, AMissingFolderIsAMissingServer) {
   EXPECT_EQ(failure.number(), number::general);
   EXPECT_EQ(failure.native(), 17);
   EXPECT_FALSE(std::filesystem::exists(folder_.root() / "elsewhere"));
+  EXPECT_NE(failure.description().find((folder_.root() / "elsewhere").string()), std::string::npos);
   EXPECT_EQ(failureOf([&] { Handle handle(folder_.root()); }).native(), 17);
-  EXPECT_TRUE(std::filesystem::is_regular_file(databaseFile(folder_.data(), "master")));
+  std::filesystem::remove(databaseFile(folder_.data(), "master"));
+  expectRefused("master", "the file is missing");
 }
 
 TEST_F(HandleOfAnInstallation, AFileThatIsNotOursIsRefusedAndLeftAlone) {
   const auto file = databaseFile(folder_.data(), "QVSys");
   std::filesystem::remove(file);
-  expectRefused("QVSys", "No such file");
+  expectRefused("QVSys", "the file is missing");
   EXPECT_FALSE(std::filesystem::exists(file));
 
   std::ofstream(file) << std::string(5000, 'x');
@@ -96,14 +100,30 @@ TEST_F(HandleOfAnInstallation, AFileThatIsNotOursIsRefusedAndLeftAlone) {
   sqlite3_exec(other, "create table engine(layout)", nullptr, nullptr, nullptr);
   sqlite3_close(other);
   expectRefused("QVSys", "no database of this system");
+
+  std::filesystem::copy_file(databaseFile(folder_.data(), "QVApp"), file,
+                             std::filesystem::copy_options::overwrite_existing);
+  expectRefused("QVSys", "the file is the one of QVApp");
 }
 
-TEST_F(HandleOfAnInstallation, ANewerLayoutIsRefused) {
-  {
-    Handle handle(folder_.data());
-    handle.execute("update QVApp.engine set layout=" + std::to_string(layoutVersion + 1));
-  }
-  expectRefused("QVApp", "newer release");
+TEST_F(HandleOfAnInstallation, ALayoutThatIsNotKnownIsRefused) {
+  Handle handle(folder_.data());
+  handle.execute("update QVApp.engine set layout=0");
+  expectRefused("QVApp", "a layout that no release has written");
+  handle.execute("update QVApp.engine set layout=" + std::to_string(layoutVersion + 1));
+  expectRefused("QVApp", "A newer release has to open it.");
+  EXPECT_EQ(failureOf([&] { handle.catalogueVersion(); }).native(), 4060) << "it came while the handle was open";
+}
+
+TEST_F(HandleOfAnInstallation, AFullDiskIsToldAsWhatItIs) {
+  EXPECT_EQ(ChildProcess([&] {
+              ::signal(SIGXFSZ, SIG_IGN);
+              const rlimit limit{1000, 1000};
+              ::setrlimit(RLIMIT_FSIZE, &limit);
+              const Failure failure = failureOf([&] { Handle handle(folder_.data()); });
+              return failure.native() == 4060 && failure.description().find("no room") != std::string::npos ? 0 : 1;
+            }).exitCode(),
+            0);
 }
 
 TEST_F(HandleOfAnInstallation, ADamagedFileIsRefused) {

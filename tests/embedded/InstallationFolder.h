@@ -4,8 +4,8 @@
 #include <stdlib.h>
 #include <string>
 
-#include "providers/embedded/Installation.h"
-#include "providers/embedded/Pool.h"
+#include "providers/Installation.h"
+#include "providers/embedded/storage/Pool.h"
 
 namespace QVSa::embedded {
 

@@ -3,9 +3,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "QVSa/frame/Failure.h"
-#include "providers/embedded/Installation.h"
-#include "providers/embedded/Layout.h"
+#include "QVSa/values/Failure.h"
+#include "providers/Installation.h"
+#include "providers/embedded/storage/Layout.h"
 #include "tests/embedded/InstallationFolder.h"
 #include "tests/support/Failures.h"
 

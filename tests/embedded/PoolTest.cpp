@@ -2,8 +2,8 @@
 #include <thread>
 #include <vector>
 
-#include "providers/embedded/Login.h"
-#include "providers/embedded/Pool.h"
+#include "providers/embedded/administration/Login.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/embedded/ChildProcess.h"
 #include "tests/embedded/InstallationFolder.h"
 
@@ -54,7 +54,25 @@ TEST(Pool, AHandleWhoseFilesWereReplacedIsNotUsedAgain) {
   EXPECT_EQ(failureOf([&] { acquireHandle(folder.data()); }).native(), 17);
   createInstallation(folder.plan());
   EXPECT_EQ(failureOf([&] { acquireHandle(folder.data())->execute("select * from QVSys.old"); }).number(),
-            number::statement);
+            number::noTable);
+}
+
+TEST(Pool, AFileThatAnotherOneHasReplacedIsNoticedWhicheverItIs) {
+  InstallationFolder folder;
+  const auto replace = [&](const char* name) {
+    const auto file = databaseFile(folder.data(), name);
+    std::filesystem::copy_file(file, folder.root() / "copy");
+    std::filesystem::rename(folder.root() / "copy", file);
+  };
+  for (const char* name : databaseNames) {
+    acquireHandle(folder.data())->attachment() = std::make_shared<int>();
+    EXPECT_TRUE(acquireHandle(folder.data())->attachment());
+    replace(name);
+    const PooledHandle open = acquireHandle(folder.data());
+    EXPECT_FALSE(open->attachment()) << name;
+    replace(name);
+    EXPECT_EQ(failureOf([&] { open->catalogueVersion(); }).native(), 4060) << name;
+  }
 }
 
 TEST(Pool, ThreadsHaveAHandleEach) {

@@ -7,7 +7,7 @@
 #include <sstream>
 
 #include "QVSa/frame/ConnectionString.h"
-#include "providers/embedded/Provider.h"
+#include "providers/embedded/session/Provider.h"
 #include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {

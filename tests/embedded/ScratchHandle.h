@@ -3,10 +3,10 @@
 #include <sqlite3.h>
 #include <string>
 
-#include "QVSa/frame/Failure.h"
-#include "providers/embedded/Functions.h"
-#include "providers/embedded/NumberText.h"
-#include "providers/embedded/Prepared.h"
+#include "QVSa/values/Failure.h"
+#include "providers/embedded/functions/Functions.h"
+#include "providers/embedded/functions/NumberText.h"
+#include "providers/embedded/storage/Prepared.h"
 
 namespace QVSa::embedded {
 

@@ -2,7 +2,8 @@
 #include <thread>
 
 #include "QVSa/frame/ConnectionString.h"
-#include "providers/embedded/Provider.h"
+#include "providers/embedded/session/Provider.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/support/Failures.h"
 #include "tests/support/TestInstallation.h"
 
@@ -15,7 +16,8 @@ class Sessions : public testing::Test {
  protected:
   Sessions() {
     first_->run(
-        {"create table t (id int identity primary key, no nvarchar(20) not null unique, n int null, x image null)"});
+        {"create table t (id int identity primary key, no nvarchar(20) not null unique, n int null, x image null, w "
+         "ntext null)"});
     first_->run({"insert into t(no,n) values ('a',1), ('b',2), ('c',3)"});
   }
 
@@ -33,6 +35,10 @@ class Sessions : public testing::Test {
     while (rows.next())
       found += (found.empty() ? "" : " ") + (rows.value(0).isNull() ? "NULL" : rows.value(0).toText());
     return found;
+  }
+
+  static Long nativeOf(ProviderSession& session, const std::string& text) {
+    return thrownBy([&] { session.run({text, false, std::chrono::seconds(1)}); }).native();
   }
 
   static Long numberOf(ProviderSession& session, const std::string& text, int seconds = 1) {
@@ -88,16 +94,113 @@ TEST_F(Sessions, AClaimedRowIsPassedOverWaitedForOrRefused) {
   EXPECT_EQ(numberOf(*second_, "select n from t with (xlock) where no='a'"), number::timeout);
   EXPECT_EQ(numberOf(*second_, "update t set n=0 where no='a'"), number::timeout);
   second_->run({"update t set n=0 where no='b'"});
-
-  // Who has the writer's place and would wait for a row is refused at once: the row's holder waits for that place.
-  second_->begin();
-  second_->run({"update t set n=9 where no='c'"});
-  EXPECT_EQ(thrownBy([&] { second_->run({"update t set n=0 where no='a'"}); }).native(), 1205);
-  second_->rollback();
-
   first_->commit();
   EXPECT_EQ(all(*second_, "select n from t with (xlock) where no='a'"), "1");
   EXPECT_EQ(all(*second_, "select n from t order by no"), "1 0 3");
+}
+
+TEST_F(Sessions, AnApplicationLockIsWaitedForAndEndsWithItsTransaction) {
+  const std::string lock = "begin transaction exec sp_getapplock N'a','Exclusive'";
+  first_->run({lock});
+  EXPECT_EQ(numberOf(*second_, lock), number::timeout);
+  second_->rollback();
+  second_->run({"begin transaction exec sp_getapplock N'b','Exclusive' update t set n=0 where no='b'"});
+  first_.reset();
+  second_->run({"exec sp_getapplock N'a','Exclusive'", false, std::chrono::seconds(1)});
+}
+
+TEST_F(Sessions, AChangedRowIsPassedOverAndToInsertItsKeyCollidesAtOnce) {
+  first_->begin();
+  first_->run({"update t set n=5 where no='a'"});
+  second_->begin();
+  EXPECT_EQ(all(*second_, claim), "");
+  EXPECT_EQ(nativeOf(*second_, "insert into t(no,n) values ('A ',1)"), 2627);
+  EXPECT_EQ(all(*second_, "select n from t with (rowlock xlock readpast) where no='b'"), "2");
+  EXPECT_EQ(numberOf(*second_, "insert into t(no,n) values ('d',1)"), number::timeout) << "another key waits";
+  second_->rollback();
+  first_->run({"delete from t"});
+  EXPECT_EQ(all(*second_, "select n from t with (rowlock xlock readpast) where no='c'"), "");
+  first_->rollback();
+  EXPECT_EQ(all(*second_, claim), "1");
+}
+
+// The holder of the row may need the write lock before it lets the row go.
+TEST_F(Sessions, AWriteThatMeetsAClaimedRowGivesTheWriteLockBackMeanwhile) {
+  first_->begin();
+  EXPECT_EQ(all(*first_, claim), "1");
+  second_->begin();
+  second_->run({"update t set n=9 where no='c'\ninsert into t(no,n) values ('d',4)"});
+  std::thread other([&] { second_->run({"update t set n=n*10"}); });
+  std::this_thread::sleep_for(std::chrono::milliseconds(100));
+  first_->run({"update t set n=7 where no='a'"});
+  EXPECT_EQ(all(*first_, "select n from t order by no"), "7 2 3");
+  first_->commit();
+  other.join();
+  EXPECT_EQ(all(*second_, "select n from t order by no"), "70 20 90 40");
+  second_->commit();
+  EXPECT_EQ(all(*first_, "select n from t order by no"), "70 20 90 40");
+
+  first_->begin();
+  EXPECT_EQ(all(*first_, claim), "70");
+  EXPECT_EQ(numberOf(*second_, "update t set n=1 where no>='a'"), number::timeout);
+  EXPECT_EQ(numberOf(*second_, "delete from t"), number::timeout);
+  second_->run({"update t set n=1 where no>'a'"});
+  EXPECT_EQ(all(*first_, "select n from t order by no"), "70 1 1 1");
+}
+
+TEST_F(Sessions, ATransactionThatLostItsWritesTakesNothingButARollback) {
+  const auto expectLost = [&] {
+    for (const char* text :
+         {"select n from t", "update t set n=0", "begin tran", "create table u (a int)", "use QVApp"})
+      EXPECT_EQ(nativeOf(*second_, text), 3930) << text;
+    EXPECT_EQ(thrownBy([&] { second_->commit(); }).native(), 3930);
+    second_->run({"rollback tran select n from t"});
+    EXPECT_EQ(all(*second_, "select n from t order by no"), "1 2 3");
+  };
+  first_->begin();
+  EXPECT_EQ(all(*first_, claim), "1");
+  second_->begin();
+  second_->run({"update t set n=9 where no='c'"});
+  EXPECT_EQ(all(*second_, "select n from t where no='c'"), "9");
+  EXPECT_EQ(nativeOf(*second_, "update t set n=0 where no='a'"), 1205) << "what was seen can't be undone unseen";
+  first_->run({"update t set n=3 where no='c'"});
+  expectLost();
+  first_->commit();
+
+  first_->begin();
+  EXPECT_EQ(all(*first_, claim), "1");
+  second_->begin();
+  second_->run({"update t set n=9 where no='c'"});
+  EXPECT_EQ(numberOf(*second_, "update t set n=0 where no='a'"), number::timeout);
+  expectLost();
+  first_->commit();
+
+  second_->begin();
+  second_->run({"update t set n=9 where no='c'"});
+  const std::string endless =
+      "(select count(*) from t a,t b,t c,t d,t e,t f,t g,t h,t i,t j,t k,t l,t m,t o,t p,t q,t r)";
+  EXPECT_EQ(numberOf(*second_, "update t set n=" + endless + " where no='a'"), number::timeout);
+  expectLost();
+
+  second_->begin();
+  EXPECT_EQ(numberOf(*second_, "update t set n=" + endless + " where no='a'"), number::timeout);
+  second_->run({"update t set n=9 where no='c'"});
+  second_->rollback();
+  EXPECT_EQ(all(*second_, "select n from t order by no"), "1 2 3") << "nothing was lost, so nothing is refused";
+}
+
+TEST_F(Sessions, AFullDiskTakesTheTransactionWithIt) {
+  first_.reset();
+  second_.reset();
+  embedded::acquireHandle(installation_.folder())->execute("pragma QVSys.max_page_count=30");
+  second_ = open();
+  second_->begin();
+  second_->run({"update t set n=9 where no='c'"});
+  EXPECT_EQ(nativeOf(*second_, "insert into t(no,w) values ('d','" + std::string(200000, 'y') + "')"), 1105);
+  EXPECT_EQ(nativeOf(*second_, "update t set n=8 where no='b'"), 3930);
+  EXPECT_EQ(thrownBy([&] { second_->commit(); }).native(), 3930);
+  second_->rollback();
+  EXPECT_EQ(all(*second_, "select n from t order by no"), "1 2 3");
 }
 
 TEST_F(Sessions, AWaitingWriteSeesWhatItWaitedFor) {

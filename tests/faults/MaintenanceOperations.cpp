@@ -1,7 +1,7 @@
 #include "tests/faults/MaintenanceOperations.h"
 
 #include "QVSa/QVSa.h"
-#include "QVSa/maintenance/BackupLock.h"
+#include "QVSa/maintenance/internal/BackupLock.h"
 #include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
 #include "tests/support/TestInstallation.h"

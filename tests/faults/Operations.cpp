@@ -51,6 +51,9 @@ std::vector<Operation> userOperations() {
             return user.loginAuth("ann", "right", &id, false, "", "pc1") && !id.empty();
           },
           signOn),
+      operation<SignOn>(
+          "SignOn.signOn", [](SignOn& entrance) { entrance.refusalTime(1); },
+          [](SignOn& entrance, const String&) { return entrance.signOn("ann", "right"); }, signOn),
       operation<User>("User.loginAuth with a wrong password", nothing<User>,
                       [](User& user, const String&) {
                         user.loginAuth("ann", "wrong");
@@ -233,6 +236,8 @@ const std::vector<LetPass>& letPass() {
     std::vector<LetPass> result{
         {"User.loginAuth", "select * from saferule", false, "without the policy neither lock nor expiry is tested"},
         {"User.loginAuth", "select * from sesLog", false, "without the list no session stands elsewhere"},
+        {"SignOn.signOn", "select * from saferule", false, "without the policy neither lock nor expiry is tested"},
+        {"SignOn.signOn", "select * from sesLog", false, "the list plays no part without a computer's name"},
         {"User.loginAuth with a wrong password", "select * from saferule", false, "the password is wrong all the same"},
         {"safeRule.checkPwd", "select * from saferule", true, "without the policy every text passes"},
         {"Sessions.connect", "select * from sesLog", true, "the names are kept, and the list can be read later"},

@@ -3,7 +3,8 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
+#include "providers/Provider.h"
 #include "tests/support/Failures.h"
 
 namespace QVSa {

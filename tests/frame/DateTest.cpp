@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Date.h"
+#include "QVSa/values/Date.h"
 #include "tests/support/Failures.h"
 
 namespace QVSa {

@@ -2,7 +2,7 @@
 
 #include "QVSa/frame/Connection.h"
 #include "QVSa/frame/Recordset.h"
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
 #include "tests/support/Failures.h"
 #include "tests/support/FakeSession.h"
 

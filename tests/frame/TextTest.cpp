@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
 #include "tests/support/Failures.h"
 
 namespace QVSa {

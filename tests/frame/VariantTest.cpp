@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Variant.h"
+#include "QVSa/values/Variant.h"
 #include "tests/support/Failures.h"
 
 namespace QVSa {

@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/identity/IpRules.h"
+#include "QVSa/identity/internal/IpRules.h"
 
 namespace QVSa {
 namespace {

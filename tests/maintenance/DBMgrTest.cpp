@@ -1,11 +1,13 @@
 #include <filesystem>
+#include <fstream>
 
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/frame/Text.h"
-#include "QVSa/maintenance/BackupLock.h"
-#include "QVSa/maintenance/RotatedKey.h"
+#include "QVSa/maintenance/internal/BackupLock.h"
+#include "QVSa/maintenance/internal/RotatedKey.h"
+#include "QVSa/values/Text.h"
 #include "platform/Files.h"
 #include "platform/SecretMessage.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/support/FakeSession.h"
 #include "tests/support/RecordingProvider.h"
 #include "tests/support/Scene.h"
@@ -193,6 +195,41 @@ TEST(ARotatedKey, BeginsAtTheStartThatIsForcedIntoItsRange) {
   const String all(secrets::rotatedKeyCharacters.begin(), secrets::rotatedKeyCharacters.end());
   const std::pair<Integer, std::size_t> cases[] = {{0, 0}, {3, 3}, {9, 9}, {-1, 0}, {12, 9}};
   for (const auto& [start, first] : cases) EXPECT_EQ(rotatedKey(start), all.substr(first) + all.substr(0, first));
+}
+
+// A host that is not the administrator's hears which file it is; the administrator gets his backup in.
+TEST_F(Backups, ComeBackWhereADatabaseCannotBeRead) {
+  addUser("ann");
+  backUp();
+  const std::filesystem::path& folder = installation_.folder();
+  const auto sysFile = embedded::databaseFile(folder, "QVSys");
+  const std::vector<std::function<void()>> damages{
+      [&] { std::ofstream(sysFile) << String(9000, 'x'); },
+      [&] { std::filesystem::remove(sysFile); },
+      [&] {
+        std::filesystem::copy_file(embedded::databaseFile(folder, "QVApp"), sysFile,
+                                   std::filesystem::copy_options::overwrite_existing);
+      },
+      [&] { embedded::Handle(folder).execute("update QVSys.definitions set text='create tabel' where name='users'"); },
+      [&] { embedded::Handle(folder).execute("update QVSys.engine set layout=99; update QVApp.engine set layout=99"); },
+  };
+  for (const auto& damage : damages) {
+    embedded::discardIdleHandle(folder);
+    damage();
+    User user;
+    user.connect(server());
+    EXPECT_FALSE(user.GetOne(3, "ann"));
+    EXPECT_EQ(user.errNumber(), number::login);
+    EXPECT_NE(user.errDescription().find(sysFile.string()), String::npos) << user.errDescription();
+    EXPECT_FALSE(manager_.BackUpDB(server(), file("other.bak"), file("other2.bak")));
+    EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), "wrong"));
+    EXPECT_EQ(manager_.errDescription(), "Login failed for user 'sa'.:18456");
+    ASSERT_TRUE(restore()) << manager_.errDescription();
+    EXPECT_EQ(loaded("ann").Name(), "Ann");
+  }
+  // What is no longer read is kept, but for what was missing and what was overwritten in place.
+  const auto isKept = [](const auto& entry) { return entry.path().string().find(".replaced-") != String::npos; };
+  EXPECT_GE(std::ranges::count_if(std::filesystem::directory_iterator(folder), isKept), 1);
 }
 
 }  // namespace

@@ -3,7 +3,7 @@
 #include <filesystem>
 
 #include "QVSa/frame/FieldFile.h"
-#include "QVSa/maintenance/BackupLock.h"
+#include "QVSa/maintenance/internal/BackupLock.h"
 #include "platform/Files.h"
 #include "platform/SecretMessage.h"
 #include "tests/support/Failures.h"

@@ -7,7 +7,7 @@
 #include <limits>
 #include <sys/mman.h>
 
-#include "providers/embedded/Pool.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/embedded/ChildProcess.h"
 #include "tests/memory/FailingAllocator.h"
 #include "tests/memory/Operations.h"

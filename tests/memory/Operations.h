@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa::test {
 

@@ -136,6 +136,29 @@ TEST_F(OdbcSession, TellsAStatementsFailureAndGoesOn) {
   EXPECT_EQ(run("insert into t values(1)").affected, 1);
 }
 
+// Behind a deadlock the server has no transaction any more: what is sent next would be committed alone.
+TEST_F(OdbcSession, ADeadlocksVictimTakesNothingButARollback) {
+  const auto native = [](auto action) {
+    try {
+      action();
+    } catch (const Failure& failure) {
+      return failure.native();
+    }
+    return Long{0};
+  };
+  run("create table t(i int)");
+  EXPECT_EQ(native([&] { run("deadlock"); }), 1205);
+  EXPECT_EQ(run("insert into t values(1)").affected, 1) << "outside a transaction there is nothing to lose";
+  session_->begin();
+  run("insert into t values(2)");
+  EXPECT_EQ(native([&] { run("deadlock"); }), 1205);
+  EXPECT_EQ(native([&] { run("insert into t values(3)"); }), 3930);
+  EXPECT_EQ(native([&] { session_->commit(); }), 3930);
+  EXPECT_EQ(native([&] { run("select i from t"); }), 3930);
+  session_->rollback();
+  EXPECT_EQ(texts(*rows("select i from t")), "1 ");
+}
+
 TEST_F(OdbcSession, EndsWithRowsStillOpenAndATransactionToo) {
   session_->begin();
   run("create table t(i int);insert into t values(1),(2)");

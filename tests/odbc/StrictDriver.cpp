@@ -1,5 +1,6 @@
 // SQLite's ODBC driver with the manners of SQL Server's: a batch holds several statements, parted by semicolons, and
-// the connection is busy while rows of a statement wait; N'text' is a text. Functions that are not here the driver
+// the connection is busy while rows of a statement wait; N'text' is a text; the statement "deadlock" fails as one that
+// the server has chosen as a deadlock's victim. Functions that are not here the driver
 // manager finds in SQLite's driver, which this library is linked to. For one connection at a time.
 #include <dlfcn.h>
 #include <map>
@@ -54,6 +55,14 @@ SQLRETURN SQLMoreResults(SQLHSTMT statement) {
 SQLRETURN SQLFetch(SQLHSTMT statement) {
   const SQLRETURN rc = NEXT(SQLFetch)(statement);
   if (rc == SQL_NO_DATA && rest[statement].empty() && busy == statement) busy = SQL_NULL_HSTMT;
+  return rc;
+}
+
+SQLRETURN SQLError(SQLHENV environment, SQLHDBC connection, SQLHSTMT statement, SQLCHAR* state, SQLINTEGER* native,
+                   SQLCHAR* text, SQLSMALLINT size, SQLSMALLINT* length) {
+  const SQLRETURN rc = NEXT(SQLError)(environment, connection, statement, state, native, text, size, length);
+  if (SQL_SUCCEEDED(rc) && std::string(reinterpret_cast<const char*>(text)).find("deadlock") != std::string::npos)
+    *native = 1205;
   return rc;
 }
 

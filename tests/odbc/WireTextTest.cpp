@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/odbc/WireText.h"
 
 namespace QVSa::odbc {

@@ -6,7 +6,7 @@
 #include <openssl/evp.h>
 #include <openssl/provider.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "platform/SecretMessage.h"
 #include "platform/SecretMessageCipher.h"
 #include "tests/support/EnvironmentLocale.h"

@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <chrono>
+#include <cstdlib>
 #include <future>
 #include <random>
 #include <set>
@@ -29,6 +30,26 @@ class Contention : public Scene {
   static void go(std::vector<Worker>& workers) {
     for (Worker& worker : workers) worker.go();
   }
+  // Eight processes guess so often at the password of Ann, whom the third wrong one locks: how many of the guesses were
+  // answered with more than the lock.
+  int guessAtAnn(const String& way, const String& each) {
+    addUser("ann");
+    savePolicy([](safeRule& rule) {
+      rule.lockErr(true);
+      rule.errTimes(3);
+    });
+    auto workers = start(8, "guess", {each, way});
+    go(workers);
+    int told = 0;
+    for (Worker& worker : workers) {
+      const Lines lines = worker.lines();
+      EXPECT_EQ(lines.size(), 1U) << lines.front();
+      told += std::stoi(lines.back().substr(5));
+    }
+    return told;
+  }
+  // With QVSA_LONG_TESTS set, the contention is that of a large installation.
+  static bool isLong() { return std::getenv("QVSA_LONG_TESTS") != nullptr; }
   // The numbers from 1 on, as a rule without prefix issues them on the day of the scene.
   static std::set<String> numbersUpTo(Long last) {
     std::set<String> result;
@@ -39,20 +60,28 @@ class Contention : public Scene {
 };
 
 TEST_F(Contention, AThousandWrongPasswordsFromEightProcessesAreAllCounted) {
-  addUser("ann");
-  savePolicy([](safeRule& rule) {
-    rule.lockErr(true);
-    rule.errTimes(3);
-  });
-  auto workers = start(8, "wrong-passwords", {"125"});
-  go(workers);
-  for (Worker& worker : workers) EXPECT_EQ(worker.lines(), Lines{"done"});
+  guessAtAnn("User", "125");
   EXPECT_EQ(tables_.text("select lgts,accstate from users where userLogin='ann'"), "1000|1");
 
   auto ann = connected<User>();
   EXPECT_FALSE(ann.loginAuth("ann", "right"));
   EXPECT_EQ(ann.errDescription(), "The account has been locked.");
   EXPECT_EQ(tables_.text("select lgts,accstate from users where userLogin='ann'"), "0|1");
+}
+
+TEST_F(Contention, GuessesThatComeAtOnceAreNotAnsweredBeyondTheLimit) {
+  EXPECT_EQ(guessAtAnn("SignOn", isLong() ? "125" : "10"), 2) << "the one that reaches the limit is told of the lock";
+}
+
+TEST_F(Contention, ASignOnOfPeopleIsNotRefusedForTheOthersOfTheMoment) {
+  std::vector<Worker> workers;
+  for (int left = isLong() ? 16 : 6; left > 0; --left) {
+    const String login = "user" + std::to_string(left);
+    addUser(login);
+    workers.push_back(std::move(start(1, "sign-on", {login, isLong() ? "200" : "10"}).front()));
+  }
+  go(workers);
+  for (Worker& worker : workers) EXPECT_EQ(worker.lines(), Lines{"done"});
 }
 
 TEST_F(Contention, NoNumberIsIssuedTwiceAndNoneIsLost) {
@@ -74,6 +103,31 @@ TEST_F(Contention, NoNumberIsIssuedTwiceAndNoneIsLost) {
     EXPECT_EQ(lines.back(), "collisions 0") << "who works on another rule sees nothing of it";
     lines.pop_back();
     EXPECT_EQ(std::set<String>(lines.begin(), lines.end()), numbersUpTo(150));
+  }
+}
+
+// A save widens the rule's row first, and then the numbers, which the issuers hold one after the other.
+TEST_F(Contention, ASaveBesideIssuersWaitsForTheirRowsAndFailsForNothing) {
+  addRule("inv");
+  EXPECT_EQ(connected<IdMgr>().newId("inv"), "2024030700001");
+  auto rule = connected<IdMgr>();
+  ASSERT_TRUE(rule.GetOne("inv"));
+  rule.numPlace(6);
+  auto workers = start(8, "issue", {"inv", "1000000"});
+  go(workers);
+  for (Worker& worker : workers) EXPECT_NE(worker.line(), "");
+  std::chrono::steady_clock::duration longest{0};
+  for (int i = 0; i < 100; ++i) {
+    const auto before = std::chrono::steady_clock::now();
+    EXPECT_TRUE(rule.Save()) << i << ": " << rule.errDescription();
+    longest = std::max(longest, std::chrono::steady_clock::now() - before);
+  }
+  RecordProperty("longestSaveInMilliseconds",
+                 static_cast<int>(std::chrono::duration_cast<std::chrono::milliseconds>(longest).count()));
+  EXPECT_LT(longest, std::chrono::seconds(10));
+  for (Worker& worker : workers) {
+    worker.kill();
+    for (const String& line : worker.lines()) EXPECT_EQ(line.rfind("20240307", 0), 0U) << line;
   }
 }
 
@@ -128,6 +182,9 @@ TEST_F(Contention, WhoHoldsARowIsNotWaitedForAndItsDeathFreesTheRow) {
   auto writer = start(1, "hold", {"inv", "written"});
   go(writer);
   ASSERT_EQ(writer.front().line(), "holding");
+  EXPECT_EQ(rule.newId("inv"), "") << "what is changed and not committed counts as held";
+  EXPECT_EQ(rule.errNumber(), number::integrity);
+  EXPECT_LT(std::chrono::steady_clock::now() - before, std::chrono::seconds(10));
   writer.front().kill();
   EXPECT_EQ(rule.newId("inv"), "2024030700003") << rule.errDescription();
 }

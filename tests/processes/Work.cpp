@@ -23,20 +23,37 @@ std::string failureText(Long errNumber, const String& errDescription) {
   return text.str();
 }
 
-void wrongPasswords(const Words& words) {
-  for (int left = std::stoi(words.at(1)); left > 0; --left) {
-    User ann;
-    ann.connect(words.at(0), "QVApp");
-    const bool refused = !ann.loginAuth("ann", "wrong") &&
-                         (ann.errNumber() == messageNumber(1106) || ann.errNumber() == messageNumber(1118));
-    if (!refused) writeLine(failureText(ann.errNumber(), ann.errDescription()));
-  }
-  writeLine("done");
+// Whether the answer to a guess tells more than that the account is locked.
+template <class Entrance>
+bool tellsMore(Entrance& entrance, bool signedOn) {
+  if (!signedOn && entrance.errNumber() == messageNumber(1118)) return false;
+  if (signedOn || entrance.errNumber() != messageNumber(1106))
+    writeLine(failureText(entrance.errNumber(), entrance.errDescription()));
+  return true;
 }
 
-bool isCollision(const IdMgr& rule) {
-  return rule.errNumber() == number::integrity &&
-         rule.errDescription().rfind("Error in creating new table ID.", 0) == 0;
+void guess(const Words& words) {
+  int told = 0;
+  for (int left = std::stoi(words.at(1)); left > 0; --left) {
+    User user;
+    SignOn entrance;
+    user.connect(words.at(0), "QVApp");
+    entrance.connect(words.at(0), "QVApp");
+    const bool more = words.at(2) == "User" ? tellsMore(user, user.loginAuth("ann", "wrong"))
+                                            : tellsMore(entrance, entrance.signOn("ann", "wrong"));
+    if (more) ++told;
+  }
+  writeLine("told " + std::to_string(told));
+}
+
+void signOn(const Words& words) {
+  for (int left = std::stoi(words.at(2)); left > 0; --left) {
+    SignOn entrance;
+    entrance.connect(words.at(0), "QVApp");
+    if (!entrance.signOn(words.at(1), "right") || entrance.sessionId().empty())
+      writeLine(failureText(entrance.errNumber(), entrance.errDescription()));
+  }
+  writeLine("done");
 }
 
 void issue(const Words& words) {
@@ -48,7 +65,7 @@ void issue(const Words& words) {
     if (!number.empty()) {
       writeLine(number);
       --left;
-    } else if (isCollision(rule)) {
+    } else if (isCollision(rule.errNumber(), rule.errDescription())) {
       ++collisions;
     } else {
       writeLine(failureText(rule.errNumber(), rule.errDescription()));
@@ -140,7 +157,8 @@ int doWork(const Words& words) {
   const FakeClock clock(Date(2024, 3, 7, 10, 0, 0));
   std::cin.get();
   const Words arguments(words.begin() + 1, words.end());
-  if (words.at(0) == "wrong-passwords") wrongPasswords(arguments);
+  if (words.at(0) == "sign-on") signOn(arguments);
+  if (words.at(0) == "guess") guess(arguments);
   if (words.at(0) == "issue") issue(arguments);
   if (words.at(0) == "hold") hold(arguments);
   if (words.at(0) == "restore") restore(arguments);

@@ -6,8 +6,10 @@
 namespace QVSa::test {
 
 // What a worker does. All begin when their standard input ends, live on 7 March 2024, and write lines:
-//   wrong-passwords SERVER COUNT    signs Ann on with a wrong password; a line for each other answer than the two
-//                                   right ones, then "done"
+//   sign-on SERVER LOGIN COUNT      signs the user on with the right password so many times, as a host of people does;
+//                                   a line for each refusal, then "done"
+//   guess SERVER COUNT WAY          signs Ann on with a wrong password by User or by SignOn; a line for each other
+//                                   answer than the two right ones, then "told" and how often it was not the lock
 //   issue SERVER RULE COUNT         asks for numbers until it has so many: a line for each, one with "collisions" and
 //                                   their count at the end, and one for each failure that is no clean collision
 //   hold SERVER RULE [written]      locks the rule's row as an issuer does, or has written to it too, without a

@@ -2,10 +2,10 @@
 #include <gtest/gtest.h>
 #include <set>
 
-#include "QVSa/frame/Failure.h"
-#include "QVSa/frame/Text.h"
-#include "QVSa/resources/MessageTable.h"
 #include "QVSa/resources/Messages.h"
+#include "QVSa/resources/internal/MessageTable.h"
+#include "QVSa/values/Failure.h"
+#include "QVSa/values/Text.h"
 #include "platform/SecretMessage.h"
 #include "tests/support/EnvironmentLocale.h"
 

@@ -1,7 +1,7 @@
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/Text.h"
 #include "QVSa/identity/User.h"
 #include "QVSa/settings/Home.h"
+#include "QVSa/values/Text.h"
 #include "platform/SecretMessage.h"
 #include "tests/support/SettingsScene.h"
 

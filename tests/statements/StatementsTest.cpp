@@ -3,9 +3,9 @@
 #include <map>
 #include <regex>
 
-#include "QVSa/frame/Text.h"
+#include "QVSa/values/Text.h"
 #include "platform/Services.h"
-#include "providers/embedded/Pool.h"
+#include "providers/embedded/storage/Pool.h"
 #include "tests/faults/Operations.h"
 #include "tests/support/EnvironmentLocale.h"
 #include "tests/support/FakeClock.h"

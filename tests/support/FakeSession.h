@@ -2,7 +2,7 @@
 
 #include <map>
 
-#include "QVSa/frame/Providers.h"
+#include "QVSa/frame/internal/Providers.h"
 
 namespace QVSa::test {
 

@@ -3,7 +3,7 @@
 #include <functional>
 #include <optional>
 
-#include "QVSa/frame/Providers.h"
+#include "QVSa/frame/internal/Providers.h"
 
 namespace QVSa::test {
 

@@ -3,7 +3,7 @@
 #include <memory>
 #include <sys/types.h>
 
-#include "QVSa/frame/Values.h"
+#include "QVSa/values/Values.h"
 #include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {

@@ -5,7 +5,7 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "database/Scripts.h"
-#include "providers/embedded/Installation.h"
+#include "providers/Installation.h"
 
 namespace QVSa::test {
 

@@ -194,6 +194,19 @@ TEST_F(LogQueries, TheListsPartsAreFoundAnywhere) {
   EXPECT_EQ(foundBy(query(never, never, "", "x", "tock", "tw")), "b");
 }
 
+TEST_F(LogQueries, AListMayHaveThousandsOfParts) {
+  const String columns = ",UserName,UserLogin,rtId";
+  write("a", "20240305 03:00", columns, ",'Ann','user7x','t1'");
+  write("b", "20240305 02:00", columns, ",'Bob','user1999x','t1'");
+  write("c", "20240305 01:00", columns, ",'Cid','user1998x','t2'");
+  String users, templates = "Sales";
+  for (int i = 0; i < 2000; ++i) {
+    users += (i == 0 ? "user" : ",user") + std::to_string(i) + "x";
+    templates += ",template" + std::to_string(i);
+  }
+  EXPECT_EQ(foundBy(query(never, never, "", users.c_str(), templates.c_str())), "a b");
+}
+
 TEST_F(LogQueries, AListThatBeginsWithACommaFailsAtTheServer) {
   write("a", "20240305");
   for (const auto& values : {query(never, never, "", ",bob"), query(never, never, "", "", ",bob")}) {

@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/tsql/Lexer.h"
 
 namespace QVSa::tsql {
@@ -91,7 +91,7 @@ TEST(Lexer, refuses_what_does_not_end_or_begin) {
 
 TEST(Shape, leaves_out_values_case_and_blanks) {
   EXPECT_EQ(shape("select A from t where x='a' and y in (1,2)"),
-            shape("SELECT  a FROM t\nWHERE x=N'b''c' and y in(-7)"));
+            shape("SELECT  a FROM t\nWHERE x='b''c' and y in(-7)"));
   EXPECT_EQ(shape("select top 5 a from t"), shape("select top 0 a from t"));
   EXPECT_EQ(shape("select dateadd(day,1,x)"), shape("select dateadd(day,2,x)"));
 }
@@ -104,6 +104,10 @@ TEST(Shape, tells_kinds_of_literals_apart) {
   EXPECT_NE(shape("x in (1)"), shape("x in ('1')"));
   EXPECT_NE(shape("x in (1,'1')"), shape("x in (1,1.5)"));
   EXPECT_EQ(shape("x in (1,'1')"), shape("x in ('1',1,2)"));
+  EXPECT_NE(shape("select 'a'"), shape("select N'a'"));
+  EXPECT_NE(shape("select 1.5"), shape("select 1.25"));
+  EXPECT_EQ(shape("select 1.5"), shape("select 02.7"));
+  EXPECT_NE(shape("x in (1.5,2)"), shape("x in (1.25,2)"));
   EXPECT_NE(shape("select [select]"), shape("select select"));
   EXPECT_NE(shape("select [a]] , [b]"), shape("select [a] , [b]"));
 }

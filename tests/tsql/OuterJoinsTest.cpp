@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/tsql/OuterJoins.h"
 #include "tests/tsql/TreeText.h"
 

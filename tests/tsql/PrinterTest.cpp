@@ -3,7 +3,7 @@
 #include <gtest/gtest.h>
 #include <sstream>
 
-#include "QVSa/frame/Failure.h"
+#include "QVSa/values/Failure.h"
 #include "providers/tsql/OuterJoins.h"
 #include "providers/tsql/Printer.h"
 #include "tests/tsql/TreeText.h"

@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "providers/tsql/SqlFailure.h"
+#include "QVSa/values/Failure.h"
 #include "tests/tsql/TreeText.h"
 
 namespace QVSa::tsql {
@@ -108,18 +108,6 @@ TEST(Refusal, ends_what_is_nested_too_deeply_before_the_stack_does) {
   EXPECT_EQ(number("select 1 from a" + repeated(" cross join a", many)), 106);
   EXPECT_EQ(number("select 1 from " + repeated("a join ", many)), 191);
   EXPECT_EQ(number("select " + repeated("(", 150) + "1" + repeated(")", 150)), 0);
-}
-
-TEST(SqlFailure, gives_callers_the_number_of_the_cause) {
-  EXPECT_EQ(failureNumber(2627), number::integrity);
-  EXPECT_EQ(failureNumber(208), number::noTable);
-  EXPECT_EQ(failureNumber(295), number::conversion);
-  EXPECT_EQ(failureNumber(2628), number::range);
-  EXPECT_EQ(failureNumber(229), number::permission);
-  EXPECT_EQ(failureNumber(18456), number::login);
-  EXPECT_EQ(failureNumber(1205), number::general);
-  EXPECT_EQ(failureNumber(536), number::statement);
-  EXPECT_EQ(sqlFailure(102, "Incorrect syntax near 'x'.").number(), number::statement);
 }
 
 }  // namespace

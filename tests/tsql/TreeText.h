@@ -39,7 +39,10 @@ inline String treeOf(const Token& token) {
   return token.kind == TokenKind::string ? "'" + text + "'" : text;
 }
 
-inline String treeOf(const WhenBranch& branch) { return treeOf(branch.when) + "=>" + treeOf(branch.then); }
+inline String treeOf(const WhenBranch& branch) {
+  const String opening = branch.inElse ? "case " + treeOf(branch.operand) + " " : "";
+  return opening + treeOf(branch.when) + "=>" + treeOf(branch.then);
+}
 
 inline String headOf(const Expression& expression) {
   using Kind = Expression::Kind;
@@ -67,8 +70,16 @@ inline String headOf(const Expression& expression) {
   }
 }
 
+inline String chainOf(const Expression& chain) {
+  String text = treeOf(chain.operands[0]);
+  for (std::size_t i = 1; i < chain.operands.size(); ++i)
+    text = "(" + chain.op.substr(i - 1, 1) + " " + text + " " + treeOf(chain.operands[i]) + ")";
+  return text;
+}
+
 inline String treeOf(const Expression& expression) {
   using Kind = Expression::Kind;
+  if (expression.kind == Kind::binary) return chainOf(expression);
   if (expression.kind == Kind::null) return "null";
   if (expression.kind == Kind::literal || expression.kind == Kind::list) return treeOf(expression.token);
   if (expression.kind == Kind::column) return dotted(expression.qualifier, expression.name);

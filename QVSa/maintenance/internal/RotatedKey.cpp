@@ -1,0 +1,16 @@
+#include "QVSa/maintenance/internal/RotatedKey.h"
+
+#include <algorithm>
+
+#include "QVSa/frame/DeploymentSecrets.h"
+
+namespace QVSa {
+
+String rotatedKey(Integer start) {
+  const auto& characters = secrets::rotatedKeyCharacters;
+  const auto first = characters.begin() + std::clamp<std::ptrdiff_t>(start, 0, std::ssize(characters) - 1);
+  String key(first, characters.end());
+  return key.append(characters.begin(), first);
+}
+
+}  // namespace QVSa
