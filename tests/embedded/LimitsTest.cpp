@@ -1,6 +1,7 @@
 // How long and how deep a statement may be: what is too much has a number of SQL Server, and nothing costs more than
 // its length.
 
+#include <ctime>
 #include <gtest/gtest.h>
 
 #include "QVSa/frame/ConnectionString.h"
@@ -14,7 +15,6 @@ namespace QVSa::test {
 namespace {
 
 using std::chrono::seconds;
-using std::chrono::steady_clock;
 
 std::string repeated(const std::string& text, std::size_t times) {
   std::string whole;
@@ -147,15 +147,15 @@ TEST_F(Limits, WhatIsTooManyIsRefusedByItsNumber) {
 
 // 400,000 literals took 26 s once, 20,000 branches 14 s.
 TEST_F(Limits, LiteralsCostTheirLengthAndTheTimeLimitHolds) {
-  const auto start = steady_clock::now();
+  const std::clock_t start = std::clock();
   EXPECT_EQ(answer("select count(*) from t where id in (" + numbered("#", ",", 400000) + ")"), "2");
   EXPECT_EQ(answer(repeated("select 1 where 'a'='b'\n", 20000)), "none");
   EXPECT_EQ(answer("select case a " + numbered("when # then 'x'", " ", 9000) + " end from t"), "x");
-  EXPECT_LT(steady_clock::now() - start, seconds(15));
+  EXPECT_LT((std::clock() - start) / CLOCKS_PER_SEC, 15);
 }
 
 TEST_F(Limits, TheTimeLimitHoldsBeforeAStatementRuns) {
-  const tsql::Deadline passed(steady_clock::now());
+  const tsql::Deadline passed(std::chrono::steady_clock::now());
   const std::string batch = numbered("select # where 1=1", "\n", 500);
   EXPECT_EQ(failureOf([&] { tsql::tokenize(batch, passed); }), number::timeout);
   EXPECT_EQ(failureOf([&] { tsql::parse(tsql::tokenize(batch), passed); }), number::timeout);
@@ -164,7 +164,7 @@ TEST_F(Limits, TheTimeLimitHoldsBeforeAStatementRuns) {
   std::string answered = "none";
   for (int i = 0; i < 25 && answered == "none"; ++i) {
     const std::string before = "select id from v" + std::to_string(i);
-    answered = answer("create view v" + std::to_string(i + 1) + " as " + before + " union all " + before);
+    answered = answer("create view v" + std::to_string(i + 1) + " as " + before + " union all " + before, 300);
   }
   EXPECT_EQ(answered, "fails 8623");
 }

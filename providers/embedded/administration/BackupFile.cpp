@@ -93,9 +93,10 @@ int BackupFile::markOfDatabase() { return wholeNumber(read("pragma user_version"
 
 void BackupFile::check() {
   checkSum();
-  const auto isWhole = [this] { return read("pragma integrity_check(1)") == "ok"; };
   // To SQLite a page that it has no memory for is damage, too. Such damage is not found twice.
-  if (!isWhole() && !isWhole()) refuse("Its structure is damaged.");
+  bool isWhole = false;
+  for (int look = 0; look < 2 && !isWhole; ++look) isWhole = read("pragma integrity_check(1)") == "ok";
+  if (!isWhole) refuse("Its structure is damaged.");
   checkDefinitions();
   if (!isSummed())
     platform::services().eventLog("The backup '" + path_ +

@@ -255,6 +255,7 @@ std::int64_t Handle::schemaVersion() {
   std::int64_t version = 0;
   if (schemas_.empty()) {
     std::vector<Prepared> schemas;
+    schemas.reserve(databaseNames.size());
     for (const char* database : databaseNames)
       schemas.emplace_back(handle_, std::string("pragma ") + database + ".schema_version");
     schemas_ = std::move(schemas);
