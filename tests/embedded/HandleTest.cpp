@@ -163,18 +163,6 @@ TEST_F(HandleOfAnInstallation, AnotherUserWithoutRightsGetsAClearFailureAndTheDa
   EXPECT_EQ(count(handle, "QVSys.t where y='kept'"), 1);
 }
 
-TEST_F(HandleOfAnInstallation, WithoutRoomTheStatementFailsAndTheDataStays) {
-  fillTable();
-  Handle handle(folder_.data());
-  Prepared limit(handle.get(), "pragma QVSys.max_page_count=20");
-  limit.step();
-  limit.reset();
-  const Failure failure = failureOf([&] { handle.execute("insert into QVSys.t values(2,hex(zeroblob(200000)))"); });
-  EXPECT_EQ(failure.native(), 1105);
-  EXPECT_EQ(count(handle, "QVSys.t"), 1);
-  handle.execute("insert into QVSys.t values(3,'small')");
-}
-
 TEST_F(HandleOfAnInstallation, BrokenRulesOfATableHaveSqlServersNumbers) {
   Handle handle(folder_.data());
   handle.execute(

@@ -105,6 +105,7 @@ TEST_F(Limits, WhatIsNestedTooDeeplyIsRefusedByItsNumber) {
       {"case when a=1 then 0 when a=2 then ", "1", " else 3 end", 10, "select ", " from t"},
       {"case when a=", "1", " then 1 end", 10, "select ", " from t"},
       {"1+(1-", "1", ")", 14},
+      {"- ", "1", "", 14},
       {"1.5*(2.5/", "1", ")", 14},
       {"not (", "1=1", ")", 28, "select 1 where "},
       {"1=1 and (1=0 or ", "1=1", ")", 12, "select 1 where "},
@@ -115,18 +116,21 @@ TEST_F(Limits, WhatIsNestedTooDeeplyIsRefusedByItsNumber) {
       {"(select * from t union all select * from ", "t", ") as d", 10, "select * from "},
       {"(select x.id from t x join ", "t", " y on x.id=y.id) ", 8, "select 1 from t left join ", " z on t.id=z.id"},
   };
+  constexpr std::size_t endless = 20000;
   for (const Nest& nest : nests) {
+    const auto answerAt = [&](std::size_t times) {
+      return answer(nest.before + repeated(nest.open, times) + nest.inner + repeated(nest.close, times) + nest.behind);
+    };
     int taken = 0;
     for (int depth = 1; depth <= 120; depth += taken == depth ? 1 : 9) {
-      const auto times = static_cast<std::size_t>(depth);
-      const std::string answered =
-          answer(nest.before + repeated(nest.open, times) + nest.inner + repeated(nest.close, times) + nest.behind);
+      const std::string answered = answerAt(static_cast<std::size_t>(depth));
       if (answered.starts_with("fails"))
         EXPECT_EQ(answered, "fails 191") << depth << ": " << nest.open;
       else
         taken = depth;
     }
     EXPECT_GE(taken, nest.least) << nest.open;
+    EXPECT_EQ(answerAt(endless), "fails 191") << nest.open;
   }
 }
 

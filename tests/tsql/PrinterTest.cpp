@@ -75,7 +75,7 @@ TEST(Printer, prints_what_the_system_sends_so_that_it_reads_the_same) {
 }
 
 TEST(Printer, prints_the_database_scripts_so_that_they_read_the_same) {
-  for (const char* name : {"QVSys.sql", "QVApp.sql", "QVUpdate.sql"}) {
+  for (const char* name : {"QVSys.sql", "QVSys.2.sql", "QVApp.sql", "QVUpdate.sql"}) {
     std::ostringstream script;
     script << std::ifstream(kSources / "database" / name).rdbuf();
     const auto batches = splitScript(script.str());
