@@ -117,7 +117,7 @@ TEST_F(Passwords, ThatDoNotDecryptOpenNothingAndAreKept) {
   }
   auto user = loaded("ann");
   user.Pwd("");
-  EXPECT_TRUE(user.Save(true));
+  EXPECT_TRUE(user.Save()) << "nor do those of the history, which so are not the empty one";
   EXPECT_TRUE(user.loginAuth("ann", "")) << "set, and so the empty one";
 }
 

@@ -92,7 +92,7 @@ TEST_F(SignOn, IsAnsweredByTheFirstOfItsRefusals) {
   }
   EXPECT_EQ(tables_.text("select count(*) from seslog"), "0");
 
-  changeAnn("lgts=2,pwdDate='20240207'");
+  changeAnn("lgts=5,pwdDate='20240207'");
   EXPECT_TRUE(signOn());
   EXPECT_EQ(user_.errNumber(), 0);
   EXPECT_EQ(session_, "240307000001");
@@ -112,6 +112,7 @@ TEST_F(SignOn, AWrongPasswordCountsAlsoOnAComputerThatIsNotPermitted) {
 
 TEST_F(SignOn, ALockLastsUntilTheUserIsSavedOrThePolicyLocksNoMore) {
   expectRefused({.password = "wrong"}, 1106);
+  EXPECT_EQ(user_.Name(), "") << "the record is emptied";
   expectRefused({.password = "wrong"}, 1106);
   expectRefused({.password = "wrong"}, 1118);
   expectRefused({}, 1118);

@@ -14,33 +14,40 @@ class UserRecord : public test::Scene {
 };
 
 TEST_F(UserRecord, WhatASaveWroteALoadFinds) {
-  addUser("ann", [](User& user) {
-    user.Name("Ann O'Hara");
-    user.MobilePhone("1");
-    user.Email("ann@example.com");
-    user.company("Firm");
-    user.Address("Street");
-    user.zipcode("2");
-    user.telePhone("3");
-    user.ipList("10.0.0.*");
-    user.OTPTokenId("token");
-    user.sendSms(true);
-    user.keyLogin(true);
-    user.isOuter(true);
-    user.synLogin(true);
-    user.PwdNoChange(true);
-    user.useOTPAuth(true);
-    user.setJobs("2,3,99");
-    user.grpName("two");
-  });
-  auto ann = connected<User>();
-  ASSERT_TRUE(ann.GetOne(2, "ann o'hara"));
-  EXPECT_EQ(ann.Login(), "ann");
-  EXPECT_EQ(ann.MobilePhone() + ann.Email() + ann.company() + ann.Address() + ann.zipcode() + ann.telePhone(),
-            "1ann@example.comFirmStreet23");
-  EXPECT_EQ(ann.ipList() + ann.OTPTokenId(), "10.0.0.*token");
-  EXPECT_TRUE(ann.sendSms() && ann.keyLogin() && ann.isOuter() && ann.synLogin() && ann.PwdNoChange() &&
-              ann.useOTPAuth());
+  const struct {
+    String (User::*get)() const;
+    void (User::*set)(String);
+  } texts[] = {{&User::Name, &User::Name},
+               {&User::MobilePhone, &User::MobilePhone},
+               {&User::Email, &User::Email},
+               {&User::company, &User::company},
+               {&User::Address, &User::Address},
+               {&User::zipcode, &User::zipcode},
+               {&User::telePhone, &User::telePhone},
+               {&User::ipList, &User::ipList},
+               {&User::OTPTokenId, &User::OTPTokenId},
+               {&User::dn, &User::dn}};
+  const struct {
+    Boolean (User::*get)() const;
+    void (User::*set)(Boolean);
+  } flags[] = {{&User::sendSms, &User::sendSms},       {&User::keyLogin, &User::keyLogin},
+               {&User::isOuter, &User::isOuter},       {&User::synLogin, &User::synLogin},
+               {&User::useOTPAuth, &User::useOTPAuth}, {&User::PwdNoChange, &User::PwdNoChange}};
+  User ann = connected<User>();
+  ann.Login("ann");
+  for (const String& mark : {String("d'A"), String("second ")}) {
+    const bool isFirst = mark == "d'A";
+    for (std::size_t i = 0; i < std::size(texts); ++i) (ann.*texts[i].set)(mark + text(static_cast<Long>(i)));
+    for (const auto& flag : flags) (ann.*flag.set)(isFirst);
+    ann.setJobs("2,3,99");
+    ann.grpName("two");
+    ASSERT_TRUE(ann.Save(true)) << ann.errDescription();
+    ann = loaded("ann");
+    for (std::size_t i = 0; i < std::size(texts); ++i)
+      EXPECT_EQ((ann.*texts[i].get)(), mark + text(static_cast<Long>(i)));
+    for (const auto& flag : flags) EXPECT_EQ((ann.*flag.get)(), isFirst) << &flag - flags;
+  }
+  ASSERT_TRUE(ann.GetOne(2, "SECOND 0"));
   EXPECT_EQ(ann.deptId(), "_root") << "nobody is without a department";
   EXPECT_TRUE(ann.isDesigner() && ann.isOwner());
   EXPECT_FALSE(ann.isAdministrator() || ann.isDeptadmin());

@@ -71,6 +71,7 @@ TEST_F(BackupPlans, AreStoredAndLoadedAgain) {
   EXPECT_EQ(tables_.text("select delOld from QVBkPlan"), "-1");
   saved("weekly");
 
+  tables_.run("update tasks set startTime='20240307 10:30' where taskName='nightly'");
   BKPlan found = connected<BKPlan>();
   for (const auto& [key, value] : {std::pair<Integer, String>{1, "1"}, {2, "NIGHTLY"}, {0, ""}}) {
     ASSERT_TRUE(found.GetOne(key, value)) << found.errDescription();
@@ -80,7 +81,7 @@ TEST_F(BackupPlans, AreStoredAndLoadedAgain) {
     EXPECT_EQ(found.delNum() * 10 + found.delUnit(), 32);
     cSchedule& when = *found.schedule();
     EXPECT_EQ(when.wks(), "1010000");
-    EXPECT_EQ(when.StartTime(), *Date::parse("10:30")) << "the day that the column adds is cut";
+    EXPECT_EQ(when.StartTime(), *Date::parse("10:30")) << "a stored day is cut";
     EXPECT_EQ(when.cycle() * 1000 + when.cycleNum() * 100 + when.monthDay() * 10 + when.interval(), 1245);
     EXPECT_EQ(when.valUnit() + when.timesOneDay(), 2);
   }

@@ -1,35 +1,15 @@
+#include "tests/organisation/Company.h"
 #include "tests/support/FakeSession.h"
 #include "tests/support/RecordingProvider.h"
-#include "tests/support/Scene.h"
 
 namespace QVSa {
 namespace {
 
 using test::Lines;
 
-// Sales (3) with East (4) and in that Hub (5); Overseas (6).
-class DepartmentTree : public test::Scene {
+// Sales has the inner id 3, East 4, Hub 5 and Works 6.
+class DepartmentTree : public test::Company {
  protected:
-  DepartmentTree() {
-    add("S", "Sales", "_root");
-    add("E", "East", "S");
-    add("H", "Hub", "E");
-    add("O", "Overseas", "_root");
-  }
-
-  void add(const String& id, const String& name, const String& super) {
-    auto department = connected<Department>();
-    department.Id(id);
-    department.Name(name);
-    department.Super(super);
-    ASSERT_TRUE(department.Save()) << department.errDescription();
-    EXPECT_EQ(department.fullId(), "") << "the path comes with the next load";
-  }
-  Department department(const String& id) {
-    auto result = connected<Department>();
-    EXPECT_TRUE(result.GetOne(1, id)) << result.errDescription();
-    return result;
-  }
   void change(const String& id, const std::function<void(Department&)>& change) {
     Department changed = department(id);
     change(changed);
@@ -48,8 +28,8 @@ class DepartmentTree : public test::Scene {
 };
 
 TEST_F(DepartmentTree, GrowsWithPathsAndFullNamesThatLeaveOutTheRoot) {
-  add("T", " Top ", "");
-  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|.1.3.4.|Sales-East", "H|.1.3.4.5.|Sales-East-Hub", "O|.1.6.|Overseas",
+  addDepartment("T", " Top ", "");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|.1.3.4.|Sales-East", "H|.1.3.4.5.|Sales-East-Hub", "W|.1.6.|Works",
                            "T|.7.|Top"}));
   const Department hub = department("h");
   EXPECT_EQ(hub.InnerId(), 5);
@@ -62,13 +42,11 @@ TEST_F(DepartmentTree, GrowsWithPathsAndFullNamesThatLeaveOutTheRoot) {
 }
 
 TEST_F(DepartmentTree, AMoveOrANewNameGoesThroughAllThatLiesBelow) {
-  move("E", "O");
-  EXPECT_EQ(tree(),
-            (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Overseas-East", "H|.1.6.4.5.|Overseas-East-Hub", "O|.1.6.|Overseas"}));
+  move("E", "W");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Works-East", "H|.1.6.4.5.|Works-East-Hub", "W|.1.6.|Works"}));
   EXPECT_EQ(tables_.text("select superDept from departments where deptNo='E'"), "6");
   change("E", [](Department& east) { east.Name("West"); });
-  EXPECT_EQ(tree(),
-            (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Overseas-West", "H|.1.6.4.5.|Overseas-West-Hub", "O|.1.6.|Overseas"}));
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|.1.6.4.|Works-West", "H|.1.6.4.5.|Works-West-Hub", "W|.1.6.|Works"}));
   move("E", "");
   EXPECT_EQ(tree()[1], "E|.4.|West");
   EXPECT_EQ(tree()[2], "H|.4.5.|West-Hub");
@@ -79,7 +57,7 @@ TEST_F(DepartmentTree, AMoveOrANewNameGoesThroughAllThatLiesBelow) {
 TEST_F(DepartmentTree, AMoveBelowItselfIsNotRefused) {
   move("S", "H");
   EXPECT_EQ(tree(), (Lines{"S|.1.3.4.5.3.|Sales-East-Hub-Sales", "E|.1.3.4.5.3.4.|Sales-East-Hub-Sales-East",
-                           "H|.1.3.4.5.3.4.5.|Sales-East-Hub-Sales-East-Hub", "O|.1.6.|Overseas"}));
+                           "H|.1.3.4.5.3.4.5.|Sales-East-Hub-Sales-East-Hub", "W|.1.6.|Works"}));
 }
 
 TEST_F(DepartmentTree, ARefusedSaveChangesNothing) {
@@ -107,15 +85,15 @@ TEST_F(DepartmentTree, WhetherItIsForOutsidersIsWrittenOnce) {
   EXPECT_EQ(tables_.text("select isOuter,isOrg from departments where deptNo='E'"), "0|1");
   EXPECT_EQ(department("H").Org(), "E");
   EXPECT_EQ(department("E").Org(), "E");
-  EXPECT_EQ(department("O").Org(), "_root");
+  EXPECT_EQ(department("W").Org(), "_root");
 }
 
 TEST_F(DepartmentTree, NullsInTheColumnsOfTheTree) {
-  tables_.run("update departments set superDept=null where deptNo='O'");
-  EXPECT_TRUE(department("O").isOrg()) << "nothing above it";
-  tables_.run("update departments set isOrg=null where deptNo='O'");
-  EXPECT_FALSE(department("O").isOrg());
-  EXPECT_EQ(department("O").Super(), "");
+  tables_.run("update departments set superDept=null where deptNo='W'");
+  EXPECT_TRUE(department("W").isOrg()) << "nothing above it";
+  tables_.run("update departments set isOrg=null where deptNo='W'");
+  EXPECT_FALSE(department("W").isOrg());
+  EXPECT_EQ(department("W").Super(), "");
 
   tables_.run("update departments set path=null where deptNo='E'");
   auto east = connected<Department>();
@@ -124,10 +102,10 @@ TEST_F(DepartmentTree, NullsInTheColumnsOfTheTree) {
   EXPECT_EQ(east.Name(), "East") << "the fields are there";
   expectRefused(east, east.GetOne(1, "nowhere"), 1001);
   EXPECT_EQ(east.Org(), "_root");
-  add("N", "New", "E");
+  addDepartment("N", "New", "E");
   EXPECT_EQ(tree().back(), "N|7.|Sales-East-New");
   tables_.run("update departments set fullName=null where deptNo='E'");
-  add("M", "More", "E");
+  addDepartment("M", "More", "E");
   EXPECT_EQ(tree().back(), "M|8.|");
 }
 
@@ -150,18 +128,18 @@ TEST_F(DepartmentTree, ADepartmentWithoutAPathIsSavedAloneAndGetsItsPath) {
   EXPECT_EQ(tree(), expected);
 
   // Below one without a path it can be no better off, but it can be moved away again with all that it has below it.
-  tables_.run("update departments set path=null where deptNo='O'");
-  move("E", "O");
-  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|4.|Overseas-East", "H|4.5.|Overseas-East-Hub", "O|-|Overseas",
-                           "N|4.7.|Overseas-East-Newer"}));
+  tables_.run("update departments set path=null where deptNo='W'");
+  move("E", "W");
+  EXPECT_EQ(tree(), (Lines{"S|.1.3.|Sales", "E|4.|Works-East", "H|4.5.|Works-East-Hub", "W|-|Works",
+                           "N|4.7.|Works-East-Newer"}));
   move("E", "S");
-  expected[3] = "O|-|Overseas";
+  expected[3] = "W|-|Works";
   EXPECT_EQ(tree(), expected);
 }
 
 TEST_F(DepartmentTree, ADeleteIsRefusedWhileSomebodyIsLeftAndTakesTheJobs) {
-  addUser("ann", [](User& user) { user.deptId("E"); });
-  addUser("ben", [](User& user) { user.deptId("H"); });
+  addUser("ann", "E");
+  addUser("ben", "H");
   auto subject = connected<Department>();
   expectRefused(subject, subject.Delete("nowhere"), 1001);
   expectRefused(subject, subject.Delete("E"), 1004);

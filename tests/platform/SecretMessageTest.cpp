@@ -198,6 +198,14 @@ TEST(SecretMessage, WithAnyByteOfItsStructureChangedIsRefusedOrRead) {
 
   ASSERT_EQ(decryptText(encode(der), secret), greeting);
   const auto content = std::search(der.begin(), der.end(), shortIv.begin(), shortIv.end());
+  const Bytes arc = fromHex("2b0601040182375803");  // both types begin with it
+  int types = 0;
+  for (auto at = der.begin(); (at = std::search(at, content, arc.begin(), arc.end())) != content; ++at, ++types) {
+    Bytes other = der;
+    ++other[static_cast<std::size_t>(at - der.begin()) + 7];
+    EXPECT_EQ(decryptText(encode(other), secret), "") << "a type that is not looked at";
+  }
+  EXPECT_EQ(types, 2);
   for (auto at = der.begin(); at != der.end(); ++at) {
     EXPECT_EQ(decryptText(encode(Bytes(der.begin(), at)), secret), "");
     const std::uint8_t kept = *at;
