@@ -72,7 +72,7 @@ Boolean User::GetOne(Integer keyName, const Variant& keyValue, Boolean chkPwd, c
     findOrganisation(connection, residence);
     if (chkPwd && !testPassword(connection, Pwd, wrongPwd, authLd)) return false;
     readRoles(connection);
-    readGroups(connection);
+    readGroups(connection, "itemGroups");
     isUser_ = isStored_ = true;
     return true;
   });
@@ -95,36 +95,16 @@ void User::clearRoles() {
 
 void User::read(Recordset& row) {
   Id_ = row["userId"].asLong();
-  Name_ = row["userName"].asText();
-  Login_ = row["userLogin"].asText();
+  readAccount(row);
+  readFurther(row);
   storedName_ = Name_;
   Pwd_ = StoredPassword::read(row["userPwd"].asText(), storedName_);
-  MobilePhone_ = row["mobilePhone"].asText();
-  Email_ = row["email"].asText();
   builtIn_ = row["isAbstract"].isOne();
   deptInnerId_ = row["deptId"].asLong();
-  sendSms_ = row["useSms"].isOne();
-  keyLogin_ = row["useKey"].isOne();
   regState_ = row["accstate"].asInteger();
   pwdDate_ = row["pwdDate"].asDate();
   lgts_ = row["lgts"].asLong();
-  uType_ = row["uType"].asInteger();
-  Domain_ = row["domain"].asText();
-  deptName_ = row["deptName"].asText();
-  deptFullName_ = row["fullName"].asText();
   deptId_ = row["deptNo"].asText();
-  company_ = row["company"].asText();
-  Address_ = row["address"].asText();
-  zipcode_ = row["zipcode"].asText();
-  telePhone_ = row["telephone"].asText();
-  isOuter_ = row["isouter"].isOne();
-  ldsName_ = row["ldsName"].asText();
-  dn_ = row["ldDn"].asText();
-  ipList_ = row["ipList"].asText();
-  synLogin_ = row["synLogin"].isOne();
-  PwdNoChange_ = row["PwdNoChange"].isOne();
-  useOTPAuth_ = row["useOTPAuth"].isOne();
-  OTPTokenId_ = row["OTPTokenId"].asText();
 }
 
 void User::findOrganisation(Connection& connection, const Residence& residence) {
@@ -165,12 +145,12 @@ void User::readRoles(Connection& connection) {
   }
 }
 
-void User::readGroups(Connection& connection) {
+void User::readGroups(Connection& connection, const String& table) {
   std::vector<String> names;
-  Recordset row = connection.Execute(
-      "select g.gName from itemGroups g,grpUser x"
-      " where x.userId=" +
-      text(Id_) + " and x.gId=g.gId");
+  Recordset row = connection.Execute("select g.gName from " + table +
+                                     " g,grpUser x"
+                                     " where x.userId=" +
+                                     text(Id_) + " and x.gId=g.gId");
   for (; !row.EOF_(); row.MoveNext()) names.push_back(row["gName"].asText());
   grpName_ = join(names, ",");
 }

@@ -172,14 +172,24 @@ class User : private Frame {
  private:
   friend class Users;
 
+  struct Column;
+  static const Column accountColumns[];
+  static const Column furtherColumns[];
   struct Residence;
 
   void clearRecord();
   void clearRoles();
   void read(Recordset& row);
+  // What the row of a list holds as well, and what of it is the user's own.
+  void readAccount(Recordset& row);
+  void readFurther(Recordset& row);
+  void readColumn(const Column& column, const Field& field);
+  Statement withColumns(Statement statement) const;
+  void fillColumn(Statement& statement, const Column& column) const;
   void findOrganisation(Connection& connection, const Residence& residence);
   void readRoles(Connection& connection);
-  void readGroups(Connection& connection);
+  // `table` as the statement writes it.
+  void readGroups(Connection& connection, const String& table);
 
   Boolean passesPolicy(const String& password, Integer& cycle);
   Boolean insertUser();

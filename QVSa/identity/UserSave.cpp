@@ -4,11 +4,6 @@
 #include "QVSa/identity/safeRule.h"
 
 namespace QVSa {
-namespace {
-
-Long one(Boolean value) { return value ? 1 : 0; }
-
-}  // namespace
 
 Boolean User::Save(Boolean passPwdCheck) {
   return operation(plain(), [&]() -> Boolean {
@@ -85,44 +80,27 @@ void User::findDepartment(Connection& connection) {
 }
 
 void User::insertRow(Connection& connection) {
-  connection.Execute(sql(" insert into users "
-                         "( userName , userLogin , userPwd , deptId , mobilePhone , email , isAbstract , "
-                         " isRole , useSms , useKey , company , address , zipcode , Telephone , isOuter , accState "
-                         " , PwdNoChange "
-                         " , useOTPAuth "
-                         " , OTPTokenId "
-                         " , uType , Domain , ldsName , ldDn , ipList , synLogin ) "
-                         " values( <userName> , <userLogin> , <userPwd> , "
-                         "         <deptId> , <mobilePhone> , <email> , 0 , 0 , <useSms> , <useKey> , "
-                         "         <company> , <address> , <zipcode> , <Telephone> , <isOuter> , <accState> , "
-                         "         <PwdNoChange> , "
-                         "         <useOTPAuth> , "
-                         "         <OTPTokenId> , "
-                         "         <uType> , <domain> , <ldsName> , <ldDn> , <ipList> , <synLogin> "
-                         ")")
-                         .number("deptId", deptInnerId_)
-                         .number("useSms", one(sendSms_))
-                         .number("useKey", one(keyLogin_))
-                         .number("isOuter", one(isOuter_))
-                         .number("accState", regState_)
-                         .number("PwdNoChange", one(PwdNoChange_))
-                         .number("useOTPAuth", one(useOTPAuth_))
-                         .number("uType", uType_)
-                         .number("synLogin", one(synLogin_))
-                         .secret("userPwd", storedPwd())
-                         .text("mobilePhone", MobilePhone_)
-                         .text("email", Email_)
-                         .text("company", company_)
-                         .text("address", Address_)
-                         .text("zipcode", zipcode_)
-                         .text("Telephone", telePhone_)
-                         .text("OTPTokenId", OTPTokenId_)
-                         .text("domain", Domain_)
-                         .text("ldsName", ldsName_)
-                         .text("ldDn", dn_)
-                         .text("ipList", ipList_)
-                         .text("userLogin", Login_)
-                         .text("userName", Name_));
+  connection.Execute(
+      withColumns(sql(" insert into users "
+                      "( userName , userLogin , userPwd , deptId , mobilePhone , email , isAbstract , "
+                      " isRole , useSms , useKey , company , address , zipcode , Telephone , isOuter , accState "
+                      " , PwdNoChange "
+                      " , useOTPAuth "
+                      " , OTPTokenId "
+                      " , uType , Domain , ldsName , ldDn , ipList , synLogin ) "
+                      " values( <userName> , <userLogin> , <userPwd> , "
+                      "         <deptId> , <mobilePhone> , <email> , 0 , 0 , <useSms> , <useKey> , "
+                      "         <company> , <address> , <zipcode> , <Telephone> , <isOuter> , <accState> , "
+                      "         <PwdNoChange> , "
+                      "         <useOTPAuth> , "
+                      "         <OTPTokenId> , "
+                      "         <uType> , <domain> , <ldsName> , <ldDn> , <ipList> , <synLogin> "
+                      ")"))
+          .number("deptId", deptInnerId_)
+          .number("accState", regState_)
+          .secret("userPwd", storedPwd())
+          .text("userLogin", Login_)
+          .text("userName", Name_));
 }
 
 Boolean User::updateUser() {
@@ -151,45 +129,31 @@ Boolean User::updateUser() {
 
 // Writes the password at every save, as it is stored under the name. Leaves the account's type and domain alone.
 void User::updateRow(Connection& connection, Integer state) {
-  connection.Execute(sql("update users set "
-                         "userName=<userName>"
-                         ",userLogin=<userLogin>"
-                         ",userPwd=<userPwd>"
-                         ",deptId=<deptId>"
-                         ",mobilePhone=<mobilePhone>"
-                         ",email=<email>"
-                         ",company=<company>"
-                         ",address=<address>"
-                         ",zipcode=<zipcode>"
-                         ",Telephone=<Telephone>"
-                         ",isOuter=<isOuter>"
-                         ",useSms=" +
-                         text(one(sendSms_)) + ",useKey=" + text(one(keyLogin_)) +
-                         ",accstate=<accstate>,pwdDate=getdate(),lockDate=null"
-                         ",ldsName=<ldsName>,ldDn=<ldDn>"
-                         ",ipList=<ipList>,synLogin=<synLogin>"
-                         " , PwdNoChange = <PwdNoChange> "
-                         " , useOTPAuth = <useOTPAuth> "
-                         " , OTPTokenId = <OTPTokenId> "
-                         " where userId=" +
-                         text(Id_))
+  connection.Execute(withColumns(sql("update users set "
+                                     "userName=<userName>"
+                                     ",userLogin=<userLogin>"
+                                     ",userPwd=<userPwd>"
+                                     ",deptId=<deptId>"
+                                     ",mobilePhone=<mobilePhone>"
+                                     ",email=<email>"
+                                     ",company=<company>"
+                                     ",address=<address>"
+                                     ",zipcode=<zipcode>"
+                                     ",Telephone=<Telephone>"
+                                     ",isOuter=<isOuter>"
+                                     ",useSms=" +
+                                     text(Long{sendSms_}) + ",useKey=" + text(Long{keyLogin_}) +
+                                     ",accstate=<accstate>,pwdDate=getdate(),lockDate=null"
+                                     ",ldsName=<ldsName>,ldDn=<ldDn>"
+                                     ",ipList=<ipList>,synLogin=<synLogin>"
+                                     " , PwdNoChange = <PwdNoChange> "
+                                     " , useOTPAuth = <useOTPAuth> "
+                                     " , OTPTokenId = <OTPTokenId> "
+                                     " where userId=" +
+                                     text(Id_)))
                          .number("deptId", deptInnerId_)
-                         .number("isOuter", one(isOuter_))
                          .number("accstate", state)
-                         .number("synLogin", one(synLogin_))
-                         .number("PwdNoChange", one(PwdNoChange_))
-                         .number("useOTPAuth", one(useOTPAuth_))
                          .secret("userPwd", storedPwd())
-                         .text("mobilePhone", MobilePhone_)
-                         .text("email", Email_)
-                         .text("company", company_)
-                         .text("address", Address_)
-                         .text("zipcode", zipcode_)
-                         .text("Telephone", telePhone_)
-                         .text("ldsName", ldsName_)
-                         .text("ldDn", dn_)
-                         .text("ipList", ipList_)
-                         .text("OTPTokenId", OTPTokenId_)
                          .text("userLogin", Login_)
                          .text("userName", Name_));
 }

@@ -54,8 +54,7 @@ class Users : public Collection<User> {
   Recordset& GetDataMember(const String& DataMember);
 
  private:
-  std::shared_ptr<User> readAccount(Recordset& row) const;
-  String groupsOf(Connection& connection, Long userId) const;
+  std::shared_ptr<User> listedUser(Recordset& row) const;
   std::shared_ptr<User> connected() const;
 
   Recordset listRecordset_;

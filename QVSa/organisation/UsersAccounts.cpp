@@ -36,9 +36,9 @@ Boolean Users::GetAllReg(Integer regState, Long deptId) {
     connection.Execute("set nocount on");
     Recordset row = connection.Execute(sql(statement).number("accstate", regState));
     for (; !row.EOF_(); row.MoveNext()) {
-      auto user = readAccount(row);
+      auto user = listedUser(row);
       user->RegUserDesc(row["userDesc"].asText());
-      user->grpName(groupsOf(connection, user->Id()));
+      user->readGroups(connection, "ItemGroups");
       connectAlike(*user);
       add(user, user->Name());
     }
@@ -85,9 +85,9 @@ Boolean Users::GetAll(const String& deptId, Long roleId, Boolean noBuiltIn, Long
     Recordset row = connection.Execute(sql(statement).number("roleId", roleId).text("deptNo", deptId));
     // All rows first, then the groups of each on the same connection.
     for (row.ActiveConnection(nullptr); !row.EOF_(); row.MoveNext()) {
-      auto user = readAccount(row);
+      auto user = listedUser(row);
       user->dn(row["ldDn"].asText());
-      user->grpName(groupsOf(connection, user->Id()));
+      user->readGroups(connection, "ItemGroups");
       connectAlike(*user);
       add(user, user->Name());
     }
@@ -95,47 +95,20 @@ Boolean Users::GetAll(const String& deptId, Long roleId, Boolean noBuiltIn, Long
   });
 }
 
-std::shared_ptr<User> Users::readAccount(Recordset& row) const {
+std::shared_ptr<User> Users::listedUser(Recordset& row) const {
   auto user = std::make_shared<User>();
   user->Id(row["userId"].asLong());
-  user->Name(row["userName"].asText());
-  user->Login(row["userLogin"].asText());
-  user->MobilePhone(row["mobilePhone"].asText());
-  user->Email(row["email"].asText());
+  user->readAccount(row);
   user->builtIn_ = row["isAbstract"].asBoolean();
-  user->sendSms(row["useSms"].isOne());
-  user->keyLogin(row["useKey"].isOne());
   // Lists tell a lock, no other state.
   user->regState(row["accstate"].isOne() ? Integer{1} : Integer{0});
-  user->uType(row["uType"].asInteger());
-  user->Domain(row["domain"].asText());
   user->deptId(row["deptId"].asText());
-  user->deptName_ = row["deptName"].asText();
-  user->deptFullName_ = row["fullName"].asText();
   user->isUser_ = true;
   user->isAdministrator_ = !row["j1"].isNull();
   user->isDesigner_ = !row["j2"].isNull();
   user->isOwner_ = !row["j3"].isNull();
   user->isDeptadmin_ = !row["j4"].isNull();
-  user->company(row["company"].asText());
-  user->Address(row["address"].asText());
-  user->zipcode(row["zipcode"].asText());
-  user->telePhone(row["telephone"].asText());
-  user->isOuter(row["isouter"].isOne());
-  user->PwdNoChange(row["PwdNoChange"].isOne());
-  user->useOTPAuth(row["useOTPAuth"].isOne());
-  user->OTPTokenId(row["OTPTokenId"].asText());
   return user;
-}
-
-String Users::groupsOf(Connection& connection, Long userId) const {
-  std::vector<String> names;
-  Recordset row = connection.Execute(
-      "select g.gName from ItemGroups g,grpUser x"
-      " where x.userId=" +
-      text(userId) + " and x.gId=g.gId");
-  for (; !row.EOF_(); row.MoveNext()) names.push_back(row["gName"].asText());
-  return join(names, ",");
 }
 
 }  // namespace QVSa
