@@ -4,11 +4,6 @@ namespace QVSa::console {
 
 namespace {
 
-constexpr Integer byId = 1;
-constexpr Integer byNumber = 1;
-constexpr Integer byName = 2;
-constexpr Integer byLogin = 3;
-
 template <class Object>
 Object load(const Console& console, Integer keyName, const String& key) {
   Object object;
@@ -19,17 +14,19 @@ Object load(const Console& console, Integer keyName, const String& key) {
 
 }  // namespace
 
-User userWithId(const Console& console, const String& id) { return load<User>(console, byId, id); }
+User userWithId(const Console& console, const String& id) { return load<User>(console, User::byId, id); }
 
-User userOf(const Console& console, const String& login) { return load<User>(console, byLogin, login); }
+User userOf(const Console& console, const String& login) { return load<User>(console, User::byLogin, login); }
 
 Department departmentOf(const Console& console, const String& number) {
-  return load<Department>(console, byNumber, number);
+  return load<Department>(console, Department::byNumber, number);
 }
 
-Role roleOf(const Console& console, const String& name) { return load<Role>(console, byName, name); }
+Role roleOf(const Console& console, const String& name) { return load<Role>(console, Role::byName, name); }
 
-userGroup groupOf(const Console& console, const String& name) { return load<userGroup>(console, byName, name); }
+userGroup groupOf(const Console& console, const String& name) {
+  return load<userGroup>(console, userGroup::byName, name);
+}
 
 // From <users><user id="12" .../>...</users>. No value holds a "<", so that the beginning of an element is plain.
 std::vector<String> memberIds(userGroup& group) {

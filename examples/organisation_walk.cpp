@@ -14,7 +14,6 @@ namespace {
 using QVSa::Long;
 using QVSa::String;
 
-constexpr QVSa::Integer byLogin = 3;
 constexpr QVSa::Integer byName = 2;
 constexpr int shownItems = 5;
 const String database = "QVApp";
@@ -53,7 +52,7 @@ class Walk : private Steps {
   void meet() {
     title("Somebody who holds roles in departments");
     user_ = connected<QVSa::User>();
-    line("User.GetOne(3, \"" + login_ + "\")", user_.errDescription(), user_.GetOne(byLogin, login_));
+    line("User.GetOne(3, \"" + login_ + "\")", user_.errDescription(), user_.GetOne(QVSa::User::byLogin, login_));
     list("Jobs.GetAll of this user", jobs_.connect(server_, database) && jobs_.GetAll("", "", user_.Id()), jobs_,
          "jobs", [](const QVSa::Job& job) { return job.Name(); });
     role_ = connected<QVSa::Role>();
@@ -73,11 +72,11 @@ class Walk : private Steps {
   // The department directly below the root on the user's way up.
   QVSa::Department topOfUser() {
     auto top = connected<QVSa::Department>();
-    top.GetOne(1, user_.deptId());
+    top.GetOne(QVSa::Department::byNumber, user_.deptId());
     while (!top.Super().empty() && top.Super() != "_root") {
       const String superior = top.Super();
       top = connected<QVSa::Department>();
-      top.GetOne(1, superior);
+      top.GetOne(QVSa::Department::byNumber, superior);
     }
     return top;
   }

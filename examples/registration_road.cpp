@@ -15,7 +15,6 @@ namespace {
 using QVSa::Boolean;
 using QVSa::String;
 
-constexpr QVSa::Integer byLogin = 3;
 const String database = "QVApp";
 
 class Road {
@@ -101,7 +100,7 @@ class Road {
   void audit() {
     title("The administrator accepts, and the applicant gets a mail");
     auto user = connected<QVSa::User>();
-    show("User.GetOne", user.GetOne(byLogin, login_), true, user);
+    show("User.GetOne", user.GetOne(QVSa::User::byLogin, login_), true, user);
     show("User.regAudit(True, ...)", user.regAudit(true, "See you next week."), true, user);
     showMails();
   }

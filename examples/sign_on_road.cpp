@@ -18,9 +18,6 @@ namespace {
 using QVSa::Boolean;
 using QVSa::String;
 
-constexpr QVSa::Integer byLogin = 3;
-constexpr QVSa::Integer byNumber = 1;
-
 String quoted(const String& text) { return "\"" + text + "\""; }
 
 class Road : private Steps {
@@ -59,7 +56,7 @@ class Road : private Steps {
 
   QVSa::User loaded() {
     auto user = connected<QVSa::User>();
-    if (!user.GetOne(byLogin, login_)) show("User.GetOne(3, " + quoted(login_) + ")", false, true, user);
+    if (!user.GetOne(QVSa::User::byLogin, login_)) show("User.GetOne(3, " + quoted(login_) + ")", false, true, user);
     return user;
   }
 
@@ -181,7 +178,8 @@ class Road : private Steps {
 
   QVSa::Department department(const String& number) {
     auto result = connected<QVSa::Department>();
-    if (!result.GetOne(byNumber, number)) show("Department.GetOne(1, " + quoted(number) + ")", false, true, result);
+    if (!result.GetOne(QVSa::Department::byNumber, number))
+      show("Department.GetOne(1, " + quoted(number) + ")", false, true, result);
     return result;
   }
 

@@ -84,7 +84,7 @@ Boolean Directory::Delete(const String& Class) {
     {
       Recordset row =
           connection.Execute(sql("select path,fullName from RptDirectory where class=<class>").text("class", name));
-      if (row.EOF_()) fail("Directory", 1400, {name});
+      if (row.EOF_()) fail("Directory", message::classUnknown, {name});
       path = row["path"].asText();
       fullName = row["fullName"].asText();
     }

@@ -54,12 +54,12 @@ class Directory : private Frame {
   Boolean GetOne(Integer keyName, const Variant& keyValue);
   // Inserts the node as the last of its siblings, or updates the one that was loaded or saved here. An update rewrites
   // what lies below, in one transaction, and makes the node the last of its siblings, whatever has changed; call
-  // updateSubOrder to put it elsewhere. 0x80040578 a new node's superior, or the node to be renamed or moved, is not
-  // there; 0x80040E2F the name is taken; 5 there are 999 siblings already; 0x80040E57 too deep: a path has room for 850
-  // characters, a full name for 4,000, an ordPath for 400, which is 100 levels.
+  // updateSubOrder to put it elsewhere. classUnknown (0x80040578) a new node's superior, or the node to be renamed or
+  // moved, is not there; 0x80040E2F the name is taken; 5 there are 999 siblings already; 0x80040E57 too deep: a path
+  // has room for 850 characters, a full name for 4,000, an ordPath for 400, which is 100 levels.
   Boolean Save();
-  // Deletes the node `Class` (empty: this one). What lies below stays, cut off from what was above. 0x80040578 there is
-  // no such node.
+  // Deletes the node `Class` (empty: this one). What lies below stays, cut off from what was above. classUnknown
+  // (0x80040578) there is no such node.
   Boolean Delete(const String& Class = "");
   // Numbers the nodes named in `SubDirs`, "," between, in that order. `SuperOrdPath`: the ordPath above them with a
   // trailing ".", empty for roots. Not one transaction: a failure, as 5 at the thousandth name, leaves those before it
@@ -76,7 +76,7 @@ class Directory : private Frame {
   static Ancestry readAncestry(Recordset& row);
   Place placeBelow(const Ancestry& superior) const;
   Long nextPosition(Connection& connection);
-  void fill(Statement& statement, const Place& place) const;
+  void fill(SqlText& statement, const Place& place) const;
   void insertRow(Connection& connection, const Place& place);
   void updateRow(Connection& connection, const Place& place);
   void rewriteBelow(Connection& connection, const Ancestry& stored, const Place& place);

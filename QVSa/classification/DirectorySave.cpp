@@ -33,7 +33,7 @@ Boolean Directory::InsertDir() {
     if (!superClass_.empty()) {
       Recordset row = connection.Execute(
           sql(" select path , fullName , ordPath from RptDirectory where class = <class> ").text("class", superClass_));
-      if (row.EOF_()) fail("Directory", 1400, {superClass_});
+      if (row.EOF_()) fail("Directory", message::classUnknown, {superClass_});
       superior = readAncestry(row);
     }
     Place place = placeBelow(superior);
@@ -61,7 +61,7 @@ Boolean Directory::UpdateDir() {
     if (Class_ != oldClass_ || superClass_ != oldSuperClass_) {
       Recordset row = connection.Execute(
           sql("select path,fullName from RptDirectory where class=<class>").text("class", oldClass_));
-      if (row.EOF_()) fail("Directory", 1400, {oldClass_});
+      if (row.EOF_()) fail("Directory", message::classUnknown, {oldClass_});
       stored = Ancestry{row["path"].asText(), row["fullName"].asText(), ""};
     }
 
@@ -103,7 +103,7 @@ Long Directory::nextPosition(Connection& connection) {
 
 void Directory::insertRow(Connection& connection, const Place& place) {
   const bool ordered = place.isOrdered();
-  Statement statement =
+  SqlText statement =
       sql(String("insert into RptDirectory ( "
                  " class , superClass , fullName , path ") +
           (ordered ? " , ordNo , ordPath " : "") +
@@ -117,7 +117,7 @@ void Directory::insertRow(Connection& connection, const Place& place) {
 }
 
 void Directory::updateRow(Connection& connection, const Place& place) {
-  Statement statement =
+  SqlText statement =
       sql(String(" update RptDirectory set ") + (Class_ != oldClass_ ? " class = <class> , " : "") +
           " superClass = <superClass> , "
           " fullName = <fullName> , "
@@ -134,7 +134,7 @@ void Directory::updateRow(Connection& connection, const Place& place) {
   connection.Execute(statement);
 }
 
-void Directory::fill(Statement& statement, const Place& place) const {
+void Directory::fill(SqlText& statement, const Place& place) const {
   statement.text("class", Class_)
       .text("superClass", superClass_)
       .text("fullName", place.fullName)

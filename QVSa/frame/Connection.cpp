@@ -6,11 +6,7 @@
 
 namespace QVSa {
 
-namespace {
-
-constexpr Long clientCursor = 3;
-
-}  // namespace
+namespace {}  // namespace
 
 Connection::Connection() = default;
 Connection::~Connection() { disconnect(); }
@@ -37,7 +33,7 @@ Recordset Connection::Execute(const String& CommandText, Long* RecordsAffected) 
   BatchResult result = run(CommandText, false);
   if (RecordsAffected != nullptr) *RecordsAffected = result.affected;
   Recordset rows;
-  if (result.rows) rows.start(attach(std::move(result.rows)), cursorLocation_ == clientCursor);
+  if (result.rows) rows.start(attach(std::move(result.rows)), cursorLocation_ == adUseClient);
   return rows;
 }
 

@@ -33,7 +33,7 @@ class Connection {
   void CommitTrans();
   void RollbackTrans();
 
-  // 3: the client keeps the rows, so that they can be counted and walked back; 2 (the default): they stream.
+  // A CursorLocationEnum; adUseServer by default.
   Long CursorLocation() const;
   void CursorLocation(Long value);
   // Seconds for one batch; 30 by default, 0 for no limit.

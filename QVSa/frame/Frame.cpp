@@ -65,42 +65,42 @@ Handler silent() {
   return handler;
 }
 
-Statement::Statement(SQLFactory& factory, std::vector<String>& secrets, String text)
+SqlText::SqlText(SQLFactory& factory, std::vector<String>& secrets, String text)
     : factory_(factory), secrets_(secrets), text_(std::move(text)) {
   factory_.Clear();
 }
 
-Statement& Statement::number(const String& name, const Variant& value) {
+SqlText& SqlText::number(const String& name, const Variant& value) {
   factory_.AddPara(name, paraNumber, value, false, true);
   return *this;
 }
 
-Statement& Statement::text(const String& name, const Variant& value) {
+SqlText& SqlText::text(const String& name, const Variant& value) {
   factory_.AddPara(name, paraText, value, false, true);
   return *this;
 }
 
-Statement& Statement::secret(const String& name, const String& value) {
+SqlText& SqlText::secret(const String& name, const String& value) {
   secrets_.push_back(value);
   return text(name, value);
 }
 
-Statement& Statement::date(const String& name, const Variant& value) {
+SqlText& SqlText::date(const String& name, const Variant& value) {
   factory_.AddPara(name, paraDate, value, false, true);
   return *this;
 }
 
-Statement& Statement::list(const String& name, const String& value) {
+SqlText& SqlText::list(const String& name, const String& value) {
   factory_.AddPara(name, paraList, value, false, true);
   return *this;
 }
 
-Statement& Statement::raw(const String& name, const String& value) {
+SqlText& SqlText::raw(const String& name, const String& value) {
   factory_.AddPara(name, paraVerbatim, value, false, true);
   return *this;
 }
 
-Statement::operator String() const { return factory_.fill(text_); }
+SqlText::operator String() const { return factory_.fill(text_); }
 
 Boolean Frame::connect(const String& server, const String& DBName) {
   // What was connected before must not pass for this.

@@ -6,6 +6,7 @@
 
 #include "QVSa/frame/Connection.h"
 #include "QVSa/frame/SQLFactory.h"
+#include "QVSa/resources/MessageId.h"
 #include "QVSa/values/Failure.h"
 #include "QVSa/values/Text.h"
 
@@ -37,18 +38,18 @@ Handler silent();
 
 // A statement text whose tokens are filled by the object's factory, in one pass and with the usual flags: an empty text
 // goes as an empty text and not as NULL, trailing blanks are cut. Throws Failure for a value that has no literal.
-class Statement {
+class SqlText {
  public:
-  Statement(SQLFactory& factory, std::vector<String>& secrets, String text);
-  Statement& number(const String& name, const Variant& value);
-  Statement& text(const String& name, const Variant& value);
+  SqlText(SQLFactory& factory, std::vector<String>& secrets, String text);
+  SqlText& number(const String& name, const Variant& value);
+  SqlText& text(const String& name, const Variant& value);
   // A password as it is stored. A server may quote a piece of it, now or in a later statement of the operation: the
   // object's error text then ends before that piece.
-  Statement& secret(const String& name, const String& value);
-  Statement& date(const String& name, const Variant& value);
-  Statement& list(const String& name, const String& value);
+  SqlText& secret(const String& name, const String& value);
+  SqlText& date(const String& name, const Variant& value);
+  SqlText& list(const String& name, const String& value);
   // SQL of the caller's own: a list of ids, a part of a condition. It goes into the statement as it is.
-  Statement& raw(const String& name, const String& value);
+  SqlText& raw(const String& name, const String& value);
   operator String() const;
 
  private:
@@ -90,12 +91,12 @@ class Frame {
   // An open connection on the object's own string.
   Connection open() const;
   // Clears the object's factory and starts a statement on it.
-  Statement sql(const String& text) { return Statement(factory_, secrets_, text); }
+  SqlText sql(const String& text) { return SqlText(factory_, secrets_, text); }
 
   // Runs `body` and returns its result. A failure is turned into the two error values by `handler`, and the result is
   // the body type's negative one: False, the empty text, no object. A body that also refuses names its type:
   //   return operation(plain(), [&]() -> Boolean {
-  //     if (Id().empty()) return refuse(1002);
+  //     if (Id().empty()) return refuse(message::departmentIncomplete);
   //     ...
   //     return true;
   //   });

@@ -10,20 +10,14 @@ namespace QVSa {
 
 namespace {
 
-constexpr Long keyset = 1;
-constexpr Long dynamic = 2;
-constexpr Long staticCursor = 3;
-constexpr Long pessimistic = 2;
-constexpr Long optimistic = 3;
-constexpr Long clientCursor = 3;
-
 Failure noSuchField() {
   return Failure(number::noField, "Recordset",
                  "Item cannot be found in the collection corresponding to the requested name or ordinal.");
 }
 
 bool canUpdate(Long cursorType, Long lockType) {
-  return (cursorType == keyset || cursorType == dynamic) && (lockType == pessimistic || lockType == optimistic);
+  return (cursorType == adOpenKeyset || cursorType == adOpenDynamic) &&
+         (lockType == adLockPessimistic || lockType == adLockOptimistic);
 }
 
 }  // namespace
@@ -41,8 +35,8 @@ void Recordset::Open(const String& Source, Connection& ActiveConnection, Long Cu
   BatchResult result = ActiveConnection.run(Source, updatable);
   if (!result.rows) return;
   // A dynamic cursor is neither counted nor walked back, so the client keeps nothing of it, however many rows it has.
-  const bool atClient = ActiveConnection.CursorLocation() == clientCursor && cursorType_ != dynamic;
-  start(ActiveConnection.attach(std::move(result.rows)), atClient || cursorType_ == staticCursor);
+  const bool atClient = ActiveConnection.CursorLocation() == adUseClient && cursorType_ != adOpenDynamic;
+  start(ActiveConnection.attach(std::move(result.rows)), atClient || cursorType_ == adOpenStatic);
   updatable_ = updatable;
 }
 
@@ -68,9 +62,7 @@ void Recordset::Close() {
 
 Long Recordset::State() const { return isOpen() ? 1 : 0; }
 
-Long Recordset::CursorType() const { return cursorType_; }
 void Recordset::CursorType(Long value) { cursorType_ = value; }
-Long Recordset::LockType() const { return lockType_; }
 void Recordset::LockType(Long value) { lockType_ = value; }
 
 void Recordset::ActiveConnection(std::nullptr_t) {

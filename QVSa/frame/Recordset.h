@@ -15,6 +15,13 @@ class Recordset;
 class Rows;
 struct Column;
 
+// How a row set may be walked and written. A keyset or dynamic cursor with a pessimistic or optimistic lock can be
+// written back.
+enum CursorTypeEnum : Long { adOpenForwardOnly = 0, adOpenKeyset = 1, adOpenDynamic = 2, adOpenStatic = 3 };
+enum LockTypeEnum : Long { adLockReadOnly = 1, adLockPessimistic = 2, adLockOptimistic = 3 };
+// Whether rows stream from the server, or the client keeps them, so that they can be counted and walked back.
+enum CursorLocationEnum : Long { adUseServer = 2, adUseClient = 3 };
+
 // A row set that lives on a connection, which empties it when it closes.
 using AttachedRows = std::shared_ptr<std::unique_ptr<Rows>>;
 
@@ -62,16 +69,13 @@ class Recordset {
   Recordset(Recordset&& other) noexcept;
   Recordset& operator=(Recordset&& other) noexcept;
 
-  // Cursor 0 forward-only, 1 keyset, 2 dynamic, 3 static; -1 takes the property. Lock 1 read-only, 2 pessimistic,
-  // 3 optimistic; -1 takes the property. A keyset or dynamic cursor with lock 2 or 3 can be written back.
+  // A CursorTypeEnum and a LockTypeEnum; -1 takes the property.
   void Open(const String& Source, Connection& ActiveConnection, Long CursorType = -1, Long LockType = -1);
   void Close();
   // 1 open, 0 closed.
   Long State() const;
 
-  Long CursorType() const;
   void CursorType(Long value);
-  Long LockType() const;
   void LockType(Long value);
   // Detaches the row set from its connection: the rows from the current one on (all, where they were kept) are fetched
   // and stay readable after the connection closed. They are read-only.

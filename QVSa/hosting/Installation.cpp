@@ -37,12 +37,11 @@ Boolean Installation::make(const String& folder, const String& adminPassword, co
 
 // The first row of the administrator is locked and without a password; his first save opens it.
 void Installation::setAdministratorsPassword(const String& server, const String& password) {
-  constexpr Integer byLogin = 3;
   constexpr const char* job = "1";
   User admin;
-  const Boolean loaded = admin.connect(server) && admin.GetOne(byLogin, "Admin");
+  const Boolean loaded = admin.connect(server) && admin.GetOne(User::byLogin, "Admin");
   admin.Pwd(password);
-  admin.regState(0);
+  admin.regState(accountNormal);
   admin.setJobs(job);
   if (!loaded || !admin.Save()) throw Failure(admin.errNumber(), "Installation", admin.errDescription());
 }

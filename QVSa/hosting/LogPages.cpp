@@ -94,7 +94,7 @@ Conditions conditionsOf(const LogFilter& filter) {
 }  // namespace
 
 Boolean LogPages::read(const LogFilter& filter, Long size, const String& after) {
-  return operation(prefixed(1702), [&] {
+  return operation(prefixed(message::logNotRead), [&] {
     if (size < 1) throw runtimeFailure(number::argument);
     // One more than wanted tells whether there is a next page. `after` may be this object's own `next`.
     const String query = statement(filter, size + 1, after);
@@ -109,7 +109,7 @@ Boolean LogPages::read(const LogFilter& filter, Long size, const String& after) 
 }
 
 // The first condition on the place is what lets the server begin in the index of the times.
-Statement LogPages::statement(const LogFilter& filter, Long size, const String& after) {
+SqlText LogPages::statement(const LogFilter& filter, Long size, const String& after) {
   Conditions conditions = conditionsOf(filter);
   if (!after.empty()) {
     const auto place = Place::parse(after);
@@ -117,10 +117,10 @@ Statement LogPages::statement(const LogFilter& filter, Long size, const String& 
     conditions.add("logTime<=<time>", "time", place->sqlTime());
     conditions.add("(logTime<<time> or logId<<id>)", "id", place->id);
   }
-  Statement filled = sql("select top " + text(size) +
-                         " logId,logTime,userName,computer,application,funcName,opDesc,rt.fullName,replacerName,rtId,"
-                         "rcId,wiId from sysLog l left outer join repTmps rt on l.rtId=rt.rtUid where logType=" +
-                         text(filter.type) + conditions.text() + " order by logTime desc,logId desc");
+  SqlText filled = sql("select top " + text(size) +
+                       " logId,logTime,userName,computer,application,funcName,opDesc,rt.fullName,replacerName,rtId,"
+                       "rcId,wiId from sysLog l left outer join repTmps rt on l.rtId=rt.rtUid where logType=" +
+                       text(filter.type) + conditions.text() + " order by logTime desc,logId desc");
   filled.date("from", filter.from).date("to", filter.to.addDays(1));
   for (const auto& [token, value] : conditions.values()) filled.text(token, value);
   return filled;

@@ -51,7 +51,7 @@ class LogPages : private Frame {
   const String& next() const { return next_; }
 
  private:
-  Statement statement(const LogFilter& filter, Long size, const String& after);
+  SqlText statement(const LogFilter& filter, Long size, const String& after);
 
   std::vector<LogEntry> entries_;
   String next_;

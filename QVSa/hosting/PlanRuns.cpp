@@ -76,11 +76,11 @@ Boolean PlanRuns::execute(Connection& connection, BKPlan& plan, PlanRun& run) {
 }
 
 Boolean PlanRuns::writeLog(const String& folder) {
-  constexpr Long administrator = 1, administration = 3;
+  constexpr Long administrator = 1;
   LogRecords log;
   log.connect(server(), DBName());
   const Boolean written = repeatCollided(log, [&] {
-    return log.Add(administrator, administration, LoadResString(3105), fillMsg(LoadResString(3106), {folder}));
+    return log.Add(administrator, administrationLog, LoadResString(3105), fillMsg(LoadResString(3106), {folder}));
   });
   return written ? Boolean{true} : refuseAs(log);
 }

@@ -36,7 +36,7 @@ Boolean SignOn::signOn(const String& loginName, const String& Pwd, Boolean authL
       user_ = User();
       // Within the turn: who waits for it must not see how long the attempt before took.
       std::this_thread::sleep_until(endOfUnit(start, std::chrono::milliseconds(refusalTime_)));
-      return refuse(1106);
+      return refuse(message::passwordWrong);
     }
     const Integer level = hidesReasons ? passwordWasTested : passwordIsTested;
     const Boolean done = repeatCollided(
@@ -57,10 +57,10 @@ String SignOn::accountOf(Connection& connection, const String& loginName) {
 
 // Tests the password, which moves the count and may lock the account.
 Boolean SignOn::isRefused(const String& loginName, const String& Pwd, Boolean authLd) {
-  constexpr Integer byLogin = 3;
   Boolean wrongPwd = false;
-  if (user_.GetOne(byLogin, loginName, true, Pwd, &wrongPwd, authLd)) return wrongPwd || user_.regState() != 0;
-  for (const Long unknown : {messageNumber(1101), messageNumber(1131)})
+  if (user_.GetOne(User::byLogin, loginName, true, Pwd, &wrongPwd, authLd))
+    return wrongPwd || user_.regState() != accountNormal;
+  for (const Long unknown : {messageNumber(message::userUnknown), messageNumber(message::notInDirectory)})
     if (user_.errNumber() == unknown) return true;
   throw Failure(user_.errNumber(), "SignOn", user_.errDescription());
 }

@@ -19,9 +19,9 @@ class SignOn : private Frame {
   using Frame::errNumber;
 
   // 0, the default: a refusal tells its reason, at once. Above: an unknown login, a wrong password and an account that
-  // is locked, waits for audit or was refused there all get 0x80040452, and each such answer, from the attempt's turn
-  // on, takes this many milliseconds, or a multiple of them. Choose it longer than a sign-on takes, with the
-  // directory's or the domain's answer where accounts have their passwords there.
+  // is locked, waits for audit or was refused there all get passwordWrong (0x80040452), and each such answer, from the
+  // attempt's turn on, takes this many milliseconds, or a multiple of them. Choose it longer than a sign-on takes, with
+  // the directory's or the domain's answer where accounts have their passwords there.
   Long refusalTime() const { return refusalTime_; }
   void refusalTime(Long milliseconds) { refusalTime_ = milliseconds; }
   // Seconds that an attempt waits for others at the same login, 30 by default; 0x80040E31 behind them.
@@ -29,7 +29,8 @@ class SignOn : private Frame {
   void patience(Long seconds) { patience_ = seconds; }
 
   // The arguments, the refusals and the result are those of User::loginAuth with a password in clear: True with
-  // 0x8004045F and an empty `sessionId` where the password has expired and only its change is allowed.
+  // passwordExpired (0x8004045F) and an empty `sessionId` where the password has expired and only its change is
+  // allowed.
   Boolean signOn(const String& loginName, const String& Pwd, Boolean authLd = false, const String& ipAddr = "",
                  const String& hostName = "");
   const String& sessionId() const { return sessionId_; }

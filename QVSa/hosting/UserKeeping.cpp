@@ -50,7 +50,7 @@ UserKeeping::Kept UserKeeping::read(Connection& connection, Long userId) {
   {
     Recordset row =
         connection.Execute("select accstate,lockDate,pwdDate from users where isRole=0 and userId=" + text(userId));
-    if (row.EOF_()) fail("UserKeeping", 1101);
+    if (row.EOF_()) fail("UserKeeping", message::userUnknown);
     kept.state = row[0].asInteger();
     kept.lockDate = row[1].Value();
     kept.passwordDate = row[2].Value();
@@ -89,7 +89,7 @@ Boolean UserKeeping::unlock(Long userId) {
         "update users set accstate=0,lockDate=null,lgts=0 where isRole=0 and accstate in (0,1) and userId=" +
             text(userId),
         &opened);
-    if (opened == 0) return refuse(1101);
+    if (opened == 0) return refuse(message::userUnknown);
     return true;
   });
 }

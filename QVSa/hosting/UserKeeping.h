@@ -20,7 +20,7 @@ class UserKeeping : private Frame {
   // that can't be done, the text begins with "The user is saved, but"; the refusals of the save are User::Save's.
   Boolean save(User& user, Boolean newPassword = false);
   // Opens the account of user `userId` where it is locked, and forgets his failed sign-ons; password, jobs and groups
-  // are not touched. 0x8004044D there is no such user, or his application waits or was refused.
+  // are not touched. userUnknown (0x8004044D) there is no such user, or his application waits or was refused.
   Boolean unlock(Long userId);
 
  private:

@@ -24,7 +24,7 @@ Variant Sessions::Remove(const Variant& Index) {
 }
 
 Variant Sessions::GetAll() {
-  return operation(prefixed(1601), [&] {
+  return operation(prefixed(message::sessionsNotListed), [&] {
     items_.clear();
     Connection connection = open();
     for (Recordset row = connection.Execute("select * from sesLog"); !row.EOF_(); row.MoveNext()) {
@@ -45,7 +45,7 @@ Variant Sessions::GetAll() {
 
 String Sessions::newSession(const String& userLogin, const String& computerName, const String& DBName,
                             const String& ip) {
-  return operation(prefixed(1602), [&]() -> String {
+  return operation(prefixed(message::sessionNotOpened), [&]() -> String {
     IdMgr numbers;
     const String id = numbers.newId("_ses", connectionString(), -1, "", "");
     if (id.empty()) return refuseAs(numbers);
@@ -63,7 +63,7 @@ String Sessions::newSession(const String& userLogin, const String& computerName,
 }
 
 Boolean Sessions::Terminate(const String& SessionId) {
-  return operation(prefixed(1603), [&] {
+  return operation(prefixed(message::sessionNotClosed), [&] {
     Connection connection = open();
     connection.Execute(sql("delete from seslog where sesId=<sesId>").text("sesId", SessionId));
     if (!DBName().empty()) connection.Execute("use " + DBName());
@@ -76,7 +76,7 @@ Boolean Sessions::Terminate(const String& SessionId) {
 }
 
 Boolean Sessions::clearSessions(const String& id) {
-  return operation(prefixed(1603), [&] {
+  return operation(prefixed(message::sessionNotClosed), [&] {
     Connection connection = open();
     const String others = id.empty() ? "" : " where sesId<><id>";
     connection.Execute(sql("delete from seslog" + others).text("id", id));

@@ -5,11 +5,11 @@ namespace {
 
 String condition(Integer keyName) {
   switch (keyName) {
-    case 1:
+    case User::byId:
       return " and userId=<userId>";
-    case 2:
+    case User::byName:
       return " and userName=<userName>";
-    case 3:
+    case User::byLogin:
       return " and userLogin=<userLogin>";
     default:
       return " and 1=2";
@@ -65,7 +65,7 @@ Boolean User::GetOne(Integer keyName, const Variant& keyValue, Boolean chkPwd, c
                                  .number("userId", keyValue)
                                  .text("userName", keyValue)
                                  .text("userLogin", keyValue));
-      if (row.EOF_()) fail("User", 1101);
+      if (row.EOF_()) fail("User", message::userUnknown);
       read(row);
       residence = {row["isOrg"].isOne(), row["path"].asText()};
     }
@@ -156,7 +156,7 @@ void User::readGroups(Connection& connection, const String& table) {
 }
 
 Boolean User::Delete(Long Id) {
-  return operation(prefixedBlank(1109), [&] {
+  return operation(prefixedBlank(message::userNotDeleted), [&] {
     const Long id = Id == 0 ? Id_ : Id;
     Connection connection = open();
     connection.Execute("set nocount on");

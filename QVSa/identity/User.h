@@ -21,6 +21,9 @@ class User : private Frame {
   using Frame::errDescription;
   using Frame::errNumber;
 
+  // What GetOne finds a user by.
+  enum Key : Integer { byId = 1, byName = 2, byLogin = 3 };
+
   // 0 while the user is not stored. Can be set once in the life of an object; later sets are ignored.
   Long Id() const { return Id_; }
   void Id(Long value);
@@ -40,10 +43,10 @@ class User : private Frame {
   void sendSms(Boolean value) { sendSms_ = value; }
   Boolean keyLogin() const { return keyLogin_; }
   void keyLogin(Boolean value) { keyLogin_ = value; }
-  // 0 normal, 1 locked, 2 registered and waiting for audit, 3 refused at audit. Only 0 can sign on.
+  // An AccountState. Only accountNormal can sign on.
   Integer regState() const { return regState_; }
   void regState(Integer value) { regState_ = value; }
-  Boolean locked() const { return regState_ == 1; }
+  Boolean locked() const { return regState_ == accountLocked; }
   // A userTypes; not changed by the save of a stored user, nor is Domain.
   Integer uType() const { return uType_; }
   void uType(Integer value) { uType_ = value; }
@@ -107,10 +110,10 @@ class User : private Frame {
   // whatever lies beyond.
   Integer validDay() const { return validDay_; }
 
-  // Loads by id (`keyName` 1), name (2) or login (3); any other finds nobody. 0x8004044D where there is no such user.
+  // Loads by a Key; any other `keyName` finds nobody. userUnknown (0x8004044D) where there is no such user.
   // With `chkPwd` it tests `Pwd` and moves the counter of failed sign-ons, which may lock the account; a wrong password
   // shows in `wrongPwd` and is no failure of the load. `authLd`: the directory need only hold an ldapUser.
-  // 0x8004046B the directory does not know him.
+  // notInDirectory (0x8004046B) the directory does not know him.
   Boolean GetOne(Integer keyName, const Variant& keyValue, Boolean chkPwd = false, const String& Pwd = "",
                  Boolean* wrongPwd = nullptr, Boolean authLd = false);
   // Inserts or updates the user. Every save writes the password, restarts its validity and clears the date of a lock.
@@ -118,8 +121,8 @@ class User : private Frame {
   // counter of failed sign-ons stays: the next wrong password locks him again, and until a right one in clear sets the
   // counter to 0, he reads as locked where none is asked in clear (levels 1 and above of loginAuth).
   // `passPwdCheck` leaves out the policy and the history of passwords: pass True where the password is not new.
-  // 0x8004044E name or login empty, 0x80040460 the password was used before, 0x80040BB8 against the policy, 0x800A0BCD
-  // a new user's `deptId` is the number of no department.
+  // userIncomplete (0x8004044E) name or login empty, passwordUsedBefore (0x80040460),
+  // againstPolicy (0x80040BB8), 0x800A0BCD a new user's `deptId` is the number of no department.
   Boolean Save(Boolean passPwdCheck = false);
   // Deletes the user (0: this one). His jobs stay in the table.
   Boolean Delete(Long Id = 0);
@@ -130,24 +133,25 @@ class User : private Frame {
   // The whole sign-on. `sI` receives the session id and is empty where none was opened. `ipAddr`: the computer's
   // addresses, "|" between; `hostName`: its name, empty for no test of other sessions. `userVerifyLevel`: 0 or below,
   // `Pwd` is the password; 1, its md5Hex; above, the host vouches for the user.
-  // 0x8004046C address not permitted, 0x8004046D signed on elsewhere, 0x8004045E locked or in another state than 0,
-  // 0x80040452 wrong password, 0x80040463 wrong domain password, 0x80040E2F somebody else took the number of a session
-  // at this moment (trying again is safe). True with 0x8004045F and an empty `sI`: the password has expired, only its
-  // change is allowed. errNumber is not cleared by a success: look at the result, then at `sI`.
-  // Attempts at one account that run at the same moment each count for themselves and may all be answered before the
-  // lock is written: a limit of 3 let 8 guesses at once through. A host that faces people makes them one after the
-  // other. Throws Failure 6 on level 1 where the stored password has a character of two bytes in the system's code
-  // page.
+  // addressNotPermitted (0x8004046C), signedOnElsewhere (0x8004046D), lockedOut (0x8004045E) in any state but
+  // accountNormal, passwordWrong (0x80040452), domainPasswordWrong (0x80040463), 0x80040E2F somebody else took the
+  // number of a session at this moment (trying again is safe). True with passwordExpired (0x8004045F) and an empty
+  // `sI`: the password has expired, only its change is allowed. errNumber is not cleared by a success: look at the
+  // result, then at `sI`. Attempts at one account that run at the same moment each count for themselves and may all be
+  // answered before the lock is written: a limit of 3 let 8 guesses at once through. A host that faces people makes
+  // them one after the other. Throws Failure 6 on level 1 where the stored password has a character of two bytes in the
+  // system's code page.
   Boolean loginAuth(const String& loginName, const String& Pwd, String* sI = nullptr, Boolean authLd = false,
                     const String& ipAddr = "", const String& hostName = "", const Integer* userVerifyLevel = nullptr);
   // Whether `pwdMd5` is the md5Hex of the user's password: no counter, no lock, no session. Throws as loginAuth does.
   Boolean loginAuth_1(const String& loginName, const String& pwdMd5);
-  // Changes the password of the user that this object loaded or saved, under the policy. 0x80040461 `oldPwd` is not
-  // his, or there is no such user here: none was loaded, or his sign-on was refused. 0x80040460 used before, 0x80040BB8
-  // against the policy.
+  // Changes the password of the user that this object loaded or saved, under the policy. oldPasswordWrong (0x80040461)
+  // `oldPwd` is not his, or there is no such user here: none was loaded, or his sign-on was refused. passwordUsedBefore
+  // (0x80040460), againstPolicy (0x80040BB8).
   Boolean chgPwd(const String& oldPwd, const String& newPwd);
   // Sets the user's supervisor: whoever holds job `jobId` (`flag` 1), or user `userId` (2). Any other flag: none; both
-  // ids are stored all the same. 0x80040458 flag 1 without a job, 0x80040459 flag 2 without a user.
+  // ids are stored all the same. supervisorJobMissing (0x80040458) flag 1 without a job, supervisorUserMissing
+  // (0x80040459) flag 2 without a user.
   Boolean setManager(Integer flag, Long jobId = 0, Long userId = 0);
   // True also where no supervisor was ever set: the arguments then stay as they are.
   Boolean getManager(Integer& flag, Long& jobId, Long& userId);
@@ -156,9 +160,10 @@ class User : private Frame {
   std::shared_ptr<Users> getSubUsers();
   // Applies for an account with the values of this object: stored as a user in state 2, who can't sign on before the
   // audit, with the rest in a row for the auditor; a mail to the administrator is queued. An outside user goes to
-  // "_out", any other to "_root"; `deptName`, the unit that he names, then becomes his `company`. 0x80040BB8 against
-  // the policy, 0x8004044E name or login empty, 0x8004046A the row was not stored. The user stays stored where a later
-  // step fails. Where the settings can't be read, no mail is queued: True, with their failure in the error values.
+  // "_out", any other to "_root"; `deptName`, the unit that he names, then becomes his `company`. againstPolicy
+  // (0x80040BB8) against the policy, userIncomplete (0x8004044E) name or login empty, notRegistered (0x8004046A) the
+  // row was not stored. The user stays stored where a later step fails. Where the settings can't be read, no mail is
+  // queued: True, with their failure in the error values.
   Boolean Reg(const String& deptName = "", const String& desc = "");
   // Accepts or refuses the application of `userId` (0: this user), in whatever state it is, and queues a mail to the
   // address that this object holds: load the user first. `desc` goes to him. Settings that can't be read: as for
@@ -184,8 +189,8 @@ class User : private Frame {
   void readAccount(Recordset& row);
   void readFurther(Recordset& row);
   void readColumn(const Column& column, const Field& field);
-  Statement withColumns(Statement statement) const;
-  void fillColumn(Statement& statement, const Column& column) const;
+  SqlText withColumns(SqlText statement) const;
+  void fillColumn(SqlText& statement, const Column& column) const;
   void findOrganisation(Connection& connection, const Residence& residence);
   void readRoles(Connection& connection);
   // `table` as the statement writes it.
@@ -233,7 +238,7 @@ class User : private Frame {
   Boolean builtIn_ = false;
   Boolean sendSms_ = false;
   Boolean keyLogin_ = false;
-  Integer regState_ = 0;
+  Integer regState_ = accountNormal;
   Date pwdDate_;
   Long lgts_ = 0;
   Integer uType_ = Genaral;

@@ -44,13 +44,13 @@ void User::readColumn(const Column& column, const Field& field) {
   }
 }
 
-Statement User::withColumns(Statement statement) const {
+SqlText User::withColumns(SqlText statement) const {
   for (const Column& column : accountColumns) fillColumn(statement, column);
   for (const Column& column : furtherColumns) fillColumn(statement, column);
   return statement;
 }
 
-void User::fillColumn(Statement& statement, const Column& column) const {
+void User::fillColumn(SqlText& statement, const Column& column) const {
   if (const auto* text = std::get_if<String User::*>(&column.member)) {
     statement.text(column.name, this->**text);
   } else if (const auto* flag = std::get_if<Boolean User::*>(&column.member)) {

@@ -6,11 +6,6 @@
 namespace QVSa {
 namespace {
 
-// States of an account.
-constexpr Integer normal = 0;
-constexpr Integer waitingForAudit = 2;
-constexpr Integer refusedAtAudit = 3;
-
 constexpr const char* lineBreak = "\r\n";
 
 }  // namespace
@@ -25,7 +20,7 @@ Boolean User::Reg(const String& deptName, const String& desc) {
       company_ = deptName;
     }
     uType_ = autoReg;
-    regState_ = waitingForAudit;
+    regState_ = accountWaiting;
     Integer cycle = 0;
     if (!passesPolicy(Pwd_.text(), cycle)) return false;
     if (!insertUser()) return false;
@@ -35,7 +30,7 @@ Boolean User::Reg(const String& deptName, const String& desc) {
     insertRegInfo(connection, deptName, desc);
     if (!hasRegInfo(connection)) {
       Delete(Id_);
-      fail("User", 1130);
+      fail("User", message::notRegistered);
     }
     Home home;
     // The application is stored whatever becomes of the mail.
@@ -95,7 +90,7 @@ Boolean User::regAudit(Boolean pass, const String& desc, Long userId) {
     connection.Execute("set nocount on");
     connection.BeginTrans();
     connection.Execute(sql("update users set accstate=<accstate> where userId=<userId>")
-                           .number("accstate", pass ? normal : refusedAtAudit)
+                           .number("accstate", Integer{pass ? accountNormal : accountRefused})
                            .number("userId", id));
     connection.Execute(sql("update QVUserRegInfo set checkTime=<checkTime>,noPassReason=<noPassReason>"
                            " where userId=<userId>")

@@ -11,7 +11,7 @@ Boolean User::Save(Boolean passPwdCheck) {
     if (uType_ == Genaral && !passPwdCheck && !passesPolicy(Pwd_.text(), cycle)) return false;
     if (Id_ != 0) {
       // Also where the password is the old one: callers that leave it alone pass `passPwdCheck`.
-      if (pwdUsedBefore(cycle)) return refuse(1120);
+      if (pwdUsedBefore(cycle)) return refuse(message::passwordUsedBefore);
       if (!updateUser()) return false;
     } else if (!insertUser()) {
       return false;
@@ -41,7 +41,7 @@ void User::noteStored() {
 }
 
 Boolean User::insertUser() {
-  if (Name_.empty() || Login_.empty()) return refuse(1102);
+  if (Name_.empty() || Login_.empty()) return refuse(message::userIncomplete);
   Connection connection = open();
   connection.Execute("set nocount on");
   findDepartment(connection);
@@ -66,7 +66,7 @@ Boolean User::insertUser() {
 
 Long User::insertedId(Connection& connection) {
   Recordset row = connection.Execute("select scope_identity()");
-  if (row.EOF_()) fail("User", 1103);
+  if (row.EOF_()) fail("User", message::rowNotAdded);
   return row[0].asLong();
 }
 
@@ -104,12 +104,12 @@ void User::insertRow(Connection& connection) {
 }
 
 Boolean User::updateUser() {
-  if (Name_.empty() || Login_.empty()) return refuse(1102);
+  if (Name_.empty() || Login_.empty()) return refuse(message::userIncomplete);
   Connection connection = open();
   connection.Execute("set nocount on");
   connection.BeginTrans();
   // Saving a locked account unlocks it. One that waits for audit, or was refused there, stays what it is.
-  const Integer state = locked() ? Integer{0} : regState_;
+  const Integer state = locked() ? Integer{accountNormal} : regState_;
   updateRow(connection, state);
   if (!builtIn_) {
     connection.Execute("delete from userjob where userId=" + text(Id_));

@@ -34,7 +34,7 @@ class SessionId {
 // counter moves in one place, and loginAuth decides later what to say.
 Boolean User::testPassword(Connection& connection, const String& Pwd, Boolean* wrongPwd, Boolean authLd) {
   if (uType_ == ldapUser) {
-    if (!isInDirectory(connection, Pwd, authLd)) return refuse(1131);
+    if (!isInDirectory(connection, Pwd, authLd)) return refuse(message::notInDirectory);
     return true;
   }
   const Boolean right = uType_ == adUser ? isWindowsUser(Pwd) : Pwd_.is(Pwd);
@@ -70,9 +70,9 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
   SessionId given(sI);
   const Integer level = userVerifyLevel == nullptr ? Integer{0} : *userVerifyLevel;
   Boolean wrongPwd = false;
-  if (!GetOne(3, loginName, level <= 0, Pwd, &wrongPwd, authLd)) return false;
+  if (!GetOne(byLogin, loginName, level <= 0, Pwd, &wrongPwd, authLd)) return false;
   if (level == 1 && !digestMatches(Pwd)) wrongPwd = true;
-  if (!fromPermittedAddress(ipAddr)) return refuse(1132);
+  if (!fromPermittedAddress(ipAddr)) return refuse(message::addressNotPermitted);
 
   Sessions sessions;
   if (!hostName.empty() && !synLogin_) {
@@ -81,7 +81,7 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
       // The row has its texts without trailing blanks.
       const Boolean elsewhere = session->DBName() == DBName() && session->UserLogin() == trimRight(loginName) &&
                                 session->Computer() != trimRight(hostName);
-      if (elsewhere) return refuse(1133, {session->Computer()});
+      if (elsewhere) return refuse(message::signedOnElsewhere, {session->Computer()});
     }
   }
 
@@ -90,10 +90,10 @@ Boolean User::loginAuth(const String& loginName, const String& Pwd, String* sI, 
   // Where the policy can't be read, nothing of it is tested; but want of memory opens no locked account.
   const Boolean known = rule.GetOne();
   if (!known && rule.errNumber() == number::memory) return refuseAs(rule);
-  if (known && isLockedOut(rule)) return refuse(1118);
+  if (known && isLockedOut(rule)) return refuse(message::lockedOut);
   if (wrongPwd) {
     clearRecord();
-    return refuse(uType_ == adUser ? 1123 : 1106);
+    return refuse(uType_ == adUser ? message::domainPasswordWrong : message::passwordWrong);
   }
   // The host lets the user in as far as changing the password.
   if (isExpired(rule.maxDay())) return true;
@@ -116,8 +116,8 @@ Boolean User::fromPermittedAddress(const String& ipAddr) const {
 
 // An account that waits for audit or was refused counts as locked.
 Boolean User::isLockedOut(const safeRule& rule) {
-  if (rule.lockErr() && lgts_ >= rule.errTimes()) regState_ = 1;
-  return regState_ != 0;
+  if (rule.lockErr() && lgts_ >= rule.errTimes()) regState_ = accountLocked;
+  return regState_ != accountNormal;
 }
 
 // Reports the expiry and tells it by the result.
@@ -129,7 +129,7 @@ Boolean User::isExpired(Integer maxDay) {
   validDay_ = static_cast<Integer>(
       std::clamp<double>(left, std::numeric_limits<Integer>::min(), std::numeric_limits<Integer>::max()));
   if (validDay_ > 0) return false;
-  note(1119);
+  note(message::passwordExpired);
   return true;
 }
 
@@ -138,8 +138,8 @@ Boolean User::digestMatches(const String& digest) const {
 }
 
 Boolean User::loginAuth_1(const String& loginName, const String& pwdMd5) try {
-  if (!GetOne(3, loginName)) return false;
-  if (!digestMatches(pwdMd5)) return refuse(1106);
+  if (!GetOne(byLogin, loginName)) return false;
+  if (!digestMatches(pwdMd5)) return refuse(message::passwordWrong);
   return true;
 } catch (...) {
   return refuseButFailures();
@@ -147,10 +147,10 @@ Boolean User::loginAuth_1(const String& loginName, const String& pwdMd5) try {
 
 Boolean User::chgPwd(const String& oldPwd, const String& newPwd) {
   return operation(plain(), [&]() -> Boolean {
-    if (!isStored_ || !Pwd_.is(oldPwd)) return refuse(1121);
+    if (!isStored_ || !Pwd_.is(oldPwd)) return refuse(message::oldPasswordWrong);
     Integer cycle = 0;
     if (!passesPolicy(newPwd, cycle)) return false;
-    if (pwdUsedBefore(cycle, newPwd)) return refuse(1120, {cycle});
+    if (pwdUsedBefore(cycle, newPwd)) return refuse(message::passwordUsedBefore, {cycle});
 
     writePwd(newPwd);
     Pwd_ = StoredPassword(newPwd);

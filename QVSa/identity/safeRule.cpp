@@ -94,7 +94,7 @@ Boolean safeRule::checkPwd(const String& s) try {
   problems += missingCharacters(s);
   if (problems.empty()) return true;
   // One number for every rule of the policy, whatever the message.
-  note(messageNumber(3000), problems);
+  note(messageNumber(message::againstPolicy), problems);
   return false;
 } catch (...) {
   return refuseButFailures();

@@ -49,9 +49,9 @@ class safeRule : private Frame {
   // Writes the row. With lockErr False it also unlocks every account that was locked; the counters of failed sign-ons
   // stay, and count once lockErr is True again.
   Boolean Save();
-  // Whether `s` may be a password. Otherwise errNumber is 0x80040BB8 and errDescription holds what is missing, one
-  // sentence directly behind the other; it is empty after a success. Where the policy can't be read, the properties
-  // judge as they stand: those of a fresh object let every text pass.
+  // Whether `s` may be a password. Otherwise errNumber is againstPolicy (0x80040BB8) and errDescription holds what is
+  // missing, one sentence directly behind the other; it is empty after a success. Where the policy can't be read, the
+  // properties judge as they stand: those of a fresh object let every text pass.
   Boolean checkPwd(const String& s);
 
  private:

@@ -17,10 +17,10 @@ Boolean BKPlan::GetOne(Integer keyName, const String& keyValue) {
         "select t.*,b.path,b.delOld,b.delNum,b.delUnit"
         " from tasks t,QVBkPlan b"
         " where t.taskId=b.taskId";
-    if (keyName == 1) statement += " and t.taskId=<id>";
-    if (keyName == 2) statement += " and t.taskName=<name>";
+    if (keyName == byId) statement += " and t.taskId=<id>";
+    if (keyName == byName) statement += " and t.taskName=<name>";
     Recordset row = connection.Execute(sql(statement).number("id", keyValue).text("name", keyValue));
-    if (row.EOF_()) return refuse(3100);
+    if (row.EOF_()) return refuse(message::planUnknown);
     read(row);
     delFiles_ = row["delOld"].asBoolean();
     return true;
@@ -48,7 +48,7 @@ void BKPlan::read(Recordset& row) {
 
 Boolean BKPlan::Save() {
   const Long before = Id_;
-  const Boolean saved = operation(prefixed(3115).onIntegrity(3116), [&]() -> Boolean {
+  const Boolean saved = operation(prefixed(message::planNotSaved).onIntegrity(message::planExists), [&]() -> Boolean {
     const bool isNew = Id_ == 0;
     const String schDesc = schedule()->description();
     noteFailureOfSchedule();
@@ -72,7 +72,7 @@ Boolean BKPlan::Save() {
   return saved;
 }
 
-Statement BKPlan::taskSql(const String& statement, const String& schDesc) {
+SqlText BKPlan::taskSql(const String& statement, const String& schDesc) {
   return sql(statement)
       .number("id", Id_)
       .text("name", Name_)
@@ -95,7 +95,7 @@ Boolean BKPlan::insertTask(Connection& connection, const String& schDesc) {
               "<schDesc>)",
               schDesc));
   Recordset row = connection.Execute("select scope_identity()");
-  if (row.EOF_()) return refuse(3101);
+  if (row.EOF_()) return refuse(message::planNotAdded);
   Id_ = row[0].asLong();
   row.Close();
   connection.Execute(sql("insert into qvbkplan(taskId,path,delOld,delNum,delUnit) "
@@ -151,7 +151,7 @@ void BKPlan::newSche() {
 }
 
 Boolean BKPlan::Delete(Long Id) {
-  return operation(prefixed(3114), [&] {
+  return operation(prefixed(message::planNotDeleted), [&] {
     const Long plan = Id != 0 ? Id : Id_;
     Connection connection = open();
     connection.Execute("set nocount on");

@@ -17,6 +17,9 @@ class BKPlan : private Frame {
   using Frame::errDescription;
   using Frame::errNumber;
 
+  // What GetOne finds a plan by.
+  enum Key : Integer { byId = 1, byName = 2 };
+
   // Unique among all tasks.
   String Name() const { return Name_; }
   void Name(String value) { Name_ = std::move(value); }
@@ -38,7 +41,7 @@ class BKPlan : private Frame {
   Integer delUnit() const { return delUnit_; }
   void delUnit(Integer value) { delUnit_ = value; }
 
-  // Loads a plan by its Id (`keyName` 1) or its Name (2); by anything else the first of all. 0x80040C1C: no plan.
+  // Loads a plan by a Key; any other `keyName` loads the first of all. planUnknown (0x80040C1C): no plan.
   Boolean GetOne(Integer keyName = 0, const String& keyValue = "");
   // Inserts a plan without an Id, else updates it. Pending runs are replaced by the next one from now, finished ones
   // stay. 0x80040E2F the name is taken. A new plan has its Id from a save that succeeded. A schedule that can't be
@@ -62,7 +65,7 @@ class BKPlan : private Frame {
   // Everything but delFiles, which its readers take differently.
   void read(Recordset& row);
   // A statement on tasks with the plan's values.
-  Statement taskSql(const String& statement, const String& schDesc);
+  SqlText taskSql(const String& statement, const String& schDesc);
   Boolean insertTask(Connection& connection, const String& schDesc);
   void updateTask(Connection& connection, const String& schDesc);
   void noteFailureOfSchedule();

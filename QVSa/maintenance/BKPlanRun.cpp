@@ -5,6 +5,7 @@
 #include "QVSa/maintenance/DBMgr.h"
 #include "QVSa/numbering/IdMgr.h"
 #include "QVSa/resources/Messages.h"
+#include "QVSa/syslog/LogRecord.h"
 #include "platform/Files.h"
 #include "platform/Folders.h"
 #include "platform/NewFile.h"
@@ -70,7 +71,7 @@ Boolean BKPlan::exec(Long schNo) {
 
     DBMgr manager;
     const Boolean done = manager.BackUpDB(server(), folder + "\\" + sysFile, folder + "\\" + appFile, "", "");
-    if (!done) note(manager.errNumber(), LoadResString(3103) + manager.errDescription());
+    if (!done) note(manager.errNumber(), LoadResString(message::backupFailed) + manager.errDescription());
 
     Connection connection = open();
     const Date next = schedule()->GetNextTime(now);
@@ -111,7 +112,6 @@ Boolean BKPlan::isOwnBackup(Connection& connection, const String& folder) {
 }
 
 void BKPlan::log(Connection& connection, const String& opDesc) {
-  constexpr Long administration = 3;
   IdMgr numbers;
   connectAlike(numbers);
   const String logId = numbers.newId("_log");
@@ -121,7 +121,7 @@ void BKPlan::log(Connection& connection, const String& opDesc) {
                          " )"
                          " values (<logId>,<logType>,getdate(),1,<userName>,<computer>,<funcName>,<opDesc>)")
                          .text("logId", logId)
-                         .number("logType", administration)
+                         .number("logType", administrationLog)
                          .text("userName", "")
                          .text("computer", platform::services().computerName())
                          .text("funcName", LoadResString(3105))

@@ -13,7 +13,7 @@ std::shared_ptr<BKPlan> BKPlans::Add(Long Id, const String& Name, String* path) 
 }
 
 Boolean BKPlans::GetAll() {
-  return operation(prefixed(3104), [&] {
+  return operation(prefixed(message::plansNotListed), [&] {
     Connection connection = open();
     Recordset row;
     for (row.Open("select t.*,b.path,b.delOld,b.delNum,b.delUnit"

@@ -7,7 +7,7 @@ namespace QVSa {
 
 Boolean DBMgr::BackUpDB(const String& ServerName, const String& sysFile, const String& appFile, const String&,
                         const String& tpPwd) {
-  return operation(prefixed(2906).number(messageNumber(2906)), [&] {
+  return operation(prefixed(message::notBackedUp).number(messageNumber(message::notBackedUp)), [&] {
     Connection connection;
     connection.Open(buildConnString(ServerName, "master", false));
     BackupLock before;
@@ -67,7 +67,7 @@ Boolean DBMgr::decryptTmps(const String& server, const String& Pwd) {
     row.Open("select isnull(roleSpec,'') from roles where roleName='Report Owners'", connection);
     const auto lock = BackupLock::read(row.EOF_() ? String() : row[0].asText());
     if (!lock) return true;
-    if (lock->pwd != Pwd) return refuse(2909);
+    if (lock->pwd != Pwd) return refuse(message::protectionPasswordWrong);
     connection.Execute("update roles set roleSpec='' where roleName='Report Owners'");
     return true;
   });

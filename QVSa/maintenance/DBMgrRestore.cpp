@@ -39,9 +39,9 @@ class SingleUserMode {
 
 Boolean DBMgr::RestoreDB(const String& ServerName, const String& sysFile, const String& appFile, const String& saPwd,
                          Boolean, const String& saUid) {
-  return operation(prefixed(2905), [&] {
-    if (!platform::fileExists(appFile)) fail("DBMgr", 2903, {appFile});
-    if (!platform::fileExists(sysFile)) fail("DBMgr", 2904, {sysFile});
+  return operation(prefixed(message::notRestored), [&] {
+    if (!platform::fileExists(appFile)) fail("DBMgr", message::applicationBackupMissing, {appFile});
+    if (!platform::fileExists(sysFile)) fail("DBMgr", message::systemBackupMissing, {sysFile});
     saConnString_ = "provider=sqloledb;data source=" + serverOnly(ServerName) + ";database=master;uid=" + saUid +
                     ";pwd=" + saPwd + ";";
     if (!restoreOneDB("QVSys", sysFile)) return false;
@@ -64,7 +64,7 @@ Boolean DBMgr::restoreOneDB(const String& DBName, const String& bakFile) {
       files.Open("select name, fileName from sysfiles", connection);
       const auto rows = files.GetRows();
       files.Close();
-      if (rows.size() < 2) return refuse(2907);
+      if (rows.size() < 2) return refuse(message::backupDamaged);
       connection.Execute("use master");
       connection.Execute(restoreStatement(DBName, bakFile, rows));
       alone.end();

@@ -85,7 +85,7 @@ void QVAgent::fetchUpdateProgram() {
   const auto modified = platform::lastModified(local);
   if (modified && row["updtime"].asDate() <= *modified) return;
   String errText;
-  if (!fieldToFile(row["Content"], local, errText)) note(2701);
+  if (!fieldToFile(row["Content"], local, errText)) note(message::consoleNotDownloaded);
 }
 
 }  // namespace QVSa

@@ -24,8 +24,8 @@ class QVAgent : private Frame {
   // Opens the connection and reads the four texts; one that the server lacks keeps its value. Throws Failure.
   void connect(const String& server);
   // Compares the program's files beside the running one with those shipped: 0 they are current, 1 one is missing or
-  // differs, -1 failure. With 1 the update program lies beside them, unless 0x80040A8D tells that it could not be
-  // written; it is not started.
+  // differs, -1 failure. With 1 the update program lies beside them, unless consoleNotDownloaded (0x80040A8D) tells
+  // that it could not be written; it is not started.
   Integer newFiles();
 
  private:

@@ -35,7 +35,8 @@ Boolean tmpSafe::Save(Boolean changeAll) {
 
 void tmpSafe::dropDefaultPasswords(Connection& connection) {
   Recordset row;
-  row.Open("select rtUid,rtPwd from repTmps where rtPwd is not null and rtPwd<>''", connection, 1, 3);
+  row.Open("select rtUid,rtPwd from repTmps where rtPwd is not null and rtPwd<>''", connection, adOpenKeyset,
+           adLockOptimistic);
   for (; !row.EOF_(); row.MoveNext()) {
     const auto own = StoredPassword::read(row["rtPwd"].asText(), secrets::templatePwdKey);
     if (own.is(secrets::defaultTemplatePwd)) row["rtPwd"].Value("");
@@ -48,9 +49,9 @@ Boolean tmpSafe::getPwd(const String& SessionId, String& x) {
     connection.Open(buildConnString(server(), "", false));
     Recordset row = connection.Execute(sql(" select sesid from sesLog where sesId = <SesID>").text("SesID", SessionId));
     x.clear();
-    if (row.EOF_()) fail("tmpSafe", 33301);
+    if (row.EOF_()) fail("tmpSafe", message::readingIllegal);
     // A host would take the empty text for a template without protection.
-    if (!protectPwd_.isReadable()) fail("tmpSafe", 33302);
+    if (!protectPwd_.isReadable()) fail("tmpSafe", message::readingFailed);
     x = protectPwd_.text();
     return true;
   });

@@ -20,8 +20,8 @@ class tmpSafe : private Frame {
   // the time of `connect`, the templates that still have the default one do. Not one transaction: a failure behind the
   // first step leaves the new password in place.
   Boolean Save(Boolean changeAll = false);
-  // Gives the password to the holder of session `SessionId`. An empty `x` and 0x80048215 for no such session,
-  // 0x80048216 where the stored password does not decrypt.
+  // Gives the password to the holder of session `SessionId`. An empty `x` and readingIllegal (0x80048215) for no such
+  // session, readingFailed (0x80048216) where the stored password does not decrypt.
   Boolean getPwd(const String& SessionId, String& x);
 
  private:

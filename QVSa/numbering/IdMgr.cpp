@@ -11,7 +11,7 @@ Boolean IdMgr::GetOne(const String& idName) {
     Connection connection = open();
     connection.Execute("set nocount on");
     Recordset row = connection.Execute(sql("select * from idRule where idName=<idName>").text("idName", idName));
-    if (row.EOF_()) fail("IdMgr", 1502, {idName});
+    if (row.EOF_()) fail("IdMgr", message::numberRuleUnknown, {idName});
     idName_ = idName;
     preFix_ = trim(row["prefix"].asText());
     DateFormat_ = row["ymdStyle"].asInteger();
@@ -24,7 +24,7 @@ Boolean IdMgr::GetOne(const String& idName) {
 }
 
 Boolean IdMgr::Delete(const String& idName) {
-  return operation(prefixed(1504), [&] {
+  return operation(prefixed(message::numberRuleNotDeleted), [&] {
     Connection connection = open();
     connection.Execute("set nocount on");
     connection.Execute(
@@ -34,9 +34,9 @@ Boolean IdMgr::Delete(const String& idName) {
 }
 
 Boolean IdMgr::Save() {
-  return operation(prefixed(1505).onIntegrity(1506), [&] {
+  return operation(prefixed(message::numberRuleNotSaved).onIntegrity(message::numberRuleExists), [&] {
     Connection connection;
-    connection.CursorLocation(3);
+    connection.CursorLocation(adUseClient);
     connection.Open(connectionString());
     connection.Execute("set nocount on");
     connection.BeginTrans();
@@ -66,7 +66,7 @@ void IdMgr::updateRule(Connection& connection) {
   if (numPlace_ < oldNumPlace_) {
     Recordset used =
         connection.Execute(sql("select count(*) from idRec where idName=<idName>").text("idName", idName_));
-    if (used[0].asLong() > 0) fail("IdMgr", 1508);
+    if (used[0].asLong() > 0) fail("IdMgr", message::numbersIssued);
   }
   connection.Execute(sql("Update idRule set "
                          "IdName=<idName>"

@@ -38,22 +38,23 @@ class IdMgr : private Frame {
   // database server's. `vConnstring` is a whole connection string for this call, which then needs no connect.
   // `startNo` 0 or more is the sequence number to use, and what the rule released on the period's first day is
   // forgotten. With `rcId` a released number may come back, and the number is booked on that record and on `sesId`.
-  // Empty on failure: 0x800405DD no name, 0x800405DE no such rule, 0x800405E3 width exceeded, 0x80040E2F somebody else
-  // holds the period's row at this moment (trying again is safe).
+  // Empty on failure: numberNameMissing (0x800405DD) no name, numberRuleUnknown (0x800405DE) no such rule,
+  // numbersUsedUp (0x800405E3) width exceeded, 0x80040E2F somebody else holds the period's row at this moment (trying
+  // again is safe).
   String newId(const String& idName, const String& vConnstring = "", Long startNo = -1, const String& rcId = "",
                const String& sesId = "");
   // Makes the next number of the current period `startNo`. 0 does nothing and is a success; a negative number issues an
   // ordinary number, which is then used up. Fails as newId does.
   Boolean setStartNo(Long startNo);
 
-  // Loads a rule; 0x800405DE where there is none.
+  // Loads a rule; numberRuleUnknown (0x800405DE) where there is none.
   Boolean GetOne(const String& idName);
   // Removes the rule `idName` (empty: this one); its counters and released numbers stay.
   Boolean Delete(const String& idName = "");
   // Inserts the rule, or updates the one that GetOne or an earlier Save left here. A width above the one
   // that GetOne read (0 where it never ran) widens the numbers already counted, with every Save anew: so call GetOne
   // before another Save once numbers were issued, and after each change of the width, or numbers come twice. 0x80040E2F
-  // the name is taken, 0x800405E4 the rule has issued numbers and can't be narrowed.
+  // the name is taken, numbersIssued (0x800405E4) the rule has issued numbers and can't be narrowed.
   Boolean Save();
   // Loads `strOld` and saves it as `strNew`. Counters stay under the old name: the new one starts afresh.
   Boolean Rename(const String& strOld, const String& strNew);

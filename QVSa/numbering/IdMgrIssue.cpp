@@ -40,14 +40,14 @@ struct IdMgr::Issue {
 
 String IdMgr::newId(const String& idName, const String& vConnstring, Long startNo, const String& rcId,
                     const String& sesId) {
-  return operation(prefixed(1503), [&]() -> String {
+  return operation(prefixed(message::numberNotIssued), [&]() -> String {
     Issue issue{idName.empty() ? idName_ : idName, startNo, rcId, sesId};
-    if (issue.name.empty()) return refuse(1501);
+    if (issue.name.empty()) return refuse(message::numberNameMissing);
 
     Connection connection;
     connection.Open(vConnstring.empty() ? connectionString() : vConnstring);
     connection.Execute("set nocount on");
-    if (!readRule(connection, issue)) return refuse(1502, {issue.name});
+    if (!readRule(connection, issue)) return refuse(message::numberRuleUnknown, {issue.name});
 
     if (!rcId.empty() && issue.reuseStyle > noReuse) {
       const String released = reuse(connection, issue);
@@ -133,7 +133,8 @@ Long IdMgr::nextNumber(const Issue& issue, const String& maxId) {
     if (number == std::numeric_limits<Long>::max()) throw runtimeFailure(number::overflow);
     ++number;
   }
-  if (std::pow(10.0, issue.noStyle) <= number) fail("IdMgr", 1507, {issue.name, issue.noStyle, maxId});
+  if (std::pow(10.0, issue.noStyle) <= number)
+    fail("IdMgr", message::numbersUsedUp, {issue.name, issue.noStyle, maxId});
   return number;
 }
 

@@ -5,11 +5,12 @@ namespace QVSa {
 Boolean IdMgrs::GetAll() {
   return operation(plain(), [&] {
     Connection connection;
-    connection.CursorLocation(3);
+    connection.CursorLocation(adUseClient);
     connection.Open(gsDBConnString());
     items_.clear();
     Recordset row;
-    for (row.Open("select * from idRule where predefined=0", connection, 2, 3); !row.EOF_(); row.MoveNext()) {
+    for (row.Open("select * from idRule where predefined=0", connection, adOpenDynamic, adLockOptimistic); !row.EOF_();
+         row.MoveNext()) {
       auto rule = std::make_shared<IdMgr>();
       rule->idName(trim(row["idname"].asText()));
       rule->preFix(trim(row["prefix"].asText()));

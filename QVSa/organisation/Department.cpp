@@ -6,9 +6,9 @@ namespace QVSa {
 
 Boolean Department::GetOne(Integer keyName, const String& keyValue) {
   return operation(plain(), [&] {
-    const String key = keyName == 1   ? " and d1.deptNo=<deptNo>"
-                       : keyName == 2 ? " and d1.deptName=<fullName>"
-                                      : " and d1.deptId=<deptId>";
+    const String key = keyName == byNumber ? " and d1.deptNo=<deptNo>"
+                       : keyName == byName ? " and d1.deptName=<fullName>"
+                                           : " and d1.deptId=<deptId>";
     Connection connection = open();
     connection.Execute("set nocount on");
     bool found = false;
@@ -27,7 +27,7 @@ Boolean Department::GetOne(Integer keyName, const String& keyValue) {
         // A row without a path is damaged: the load ends here, with the fields copied.
         myPath = row["path"].Value().toText();
       } else {
-        note(1001);
+        note(message::departmentUnknown);
       }
     }
     // Also where no row was found: the organisation is then the root.
@@ -75,11 +75,12 @@ Boolean Department::Delete(const String& Id) {
     {
       Recordset row = connection.Execute(
           sql("select deptId from departments where deptNo=<deptNo>").text("deptNo", Id.empty() ? Id_ : Id));
-      if (row.EOF_()) return refuse(1001);
+      if (row.EOF_()) return refuse(message::departmentUnknown);
       id = row["deptId"].asLong();
     }
-    if (count("select count(*) from departments where superDept=" + text(id)) > 0) return refuse(1004);
-    if (count("select count(*) from users where deptId=" + text(id)) > 0) return refuse(1006);
+    if (count("select count(*) from departments where superDept=" + text(id)) > 0)
+      return refuse(message::departmentHasChildren);
+    if (count("select count(*) from users where deptId=" + text(id)) > 0) return refuse(message::departmentHasUsers);
 
     Jobs jobs;
     Boolean ok = false;

@@ -19,6 +19,9 @@ class Department : private Frame {
   using Frame::errDescription;
   using Frame::errNumber;
 
+  // What GetOne finds a department by.
+  enum Key : Integer { byInnerId = 0, byNumber = 1, byName = 2 };
+
   // A department of outside users. Written by the first save only.
   Boolean isOuter() const { return isOuter_; }
   void isOuter(Boolean value) { isOuter_ = value; }
@@ -45,17 +48,19 @@ class Department : private Frame {
   String fullId() const { return fullId_; }
   void fullId(String value) { fullId_ = std::move(value); }
 
-  // Loads by number (`keyName` 1), by name (2), by inner id (any other). 0x800403E9 where there is none.
+  // Loads by a Key; any other `keyName` is byInnerId. departmentUnknown (0x800403E9) where there is none.
   Boolean GetOne(Integer keyName, const String& keyValue);
   // Inserts the department, or updates it where `InnerId` is not 0; a change of place or name rewrites the paths and
-  // full names of all below it, in the same transaction. A place inside its own subtree is not refused. 0x800403EA
-  // number or name empty, 0x800403EB no such superior, 0x80040E57 too deep: a path has room for 850 characters, 121
-  // levels where the inner ids have six digits, and a full name for 4,000.
-  // An insert is not one transaction: where it fails behind its first statement, the row is there without a path. With
-  // `InnerId` set, another Save gives it one and changes no other row; with 0, delete it by its number first.
+  // full names of all below it, in the same transaction. A place inside its own subtree is not refused.
+  // departmentIncomplete (0x800403EA) number or name empty, superiorUnknown (0x800403EB) no such superior, 0x80040E57
+  // too deep: a path has room for 850 characters, 121 levels where the inner ids have six digits, and a full name for
+  // 4,000. An insert is not one transaction: where it fails behind its first statement, the row is there without a
+  // path. With `InnerId` set, another Save gives it one and changes no other row; with 0, delete it by its number
+  // first.
   Boolean Save();
-  // Deletes the department numbered `Id` (empty: this one) and its jobs. 0x800403E9 there is none, 0x800403EC it has
-  // sub departments, 0x800403EE it has users. Not one transaction: the jobs stay removed where the last step fails.
+  // Deletes the department numbered `Id` (empty: this one) and its jobs. departmentUnknown (0x800403E9) there is none,
+  // departmentHasChildren (0x800403EC) it has sub departments, departmentHasUsers (0x800403EE) it has users. Not one
+  // transaction: the jobs stay removed where the last step fails.
   Boolean Delete(const String& Id = "");
 
   // This department and all below it, in no order, each under its number. The result is not connected: its records

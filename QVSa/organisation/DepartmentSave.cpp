@@ -34,7 +34,7 @@ struct Department::Stored {
 
 Boolean Department::Save() {
   return operation(plain(), [&]() -> Boolean {
-    if (Id_.empty() || Name_.empty()) return refuse(1002);
+    if (Id_.empty() || Name_.empty()) return refuse(message::departmentIncomplete);
     return InnerId_ == 0 ? insertDept() : updateDept();
   });
 }
@@ -47,7 +47,7 @@ Boolean Department::insertDept() {
     superInnerId_ = 0;
   } else {
     const auto superior = findSuper(connection);
-    if (!superior) return refuse(1003);
+    if (!superior) return refuse(message::superiorUnknown);
     place = {trim(superior->path), superior->fullNameBelow};
   }
   requireRoomBelow(place.path);
@@ -62,7 +62,7 @@ Boolean Department::insertDept() {
                          .text("fullName", place.fullName));
   {
     Recordset row = connection.Execute("select scope_identity()");
-    if (row.EOF_()) fail("Department", 1103);
+    if (row.EOF_()) fail("Department", message::rowNotAdded);
     InnerId_ = row[0].asLong();
   }
   // In two steps, as the path holds the id that only the insert hands out.
@@ -89,7 +89,7 @@ Boolean Department::updateDept() {
   connection.Execute("set nocount on");
   const Stored stored = readStored(connection);
   const auto place = locate(connection, stored);
-  if (!place) return refuse(1003);
+  if (!place) return refuse(message::superiorUnknown);
 
   connection.BeginTrans();
   updateRow(connection, *place);

@@ -3,7 +3,7 @@
 namespace QVSa {
 namespace {
 
-void fillPath(Statement& statement, Integer isSameOrg, const String& orgNo, Integer x, const String& jobIds) {
+void fillPath(SqlText& statement, Integer isSameOrg, const String& orgNo, Integer x, const String& jobIds) {
   if (isSameOrg == 1) statement.text("orgNO", orgNo);
   if (isSameOrg != 0 && isSameOrg != 1) statement.number("orgNO", orgNo);
   if (x != -1) statement.number("X", x);
@@ -104,7 +104,7 @@ Boolean Departments::GetRoot() {
 }
 
 Boolean Departments::getAllSuper(const String& jobIds, Integer isSameOrg, const String& orgNo, Integer x) {
-  return operation(prefixedBlank(1117), [&] {
+  return operation(prefixedBlank(message::usersNotListed), [&] {
     clearItems();
     Connection connection = open();
     String statement;
@@ -129,7 +129,7 @@ Boolean Departments::getAllSuper(const String& jobIds, Integer isSameOrg, const 
     }
     if (x != -1) statement += isSameOrg == 1 ? " and jd.x = <X> " : " and x = <X> ";
     statement += " order by path ";
-    Statement filled = sql(statement);
+    SqlText filled = sql(statement);
     fillPath(filled, isSameOrg, orgNo, x, jobIds);
     addRowsOfPath(connection.Execute(filled), "pathDeptName");
     return true;
@@ -137,7 +137,7 @@ Boolean Departments::getAllSuper(const String& jobIds, Integer isSameOrg, const 
 }
 
 Boolean Departments::getAllSuperWithLevel(const String& jobIds, Integer isSameOrg, const String& orgNo, Integer x) {
-  return operation(prefixedBlank(1117), [&] {
+  return operation(prefixedBlank(message::usersNotListed), [&] {
     clearItems();
     Connection connection = open();
     String statement;
@@ -163,7 +163,7 @@ Boolean Departments::getAllSuperWithLevel(const String& jobIds, Integer isSameOr
     }
     if (x != -1) statement += isSameOrg == 1 ? " and jd.x = <X> " : " and x = <X> ";
     statement += isSameOrg == 1 ? "order by jd.l , jd.deptno " : "order by l , deptno ";
-    Statement filled = sql(statement);
+    SqlText filled = sql(statement);
     fillPath(filled, isSameOrg, orgNo, x, jobIds);
     addRowsOfPath(connection.Execute(filled), "fullName");
     return true;

@@ -3,7 +3,7 @@
 namespace QVSa {
 
 Boolean Jobs::GetAll(const String& deptId, const String& roleName, Long userId) {
-  return operation(prefixedBlank(3101), [&] {
+  return operation(prefixedBlank(message::planNotAdded), [&] {
     clearItems();
     Connection connection = open();
     String statement =
@@ -20,7 +20,7 @@ Boolean Jobs::GetAll(const String& deptId, const String& roleName, Long userId) 
 }
 
 Boolean Jobs::GetAllOfDept(Long deptId, const String& roleName, Long userId) {
-  return operation(prefixedBlank(3101), [&] {
+  return operation(prefixedBlank(message::planNotAdded), [&] {
     clearItems();
     Connection connection = open();
     String statement =
@@ -42,7 +42,7 @@ Boolean Jobs::GetAllOfDept(Long deptId, const String& roleName, Long userId) {
 }
 
 Boolean Jobs::GetAllSameRole(Long userId) {
-  return operation(prefixedBlank(3101), [&] {
+  return operation(prefixedBlank(message::planNotAdded), [&] {
     clearItems();
     Connection connection = open();
     String statement =

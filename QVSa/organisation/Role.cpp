@@ -6,9 +6,9 @@ namespace QVSa {
 
 Boolean Role::GetOne(Integer keyName, const Variant& keyValue) {
   return operation(plain(), [&]() -> Boolean {
-    const String key = keyName == 1   ? " where roleId=<roleId>"
-                       : keyName == 2 ? " where roleName=<roleName>"
-                                      : " where 1=2";
+    const String key = keyName == byId     ? " where roleId=<roleId>"
+                       : keyName == byName ? " where roleName=<roleName>"
+                                           : " where 1=2";
     Connection connection = open();
     connection.Execute("set nocount on");
     Recordset row = connection.Execute(sql("select roleId,roleName,roleDesc,builtIn , "
@@ -17,7 +17,7 @@ Boolean Role::GetOne(Integer keyName, const Variant& keyValue) {
                                            key)
                                            .number("roleId", keyValue)
                                            .text("roleName", keyValue));
-    if (row.EOF_()) return refuse(1201, {keyValue});
+    if (row.EOF_()) return refuse(message::roleUnknown, {keyValue});
     read(row);
     return true;
   });
@@ -41,13 +41,13 @@ Boolean Role::Save() { return Id_ == 0 ? insertRole() : updateRole(); }
 
 Boolean Role::insertRole() {
   return operation(plain(), [&]() -> Boolean {
-    if (Name_.empty()) return refuse(1202);
+    if (Name_.empty()) return refuse(message::roleIncomplete);
     Connection connection = open();
     connection.Execute("set nocount on");
     const Long taken =
         connection.Execute(sql("select count(*) from roles where roleName=<roleName>").text("roleName", Name_))[0]
             .asLong();
-    if (taken > 0) return refuse(1209);
+    if (taken > 0) return refuse(message::roleExists);
 
     connection.BeginTrans();
     connection.Execute(
@@ -58,7 +58,7 @@ Boolean Role::insertRole() {
     Long id = 0;
     {
       Recordset row = connection.Execute("select scope_identity()");
-      if (row.EOF_()) return refuse(1203);
+      if (row.EOF_()) return refuse(message::roleNotAdded);
       id = row[0].asLong();
     }
     connection.CommitTrans();
@@ -68,7 +68,7 @@ Boolean Role::insertRole() {
 }
 
 Boolean Role::updateRole() {
-  return operation(prefixedBlank(1204), [&] {
+  return operation(prefixedBlank(message::roleNotUpdated), [&] {
     Connection connection = open();
     connection.Execute("set nocount on");
     connection.Execute(
@@ -88,7 +88,7 @@ Boolean Role::updateRole() {
   });
 }
 
-Statement Role::filled(const String& statement) {
+SqlText Role::filled(const String& statement) {
   return sql(statement)
       .text("roleName", Name_)
       .text("roleDesc", description_)
@@ -102,7 +102,7 @@ Statement Role::filled(const String& statement) {
 }
 
 Boolean Role::Delete(Long Id) {
-  return operation(prefixedBlank(1205), [&] {
+  return operation(prefixedBlank(message::roleNotDeleted), [&] {
     const Long id = Id == 0 ? Id_ : Id;
     Connection connection = open();
     connection.Execute("set nocount on");

@@ -15,6 +15,9 @@ class Role : private Frame {
   using Frame::errDescription;
   using Frame::errNumber;
 
+  // What GetOne finds a role by.
+  enum Key : Integer { byId = 1, byName = 2 };
+
   // 0 while the role is not stored.
   Long Id() const { return Id_; }
   void Id(Long value) { Id_ = value; }
@@ -41,10 +44,10 @@ class Role : private Frame {
   Boolean otherCanDesign() const { return otherCanDesign_; }
   void otherCanDesign(Boolean value) { otherCanDesign_ = value; }
 
-  // Loads by id (`keyName` 1) or name (2); any other finds none. 0x800404B1 where there is no such role.
+  // Loads by a Key; any other `keyName` finds none. roleUnknown (0x800404B1) where there is no such role.
   Boolean GetOne(Integer keyName, const Variant& keyValue);
   // Inserts the role, or updates it where `Id` is not 0; an id that is not stored changes nothing and gives True.
-  // For a new one: 0x800404B2 name empty, 0x800404B9 name taken. An update tests neither.
+  // For a new one: roleIncomplete (0x800404B2) name empty, roleExists (0x800404B9) name taken. An update tests neither.
   Boolean Save();
   // Deletes the role `Id` (0: this one), its jobs and all that hangs on them; built-in ones too, and unknown ones give
   // True. Groups keep their rows for it. What hangs on the jobs goes table by table: rights to fields, tasks,
@@ -66,10 +69,10 @@ class Role : private Frame {
   Boolean UpdateUsers(const String& newUserJobIds, const String& delUserJobIds);
 
   // Makes jobs of this role in the departments `depts`, and removes those in `DeptIdsDeleted` with all that hangs on
-  // them: inner ids, comma-separated. An id in both loses its job. Every failure is 0x800404B8.
+  // them: inner ids, comma-separated. An id in both loses its job. Every failure is roleJobsNotSet (0x800404B8).
   Boolean setJobs(const String& depts, const String& DeptIdsDeleted = "");
-  // The job of this role in a department, given by its inner id as text. 0 with 0x800404BA where there is none, -1 on
-  // any other failure.
+  // The job of this role in a department, given by its inner id as text. 0 with roleNotInDepartment (0x800404BA) where
+  // there is none, -1 on any other failure.
   Long GetJobIdOfTheDept(const String& deptId);
   // What the role `Id` (0: this one) may reach, as XML: <acl><rep id name authType tName/>...</acl>, by direct rights
   // and by process tasks (authType 3, tName the task). The empty text where there is nothing.
@@ -81,7 +84,7 @@ class Role : private Frame {
   void read(Recordset& row);
   Boolean insertRole();
   Boolean updateRole();
-  Statement filled(const String& statement);
+  SqlText filled(const String& statement);
 
   Long Id_ = 0;
   String Name_;

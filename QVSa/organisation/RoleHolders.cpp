@@ -5,7 +5,7 @@
 namespace QVSa {
 
 std::shared_ptr<Users> Role::GetUsers(Boolean, Boolean noBuiltIn, const String& deptId) {
-  return operation(prefixedBlank(1206).filledWith(Name_), [&]() -> std::shared_ptr<Users> {
+  return operation(prefixedBlank(message::holdersNotListed).filledWith(Name_), [&]() -> std::shared_ptr<Users> {
     auto users = std::make_shared<Users>();
     connectAlike(*users);
     if (!users->GetAll(deptId, Id_, noBuiltIn, -1, -1)) return refuseAs(*users);
@@ -14,7 +14,7 @@ std::shared_ptr<Users> Role::GetUsers(Boolean, Boolean noBuiltIn, const String& 
 }
 
 std::shared_ptr<Users> Role::GetUsersOfRole(const String& deptId, const String& roleName) {
-  return operation(prefixedBlank(1206).filledWith(Name_), [&]() -> std::shared_ptr<Users> {
+  return operation(prefixedBlank(message::holdersNotListed).filledWith(Name_), [&]() -> std::shared_ptr<Users> {
     auto users = std::make_shared<Users>();
     connectAlike(*users);
     const Integer dept = deptId.empty() ? Integer{0} : Variant(deptId).toInteger();

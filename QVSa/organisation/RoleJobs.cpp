@@ -4,7 +4,7 @@
 namespace QVSa {
 
 Boolean Role::setJobs(const String& depts, const String& DeptIdsDeleted) {
-  return operation(prefixed(1208).number(messageNumber(1208)), [&] {
+  return operation(prefixed(message::roleJobsNotSet).number(messageNumber(message::roleJobsNotSet)), [&] {
     const String id = text(Id_);
     Connection connection = open();
     connection.Execute("set nocount on");
@@ -41,7 +41,7 @@ Long Role::GetJobIdOfTheDept(const String& deptId) {
                                            .number("DeptID", deptId));
     if (row.EOF_()) {
       result = 0;
-      fail("Role", 1210);
+      fail("Role", message::roleNotInDepartment);
     }
     result = row["jobid"].asLong();
   });

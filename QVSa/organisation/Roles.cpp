@@ -12,7 +12,7 @@ std::shared_ptr<Role> Roles::Add(Long Id, const String& Name) {
 }
 
 Boolean Roles::GetAll() {
-  return operation(prefixedBlank(1207), [&] {
+  return operation(prefixedBlank(message::rolesNotListed), [&] {
     clearItems();
     Connection connection = open();
     Recordset row = connection.Execute(

@@ -16,9 +16,9 @@ Boolean User::setDept(const Department& dept) {
 }
 
 Boolean User::setManager(Integer flag, Long jobId, Long userId) {
-  return operation(prefixed(1114), [&] {
-    if (flag == 1 && jobId == 0) fail("User", 1112);
-    if (flag == 2 && userId == 0) fail("User", 1113);
+  return operation(prefixed(message::supervisorNotSet), [&] {
+    if (flag == 1 && jobId == 0) fail("User", message::supervisorJobMissing);
+    if (flag == 2 && userId == 0) fail("User", message::supervisorUserMissing);
     Connection connection = open();
     connection.Execute("set nocount on");
     connection.BeginTrans();
@@ -34,7 +34,7 @@ Boolean User::setManager(Integer flag, Long jobId, Long userId) {
 }
 
 Boolean User::getManager(Integer& flag, Long& jobId, Long& userId) {
-  return operation(prefixed(1115), [&] {
+  return operation(prefixed(message::supervisorNotRead), [&] {
     Connection connection = open();
     connection.Execute("set nocount on");
     Recordset row = connection.Execute("select * from userMgr where userId=" + text(Id_));
@@ -47,7 +47,7 @@ Boolean User::getManager(Integer& flag, Long& jobId, Long& userId) {
 }
 
 std::shared_ptr<Users> User::getSubUsers() {
-  return operation(prefixed(1116), [&] {
+  return operation(prefixed(message::subordinatesNotListed), [&] {
     Connection connection = open();
     connection.Execute("set nocount on");
     const String id = text(Id_);

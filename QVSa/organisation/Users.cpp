@@ -43,7 +43,7 @@ Variant Users::Clear() {
 }
 
 Boolean Users::GetAllOfTheDept(Long deptId) {
-  return operation(prefixedBlank(1117), [&] {
+  return operation(prefixedBlank(message::usersNotListed), [&] {
     Clear();
     Connection connection = open();
     String statement =
@@ -64,7 +64,7 @@ Boolean Users::GetAllOfTheDept(Long deptId) {
 }
 
 Boolean Users::GetAllOfTheDeptAndRole(Long deptId, const String& roleName) {
-  return operation(prefixedBlank(1117), [&] {
+  return operation(prefixedBlank(message::usersNotListed), [&] {
     Clear();
     Connection connection = open();
     String statement =
@@ -90,7 +90,7 @@ Boolean Users::GetAllOfTheDeptAndRole(Long deptId, const String& roleName) {
 }
 
 Boolean Users::getAllForSelUser(const String& Jobs, Long userId, Integer isSameOrg) {
-  return operation(prefixedBlank(1117), [&] {
+  return operation(prefixedBlank(message::usersNotListed), [&] {
     Clear();
     Connection connection = open();
     String statement =
@@ -126,9 +126,9 @@ Boolean Users::getAllForSelUser(const String& Jobs, Long userId, Integer isSameO
 }
 
 Long Users::GetList(Long deptId) {
-  return operation(prefixedBlank(1117), Long{-1}, [&](Long& result) {
+  return operation(prefixedBlank(message::usersNotListed), Long{-1}, [&](Long& result) {
     Connection connection;
-    connection.CursorLocation(3);
+    connection.CursorLocation(adUseClient);
     connection.Open(connectionString());
     connection.Execute("set nocount on");
     const auto& c = listCaptions_;
@@ -140,8 +140,8 @@ Long Users::GetList(Long deptId) {
                        " where u.deptId = d.deptId ";
     if (deptId > 0) statement += subtree;
     if (listRecordset_.State() == 1) listRecordset_.Close();
-    listRecordset_.CursorType(3);
-    listRecordset_.LockType(3);
+    listRecordset_.CursorType(adOpenStatic);
+    listRecordset_.LockType(adLockOptimistic);
     listRecordset_.Open(sql(statement).number("deptID", deptId), connection);
     listRecordset_.ActiveConnection(nullptr);
     result = listRecordset_.RecordCount();

@@ -47,7 +47,7 @@ Boolean Users::GetAllReg(Integer regState, Long deptId) {
 }
 
 Boolean Users::GetAll(const String& deptId, Long roleId, Boolean noBuiltIn, Long grpId, Integer uType) {
-  return operation(prefixedBlank(1117), [&] {
+  return operation(prefixedBlank(message::usersNotListed), [&] {
     Clear();
     Connection connection = open();
     connection.Execute("set nocount on");
@@ -101,7 +101,7 @@ std::shared_ptr<User> Users::listedUser(Recordset& row) const {
   user->readAccount(row);
   user->builtIn_ = row["isAbstract"].asBoolean();
   // Lists tell a lock, no other state.
-  user->regState(row["accstate"].isOne() ? Integer{1} : Integer{0});
+  user->regState(row["accstate"].isOne() ? accountLocked : accountNormal);
   user->deptId(row["deptId"].asText());
   user->isUser_ = true;
   user->isAdministrator_ = !row["j1"].isNull();

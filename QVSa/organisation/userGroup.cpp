@@ -26,7 +26,7 @@ String userGroup::GetUsers(Long Id) {
 }
 
 Boolean userGroup::SetUsers(const String& userList) {
-  return operation(prefixedBlank(1808), [&] {
+  return operation(prefixedBlank(message::groupMembersNotSet), [&] {
     const String id = text(Id_);
     Connection connection = open();
     connection.BeginTrans();
@@ -43,7 +43,7 @@ Boolean userGroup::SetUsers(const String& userList) {
 }
 
 Boolean userGroup::SetRoles(const String& roleList) {
-  return operation(prefixedBlank(1806), [&] {
+  return operation(prefixedBlank(message::groupRolesNotSet), [&] {
     const String id = text(Id_);
     Connection connection = open();
     connection.BeginTrans();
@@ -60,7 +60,7 @@ Boolean userGroup::SetRoles(const String& roleList) {
 }
 
 Boolean userGroup::GetRoles(String& roleList) {
-  return operation(prefixedBlank(1807), [&] {
+  return operation(prefixedBlank(message::groupRolesNotRead), [&] {
     roleList.clear();
     Connection connection = open();
     connection.Execute("set nocount on");
@@ -77,12 +77,12 @@ Boolean userGroup::GetRoles(String& roleList) {
 
 Boolean userGroup::GetOne(Integer keyName, const Variant& keyValue) {
   return operation(plain(), [&]() -> Boolean {
-    const String key = keyName == 1 ? " where gId=<gId>" : keyName == 2 ? " where gName=<gName>" : " where 1=2";
+    const String key = keyName == byId ? " where gId=<gId>" : keyName == byName ? " where gName=<gName>" : " where 1=2";
     Connection connection = open();
     connection.Execute("set nocount on");
     Recordset row = connection.Execute(
         sql("select gId,gName,gDesc from ItemGroups" + key).number("gId", keyValue).text("gName", keyValue));
-    if (row.EOF_()) return refuse(1805, {keyValue});
+    if (row.EOF_()) return refuse(message::groupUnknown, {keyValue});
     Id_ = row["gId"].asLong();
     Name_ = row["gName"].asText();
     if (!row["gDesc"].isNull()) description_ = row["gDesc"].asText();
@@ -92,13 +92,13 @@ Boolean userGroup::GetOne(Integer keyName, const Variant& keyValue) {
 
 Boolean userGroup::Save() {
   return operation(plain(), [&]() -> Boolean {
-    if (Name_.empty()) return refuse(1800);
+    if (Name_.empty()) return refuse(message::groupIncomplete);
     {
       Connection connection = open();
       connection.Execute("set nocount on");
       String statement = "select count(*) from ItemGroups where gName=<gName>";
       if (Id_ != 0) statement += " and gId<>" + text(Id_);
-      if (connection.Execute(sql(statement).text("gName", Name_))[0].asLong() > 0) return refuse(1801);
+      if (connection.Execute(sql(statement).text("gName", Name_))[0].asLong() > 0) return refuse(message::groupExists);
     }
     return Id_ == 0 ? insertGroup() : updateGroup();
   });
@@ -116,7 +116,7 @@ Boolean userGroup::insertGroup() {
     Long id = 0;
     {
       Recordset row = connection.Execute("select scope_identity()");
-      if (row.EOF_()) return refuse(1802);
+      if (row.EOF_()) return refuse(message::groupNotAdded);
       id = row[0].asLong();
     }
     connection.CommitTrans();
@@ -126,7 +126,7 @@ Boolean userGroup::insertGroup() {
 }
 
 Boolean userGroup::updateGroup() {
-  return operation(prefixedBlank(1803), [&] {
+  return operation(prefixedBlank(message::groupNotUpdated), [&] {
     Connection connection = open();
     connection.Execute("set nocount on");
     connection.Execute(sql("update ItemGroups set "
@@ -141,7 +141,7 @@ Boolean userGroup::updateGroup() {
 }
 
 Boolean userGroup::Delete(Long Id) {
-  return operation(prefixedBlank(1804), [&] {
+  return operation(prefixedBlank(message::groupNotDeleted), [&] {
     const String id = text(Id == 0 ? Id_ : Id);
     Connection connection = open();
     connection.Execute("set nocount on");

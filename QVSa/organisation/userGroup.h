@@ -13,6 +13,9 @@ class userGroup : private Frame {
   using Frame::errDescription;
   using Frame::errNumber;
 
+  // What GetOne finds a group by.
+  enum Key : Integer { byId = 1, byName = 2 };
+
   // 0 for a new group; its members and roles are then those of nobody's group 0.
   Long Id() const { return Id_; }
   String Name() const { return Name_; }
@@ -30,11 +33,12 @@ class userGroup : private Frame {
   // Replaces the roles, in the form that GetRoles gives: a name that holds a comma can't be set.
   Boolean SetRoles(const String& roleList);
 
-  // Loads by id (`keyName` 1) or name (2); any other finds none. 0x8004070D where there is no such group.
+  // Loads by a Key; any other `keyName` finds none. groupUnknown (0x8004070D) where there is no such group.
   Boolean GetOne(Integer keyName, const Variant& keyValue);
   // Deletes group `Id` (0: this one) with its members and roles; an unknown one gives True.
   Boolean Delete(Long Id = 0);
-  // Inserts or updates the group. 0x80040708 name empty, 0x80040709 name taken by another group.
+  // Inserts or updates the group. groupIncomplete (0x80040708) name empty, groupExists (0x80040709) name taken by
+  // another group.
   Boolean Save();
 
  private:

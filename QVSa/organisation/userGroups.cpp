@@ -11,7 +11,7 @@ std::shared_ptr<userGroup> userGroups::Add(const String& Name) {
 }
 
 Boolean userGroups::GetAll() {
-  return operation(prefixedBlank(1809), [&] {
+  return operation(prefixedBlank(message::groupsNotListed), [&] {
     clearItems();
     Connection connection = open();
     connection.Execute("set nocount on");
@@ -19,7 +19,7 @@ Boolean userGroups::GetAll() {
       auto group = std::make_shared<userGroup>();
       connectAlike(*group);
       // A group that can't be read stands in the list all the same, without its values.
-      group->GetOne(1, row["gId"].Value());
+      group->GetOne(userGroup::byId, row["gId"].Value());
       add(group, row["gName"].asText());
     }
     return true;

@@ -160,7 +160,7 @@ class Home : private Frame {
   void write(Connection& connection);
   String insertText() const;
   String updateText() const;
-  Statement filled(const String& statement);
+  SqlText filled(const String& statement);
   void sendPicture(Connection& connection, const String& path, const String& clear, const String& select);
 
   void fetchText(const Field& column, const String& name, String& value);

@@ -62,10 +62,8 @@ void Home::sendPicture(Connection& connection, const String& path, const String&
     connection.Execute(clear);
     return;
   }
-  constexpr Long keyset = 1;
-  constexpr Long optimistic = 3;
   Recordset row;
-  row.Open(select, connection, keyset, optimistic);
+  row.Open(select, connection, adOpenKeyset, adLockOptimistic);
   String errText;
   if (!row.EOF_() && !fileToField(row[0], path, errText)) note(errNumber(), errText);
   connection.Execute("SET NOCOUNT OFF");

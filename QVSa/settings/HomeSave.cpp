@@ -111,7 +111,7 @@ String Home::updateText() const {
          " where id=1";
 }
 
-Statement Home::filled(const String& statement) {
+SqlText Home::filled(const String& statement) {
   return sql(statement)
       .text("name", homeName_)
       .text("enName", enName_)

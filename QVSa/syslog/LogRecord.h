@@ -6,6 +6,9 @@
 
 namespace QVSa {
 
+// The type of entries about the system's upkeep. Other types are the hosts' own.
+constexpr Long administrationLog = 3;
+
 // One row of the system log, as a query of LogRecords read it; what the row does not hold is empty.
 class LogRecord {
  public:

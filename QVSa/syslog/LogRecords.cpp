@@ -26,14 +26,14 @@ String LogRecords::computerName() const { return platform::services().computerNa
 
 Connection LogRecords::openAtClient() const {
   Connection connection;
-  connection.CursorLocation(3);
+  connection.CursorLocation(adUseClient);
   connection.Open(connectionString());
   return connection;
 }
 
 Boolean LogRecords::Add(Long userId, Long LogType, const String& FuncName, const String& desc, const String&,
                         const String* rcId, const String* wiId, const String* rtId) {
-  return operation(prefixedBlank(1701), [&] {
+  return operation(prefixedBlank(message::logNotWritten), [&] {
     IdMgr numbers;
     connectAlike(numbers);
     const String logId = numbers.newId("_log", "", -1, "", "");

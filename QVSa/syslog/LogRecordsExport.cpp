@@ -36,18 +36,18 @@ void writeRows(Recordset& row, const String& path) {
 }  // namespace
 
 Boolean LogRecords::saveLog(const String& vBakFile, const Long* vLogType) {
-  return operation(prefixed(1704), [&] {
+  return operation(prefixed(message::logNotExported), [&] {
     items_.clear();
     Connection connection = openAtClient();
     Recordset rows;
-    rows.Open("select * from syslog" + typeCondition(vLogType), connection, 2, 3);
+    rows.Open("select * from syslog" + typeCondition(vLogType), connection, adOpenDynamic, adLockOptimistic);
     writeRows(rows, vBakFile);
     return true;
   });
 }
 
 Boolean LogRecords::clearLog(const Long* vLogType, const Boolean* vSaveBackup, const String* vBakFile) {
-  return operation(prefixed(1703), [&] {
+  return operation(prefixed(message::logNotCleared), [&] {
     items_.clear();
     Connection connection = openAtClient();
     if (vSaveBackup != nullptr && *vSaveBackup) saveLog(vBakFile == nullptr ? "" : *vBakFile, vLogType);

@@ -65,7 +65,7 @@ String LogRecords::head() const {
 
 Boolean LogRecords::GetAll(Long LogType, Date startDate, Date endDate, Long operator_, const String& rtId,
                            const String& desc, const String&, Integer, Integer app) {
-  return operation(prefixed(1702), [&] {
+  return operation(prefixed(message::logNotRead), [&] {
     startQuery();
     String statement =
         head() + " from sysLog l,repTmps rt" + " where logType=" + text(LogType) + " and l.rtId*=rt.rtUid";
@@ -89,7 +89,7 @@ Boolean LogRecords::GetAll(Long LogType, Date startDate, Date endDate, Long oper
 }
 
 Boolean LogRecords::GetLogByQuery(std::vector<Variant>& arrList, Long LogType, const String&, Integer, Integer app) {
-  return operation(prefixed(1702), [&] {
+  return operation(prefixed(message::logNotRead), [&] {
     startQuery();
     if (arrList.size() <= descriptionPart) return false;
     if (isAfter(arrList[startDate], arrList[endDate])) arrList[endDate] = Date::empty();
@@ -130,8 +130,8 @@ void LogRecords::startQuery() {
 Boolean LogRecords::showRows(const String& statement, Integer app) {
   Connection connection = openAtClient();
   if (recordset_.State() == 1) recordset_.Close();
-  recordset_.CursorType(3);
-  recordset_.LockType(3);
+  recordset_.CursorType(adOpenStatic);
+  recordset_.LockType(adLockOptimistic);
   recordset_.Open(statement, connection);
   recordset_.ActiveConnection(nullptr);
   constexpr Integer webPage = 2;

@@ -127,7 +127,7 @@ class Agent {
   void runPlan(PlanRuns& runs, PlanRun run) {
     BKPlan plan;
     console_.connect(plan);
-    bool done = plan.GetOne(1, std::to_string(run.planId));
+    bool done = plan.GetOne(BKPlan::byId, std::to_string(run.planId));
     if (!done) {
       complain(plan.errDescription());
     } else {

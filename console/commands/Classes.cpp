@@ -45,8 +45,7 @@ Directory load(const Console& console, const String& name) {
 void stamp(const Console& console, Directory& node, const String& login) {
   User user;
   console.connect(user);
-  constexpr Integer byLogin = 3;
-  require(user.GetOne(byLogin, login), user);
+  require(user.GetOne(User::byLogin, login), user);
   node.updUserId(user.Id());
   node.upduserName(user.Name());
   node.updTime(now());

@@ -38,9 +38,9 @@ Answer saved(const Console& console, const String& number, const String& sentenc
 void requireNew(const Console& console, const String& number) {
   Department department;
   console.connect(department);
-  if (department.GetOne(1, number)) throw Refusal("Department " + number + " exists already.");
+  if (department.GetOne(Department::byNumber, number)) throw Refusal("Department " + number + " exists already.");
   // Any other failure tells nothing of whether it exists.
-  require(department.errNumber() == messageNumber(1001), department);
+  require(department.errNumber() == messageNumber(message::departmentUnknown), department);
 }
 
 Answer add(const Console& console, const Options& options) {

@@ -68,7 +68,7 @@ void checkDepartment(const Console& console, Findings& findings, const String& n
   const String point = "Department " + number;
   Department department;
   console.connect(department);
-  if (!department.GetOne(1, number)) return findings.failed(point, department);
+  if (!department.GetOne(Department::byNumber, number)) return findings.failed(point, department);
   const String path = "." + std::to_string(department.InnerId()) + ".";
   if (!department.Super().empty() || department.fullId() != path)
     findings.bad(point, "is no top of a tree with the path " + path);
@@ -97,11 +97,11 @@ void checkAdministrator(const Console& console, Findings& findings) {
   const String point = "Administrator Admin";
   User user;
   console.connect(user);
-  if (!user.GetOne(3, "Admin"))
+  if (!user.GetOne(User::byLogin, "Admin"))
     findings.failed(point, user);
   else if (!user.isAdministrator())
     findings.bad(point, "does not hold the role Administrators");
-  else if (user.regState() != 0)
+  else if (user.regState() != accountNormal)
     findings.warn(point, "the account is locked");
   else
     findings.good(point);

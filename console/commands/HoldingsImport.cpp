@@ -36,8 +36,8 @@ void HoldingsImport::importRole(const Rows& rows) {
   const String& name = rows.front()->role;
   Role role;
   console_.connect(role);
-  const bool found = role.GetOne(2, name);
-  if (!found && role.errNumber() != messageNumber(1201)) require(false, role);
+  const bool found = role.GetOne(Role::byName, name);
+  if (!found && role.errNumber() != messageNumber(message::roleUnknown)) require(false, role);
   ++(found ? roles_.unchanged : roles_.added);
   if (!found && !dryRun_) {
     role.Name(name);

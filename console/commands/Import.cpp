@@ -81,8 +81,8 @@ std::vector<Department> Import::loadDepartments() {
   for (const DepartmentRow& row : organisation_.departments) {
     Department& department = result.emplace_back();
     console_.connect(department);
-    const bool found = department.GetOne(1, row.number);
-    if (!found && department.errNumber() != messageNumber(1001)) require(false, department);
+    const bool found = department.GetOne(Department::byNumber, row.number);
+    if (!found && department.errNumber() != messageNumber(message::departmentUnknown)) require(false, department);
     if (found && row.number != "_root") treeIsEmpty_ = false;
   }
   return result;
@@ -122,8 +122,8 @@ void Import::importDepartment(const DepartmentRow& row, Department& department) 
 void Import::importUser(const UserRow& row) {
   User user;
   console_.connect(user);
-  if (!user.GetOne(3, row.login)) {
-    if (user.errNumber() != messageNumber(1101)) require(false, user);
+  if (!user.GetOne(User::byLogin, row.login)) {
+    if (user.errNumber() != messageNumber(message::userUnknown)) require(false, user);
     addUser(row, user);
   } else if (user.Name() == row.name && sameText(user.deptId(), row.department)) {
     ++users_.unchanged;
@@ -149,7 +149,7 @@ void Import::changeUser(const UserRow& row, User& user) {
   if (dryRun_) return;
   Department department;
   console_.connect(department);
-  require(department.GetOne(1, row.department), department);
+  require(department.GetOne(Department::byNumber, row.department), department);
   user.Name(row.name);
   user.setDept(department);
   UserKeeping keeping;

@@ -33,12 +33,10 @@ struct Options {
   bool all = false;
 };
 
-constexpr Integer byLogin = 3;
-
 Long idOf(const Console& console, const String& login) {
   User user;
   console.connect(user);
-  require(user.GetOne(byLogin, login), user);
+  require(user.GetOne(User::byLogin, login), user);
   return user.Id();
 }
 

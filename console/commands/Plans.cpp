@@ -37,7 +37,7 @@ const std::vector<String> weekdayNames{"mon", "tue", "wed", "thu", "fri", "sat",
 BKPlan load(const Console& console, const String& name) {
   BKPlan plan;
   console.connect(plan);
-  require(plan.GetOne(2, name), plan);
+  require(plan.GetOne(BKPlan::byName, name), plan);
   return plan;
 }
 

@@ -24,9 +24,6 @@ struct Options {
   bool refuse = false;
 };
 
-constexpr Integer byLogin = 3;
-constexpr Integer waitingForAudit = 2;
-
 Answer apply(const Console& console, const Options& options) {
   User user;
   console.connect(user);
@@ -49,9 +46,9 @@ Answer audit(const Console& console, const Options& options) {
   if (options.accept == options.refuse) throw Misuse("Say either --accept or --refuse.");
   User user;
   console.connect(user);
-  require(user.GetOne(byLogin, options.login), user);
+  require(user.GetOne(User::byLogin, options.login), user);
   // The library audits an account in any state: a locked one would be opened, a normal one refused.
-  if (user.regState() != waitingForAudit) throw Refusal(options.login + " does not wait for an audit.");
+  if (user.regState() != accountWaiting) throw Refusal(options.login + " does not wait for an audit.");
   require(user.regAudit(options.accept, options.remark), user);
   const String result = options.accept ? "accepted" : "refused";
   return {options.login + " is " + result + ".\n", {{"login", options.login}, {"result", result}}};

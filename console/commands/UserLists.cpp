@@ -63,7 +63,7 @@ String jobName(const Console& console, Long id) {
 String userName(const Console& console, Long id) {
   User user;
   console.connect(user);
-  return user.GetOne(1, id) ? user.Name() : "";
+  return user.GetOne(User::byId, id) ? user.Name() : "";
 }
 
 // Two of one name can't be listed. What the command did before is done all the same, so that this is a note.
