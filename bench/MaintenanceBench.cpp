@@ -68,7 +68,7 @@ void requireStorage(int code) {
   if (code != SQLITE_OK && code != SQLITE_DONE) throw std::runtime_error(sqlite3_errstr(code));
 }
 
-// One file over the other by the storage library's own interface.
+// One file over the other by SQLite's C interface.
 void copyDatabase(const std::string& from, const std::string& to) {
   sqlite3* source = nullptr;
   sqlite3* target = nullptr;

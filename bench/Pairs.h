@@ -15,7 +15,7 @@ struct Call {
 using Side = std::function<Call()>;
 
 // Registers an operation of the library and its floor: the same rows read and written by hand-written statements on the
-// storage library, in as many commits, on the same files.
+// SQLite, in as many commits, on the same files.
 void addPair(const std::string& name, const Side& operation, const Side& floor);
 
 // Runs all pairs, each side in several rounds, and prints the table of operation, floor and ratio. The fastest round of

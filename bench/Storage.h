@@ -9,7 +9,7 @@
 
 namespace QVSa::bench {
 
-// An installation's files on the storage library's own interface, opened as the engine opens them: attached under their
+// An installation's files on SQLite's C interface, opened as the engine opens them: attached under their
 // names, WAL, full sync, the same page cache, the collation registered.
 class Storage {
  public:

@@ -6,7 +6,7 @@
 
 namespace QVSa::bench {
 
-// How the storage library goes about a query as the engine hands it over: its own words, one line a step.
+// How SQLite goes about a query as the engine hands it over: its own words, one line a step.
 std::vector<std::string> storagePlan(const std::filesystem::path& folder, const std::string& database,
                                      const std::string& query);
 

@@ -5,7 +5,7 @@
 
 namespace QVSa::platform {
 
-// The databases of an embedded installation: each is a file NAME.db with what the storage library keeps beside it, and
+// The databases of an embedded installation: each is a file NAME.db with what SQLite keeps beside it, and
 // a file NAME.lock.
 inline constexpr std::array<const char*, 4> databaseNames = {"master", "QVSys", "QVApp", "QVUpdate"};
 

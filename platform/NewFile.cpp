@@ -29,7 +29,7 @@ constexpr mode_t forAll = 0666;
 constexpr mode_t forOwnerAndGroup = 0660;
 constexpr mode_t forOwner = 0600;
 const std::string ending = ".new";
-// What the storage library keeps beside a file that it writes.
+// What SQLite keeps beside a file that it writes.
 const std::string journalEnding = "-journal";
 
 fs::path folderOf(const fs::path& file) { return file.has_parent_path() ? file.parent_path() : "."; }
@@ -83,7 +83,7 @@ bool giveOwnerAndMode(int file, const struct stat& old) {
   return (isOwned || ::fchown(file, old.st_uid, old.st_gid) == 0) && ::fchmod(file, old.st_mode & permissions) == 0;
 }
 
-// Far behind the bytes that the storage library locks in the same file.
+// Far behind the bytes that SQLite locks in the same file.
 bool lock(int file) {
   struct flock lock {};
   lock.l_type = F_WRLCK;

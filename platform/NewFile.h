@@ -40,7 +40,7 @@ class NewFile {
   void write(std::string_view bytes);
   void keep();
 
-  // The file that is written, and what the storage library keeps beside it: made with both names, since what must go
+  // The file that is written, and what SQLite keeps beside it: made with both names, since what must go
   // has to go without memory.
   struct NameBeside {
     explicit NameBeside(std::filesystem::path file);

@@ -7,6 +7,7 @@
 #include <unistd.h>
 #include <utility>
 
+#include "QVSa/values/Text.h"
 #include "platform/Ntlm.h"
 
 namespace QVSa::platform {
@@ -28,10 +29,7 @@ String systemComputerName() {
   char buffer[computerNameLength + 1] = {};
   // A longer name comes cut.
   gethostname(buffer, computerNameLength);
-  String name = buffer;
-  name.erase(0, name.find_first_not_of(' '));
-  name.erase(name.find_last_not_of(' ') + 1);
-  return name;
+  return trim(buffer);
 }
 
 // The name stands in the line: openlog would change it for the whole host process.

@@ -5,22 +5,14 @@
 #include "platform/Services.h"
 
 namespace QVSa {
-namespace {
-
-// An editor ends a file with a line break.
-String withoutWhiteSpace(const String& text) {
-  constexpr const char* whiteSpace = " \t\r\n";
-  const std::size_t first = text.find_first_not_of(whiteSpace);
-  return first == String::npos ? "" : text.substr(first, text.find_last_not_of(whiteSpace) + 1 - first);
-}
-
-}  // namespace
 
 std::optional<platform::DirectoryQuery::Security> directorySecurity() {
   using Security = platform::DirectoryQuery::Security;
   try {
     const auto key = platform::services().openSettings(machineSettingsKey);
-    const String text = withoutWhiteSpace(key ? key->value("directorySecurity").value_or("") : "");
+    const String value = key ? key->value("directorySecurity").value_or("") : "";
+    // An editor ends a file with a line break.
+    const String text(trimmed(value, " \t\r\n"));
     if (text.empty()) return Security::byPort;
     if (sameText(text, "startTls")) return Security::startTls;
     if (sameText(text, "tls")) return Security::tls;

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <chrono>
 #include <cmath>
 
 #include "QVSa/values/Failure.h"
@@ -13,15 +14,14 @@ namespace {
 constexpr std::int64_t dayMilliseconds = 86'400'000;
 constexpr double firstDay = -657'434;  // 0100-01-01
 constexpr double lastDay = 2'958'465;  // 9999-12-31
-// Days from 0000-03-01, where the calendar below counts from, to 1899-12-30.
-constexpr std::int64_t epoch = 693'899;
+constexpr std::chrono::sys_days epoch = std::chrono::year(1899) / 12 / 30;
 
 struct Parts {
   std::int64_t day;  // whole days since 1899-12-30
   std::int64_t millisecond;
 };
 
-struct Calendar {
+struct CalendarDay {
   int year;
   int month;
   int day;
@@ -45,26 +45,20 @@ double daysOf(Parts parts) {
   return parts.day < 0 ? day - fraction : day + fraction;
 }
 
-// The calendar's year begins with March here, so that the leap day is its last one.
+// Of a month that may lie outside its year, and a day that may lie outside its month.
 std::int64_t dayNumber(int year, std::int64_t month, int day) {
-  const std::int64_t months = std::int64_t{12} * year + month - 3;
-  const std::int64_t marchYear = floorDiv(months, 12);
-  const std::int64_t marchMonth = months - marchYear * 12;
-  const std::int64_t leapDays = floorDiv(marchYear, 4) - floorDiv(marchYear, 100) + floorDiv(marchYear, 400);
-  return marchYear * 365 + leapDays + (marchMonth * 153 + 2) / 5 + day - 1 - epoch;
+  const std::int64_t months = std::int64_t{12} * year + month - 1;
+  const std::int64_t wholeYear = floorDiv(months, 12);
+  if (wholeYear < int{std::chrono::year::min()} || wholeYear > int{std::chrono::year::max()})
+    throw runtimeFailure(number::overflow);
+  const auto first = std::chrono::year(static_cast<int>(wholeYear)) /
+                     std::chrono::month(static_cast<unsigned>(months - wholeYear * 12 + 1)) / 1;
+  return (std::chrono::sys_days(first) - epoch).count() + std::int64_t{day} - 1;
 }
 
-Calendar calendarOf(std::int64_t number) {
-  const std::int64_t fromMarch = number + epoch;
-  const std::int64_t era = floorDiv(fromMarch, 146'097);
-  const std::int64_t dayOfEra = fromMarch - era * 146'097;
-  const std::int64_t yearOfEra = (dayOfEra - dayOfEra / 1'460 + dayOfEra / 36'524 - dayOfEra / 146'096) / 365;
-  const std::int64_t dayOfYear = dayOfEra - (yearOfEra * 365 + yearOfEra / 4 - yearOfEra / 100);
-  const std::int64_t marchMonth = (dayOfYear * 5 + 2) / 153;
-  const std::int64_t day = dayOfYear - (marchMonth * 153 + 2) / 5 + 1;
-  const std::int64_t month = marchMonth < 10 ? marchMonth + 3 : marchMonth - 9;
-  const std::int64_t year = era * 400 + yearOfEra + (month <= 2 ? 1 : 0);
-  return {static_cast<int>(year), static_cast<int>(month), static_cast<int>(day)};
+CalendarDay calendarOf(std::int64_t number) {
+  const std::chrono::year_month_day date(epoch + std::chrono::days(number));
+  return {int{date.year()}, static_cast<int>(unsigned{date.month()}), static_cast<int>(unsigned{date.day()})};
 }
 
 int daysInMonth(int year, std::int64_t month) {
@@ -82,7 +76,7 @@ String written(const Parts& parts, bool withDate, std::optional<char> mark) {
   std::array<char, 20> text;
   char* at = text.data();
   if (withDate) {
-    const Calendar date = calendarOf(parts.day);
+    const CalendarDay date = calendarOf(parts.day);
     putDigits(at, date.year, 4);
     if (mark) *at++ = *mark;
     putDigits(at, date.month, 2);
@@ -130,7 +124,7 @@ class Scanner {
   const char* end_;
 };
 
-bool scanDate(Scanner& scanner, Calendar& date) {
+bool scanDate(Scanner& scanner, CalendarDay& date) {
   if (!scanner.number(4, 4, date.year)) return false;
   if (scanner.skip('-')) {
     if (!scanner.number(1, 2, date.month) || !scanner.skip('-') || !scanner.number(1, 2, date.day)) return false;
@@ -175,7 +169,7 @@ Date::Date(int year, int month, int day, int hour, int minute, int second) {
 std::optional<Date> Date::parse(const String& text) {
   Scanner scanner(text);
   const char* const start = scanner.mark();
-  Calendar date{};
+  CalendarDay date{};
   Parts parts{0, 0};
   if (scanDate(scanner, date)) {
     parts.day = dayNumber(date.year, date.month, date.day);
@@ -205,7 +199,7 @@ Date Date::dateOnly() const { return Date(static_cast<double>(partsOf(days_).day
 
 Date Date::addMonths(int months) const {
   const Parts parts = partsOf(days_);
-  const Calendar date = calendarOf(parts.day);
+  const CalendarDay date = calendarOf(parts.day);
   const std::int64_t month = std::int64_t{date.month} + months;
   const int day = std::min(date.day, daysInMonth(date.year, month));
   return Date(daysOf({dayNumber(date.year, month, day), parts.millisecond}));

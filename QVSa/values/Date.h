@@ -14,6 +14,7 @@ class Date {
   constexpr Date() = default;
   constexpr explicit Date(double days) : days_(days) {}
   // Month 1..12 and day may lie outside their ranges and carry over, as 2024-13-01 is 2025-01-01.
+  // Throws Failure 6 for a year beyond 32,767.
   Date(int year, int month, int day, int hour = 0, int minute = 0, int second = 0);
 
   // 1900-01-01, the mark for "no date" throughout the library.

@@ -8,67 +8,14 @@
 #include <wctype.h>
 
 #include "QVSa/values/Failure.h"
+#include "QVSa/values/Utf8.h"
 
 namespace QVSa {
 
 namespace {
 
-constexpr char32_t replacement = 0xFFFD;
-
 bool isAscii(const String& text) {
   return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
-}
-
-bool isSurrogate(char32_t c) { return c >= 0xD800 && c <= 0xDFFF; }
-
-std::size_t sequenceLength(unsigned char lead) {
-  if (lead < 0x80) return 1;
-  if (lead >= 0xC2 && lead <= 0xDF) return 2;
-  if (lead >= 0xE0 && lead <= 0xEF) return 3;
-  if (lead >= 0xF0 && lead <= 0xF4) return 4;
-  return 0;
-}
-
-// The character at `at`, which steps behind it; over a byte that begins none, one byte.
-char32_t nextCharacter(const String& text, std::size_t& at) {
-  const unsigned char lead = static_cast<unsigned char>(text[at]);
-  const std::size_t length = sequenceLength(lead);
-  if (length == 1) return static_cast<unsigned char>(text[at++]);
-
-  char32_t c = lead & (0x7F >> length);
-  bool whole = length != 0 && at + length <= text.size();
-  for (std::size_t i = 1; whole && i < length; ++i) {
-    const unsigned char byte = static_cast<unsigned char>(text[at + i]);
-    whole = (byte & 0xC0) == 0x80;
-    c = c << 6 | (byte & 0x3F);
-  }
-  const bool overlong = (length == 3 && c < 0x800) || (length == 4 && c < 0x10000);
-  if (!whole || overlong || c > 0x10FFFF || isSurrogate(c)) {
-    ++at;
-    return replacement;
-  }
-  at += length;
-  return c;
-}
-
-void append(String& text, char32_t c) {
-  const auto put = [&](char32_t byte) { text.push_back(static_cast<char>(byte)); };
-  const auto putTail = [&](int shift) { put(0x80 | (c >> shift & 0x3F)); };
-  if (c < 0x80) {
-    put(c);
-  } else if (c < 0x800) {
-    put(0xC0 | c >> 6);
-    putTail(0);
-  } else if (c < 0x10000) {
-    put(0xE0 | c >> 12);
-    putTail(6);
-    putTail(0);
-  } else {
-    put(0xF0 | c >> 18);
-    putTail(12);
-    putTail(6);
-    putTail(0);
-  }
 }
 
 // The mappings of all scripts, whatever the process's own locale is.
@@ -95,7 +42,8 @@ String mapped(const String& text, CharacterMap map, char first, char last) {
   String result;
   result.reserve(text.size());
   const locale_t locale = unicode();
-  for (std::size_t at = 0; at < text.size();) append(result, map(nextCharacter(text, at), locale));
+  const char* const end = text.data() + text.size();
+  for (const char* at = text.data(); at < end;) appendSymbol(result, map(nextSymbol(at, end), locale));
   return result;
 }
 
@@ -108,15 +56,9 @@ void requireLength(Long units) {
 std::u16string toUtf16(const String& text) {
   std::u16string result;
   result.reserve(text.size());
-  for (std::size_t at = 0; at < text.size();) {
-    const char32_t c = nextCharacter(text, at);
-    if (c < 0x10000) {
-      result.push_back(static_cast<char16_t>(c));
-    } else {
-      result.push_back(static_cast<char16_t>(0xD800 + ((c - 0x10000) >> 10)));
-      result.push_back(static_cast<char16_t>(0xDC00 + (c & 0x3FF)));
-    }
-  }
+  const char* const end = text.data() + text.size();
+  for (const char* at = text.data(); at < end;)
+    putUnits(nextSymbol(at, end), [&](char16_t unit) { result.push_back(unit); });
   return result;
 }
 
@@ -124,13 +66,11 @@ String fromUtf16(const std::u16string& text) {
   String result;
   result.reserve(text.size());
   for (std::size_t at = 0; at < text.size(); ++at) {
-    const char32_t unit = text[at];
-    const bool pair =
-        unit >= 0xD800 && unit <= 0xDBFF && at + 1 < text.size() && text[at + 1] >= 0xDC00 && text[at + 1] <= 0xDFFF;
-    if (pair) {
-      append(result, 0x10000 + ((unit - 0xD800) << 10) + (text[++at] - 0xDC00U));
+    const char16_t unit = text[at];
+    if (isHighSurrogate(unit) && at + 1 < text.size() && isLowSurrogate(text[at + 1])) {
+      appendSymbol(result, fromSurrogates(unit, text[++at]));
     } else {
-      append(result, isSurrogate(unit) ? replacement : unit);
+      appendSymbol(result, isHighSurrogate(unit) || isLowSurrogate(unit) ? replacementSymbol : unit);
     }
   }
   return result;
@@ -138,8 +78,15 @@ String fromUtf16(const std::u16string& text) {
 
 Long textLength(const String& text) {
   Long units = 0;
-  for (std::size_t at = 0; at < text.size();) units += nextCharacter(text, at) < 0x10000 ? 1 : 2;
+  const char* const end = text.data() + text.size();
+  for (const char* at = text.data(); at < end;) units += unitsOfSymbol(nextSymbol(at, end));
   return units;
+}
+
+std::string_view trimmed(std::string_view text, std::string_view blanks) {
+  const std::size_t first = text.find_first_not_of(blanks);
+  return first == std::string_view::npos ? std::string_view()
+                                         : text.substr(first, text.find_last_not_of(blanks) + 1 - first);
 }
 
 String trimLeft(const String& text) {
@@ -149,7 +96,7 @@ String trimLeft(const String& text) {
 
 String trimRight(const String& text) { return text.substr(0, text.find_last_not_of(' ') + 1); }
 
-String trim(const String& text) { return trimLeft(trimRight(text)); }
+String trim(const String& text) { return String(trimmed(text)); }
 
 String upperCase(const String& text) { return mapped(text, towupper_l, 'a', 'z'); }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <string_view>
 
 #include "QVSa/values/Values.h"
 
@@ -13,6 +14,8 @@ String fromUtf16(const std::u16string& text);
 // Length in UTF-16 units, as callers count it.
 Long textLength(const String& text);
 
+// The part of `text` without the characters of `blanks` at both ends.
+std::string_view trimmed(std::string_view text, std::string_view blanks = " ");
 // Blanks (U+0020) only, as the run-time's functions of that name.
 String trimLeft(const String& text);
 String trimRight(const String& text);

@@ -9,6 +9,7 @@
 #include <utility>
 
 #include "QVSa/values/Failure.h"
+#include "QVSa/values/Text.h"
 
 namespace QVSa {
 
@@ -19,12 +20,6 @@ bool isDigit(char c) { return c >= '0' && c <= '9'; }
 std::size_t skipDigits(std::string_view text, std::size_t at) {
   while (at < text.size() && isDigit(text[at])) ++at;
   return at;
-}
-
-std::string_view withoutBlanks(std::string_view text) {
-  const std::size_t first = text.find_first_not_of(' ');
-  if (first == std::string_view::npos) return {};
-  return text.substr(first, text.find_last_not_of(' ') - first + 1);
 }
 
 // Sign, digits, point, exponent: what a statement may hold raw.
@@ -50,7 +45,7 @@ bool readsAsNumber(std::string_view text) {
 }
 
 double numberOf(const String& text) {
-  std::string_view digits = withoutBlanks(text);
+  std::string_view digits = trimmed(text);
   if (!readsAsNumber(digits)) throw runtimeFailure(number::type);
   if (digits[0] == '+') digits.remove_prefix(1);
   double value = 0;
@@ -107,7 +102,7 @@ bool sameWord(const String& text, std::string_view lowerWord) {
 }  // namespace
 
 bool Variant::isNumeric() const {
-  if (isText()) return readsAsNumber(withoutBlanks(std::get<String>(value_)));
+  if (isText()) return readsAsNumber(trimmed(std::get<String>(value_)));
   if (const double* value = std::get_if<double>(&value_)) return std::isfinite(*value);
   return isBoolean() || std::holds_alternative<Integer>(value_) || std::holds_alternative<Long>(value_);
 }

@@ -50,7 +50,6 @@ class Parser {
 
   // Parser.cpp: statements
   Statement statement();
-  bool beginsStatement() const;
 
   // ParseSession.cpp
   Statement use();

@@ -1,3 +1,4 @@
+#include "QVSa/values/Text.h"
 #include "providers/tsql/Parser.h"
 #include "providers/tsql/Words.h"
 
@@ -6,25 +7,19 @@ namespace {
 
 constexpr std::string_view kBlanks = " \t\r\n";
 
-std::string_view trimmed(std::string_view text) {
-  const std::size_t begin = text.find_first_not_of(kBlanks);
-  if (begin == std::string_view::npos) return {};
-  return text.substr(begin, text.find_last_not_of(kBlanks) + 1 - begin);
-}
-
 }  // namespace
 
 std::vector<String> splitScript(const String& script) {
   std::vector<String> batches;
   String batch;
   const auto finish = [&] {
-    if (!trimmed(batch).empty()) batches.push_back(batch);
+    if (!trimmed(batch, kBlanks).empty()) batches.push_back(batch);
     batch.clear();
   };
   for (std::size_t begin = 0; begin < script.size();) {
     const std::size_t end = std::min(script.find('\n', begin), script.size() - 1) + 1;
     const std::string_view line = std::string_view(script).substr(begin, end - begin);
-    if (sameWord(trimmed(line), "go"))
+    if (sameWord(trimmed(line, kBlanks), "go"))
       finish();
     else
       batch += line;

@@ -114,6 +114,19 @@ TEST_F(ReportClasses, RenameTheirBranchByWholeNames) {
   EXPECT_TRUE(b.Save()) << "no change: nothing is looked for";
 }
 
+TEST_F(ReportClasses, MoveWithWhatLiesBelowAndBack) {
+  for (const char* name : {"P", "Q"}) add(name);
+  add("N", "P");
+  add("K", "N");
+  Directory n = loaded("N");
+  n.superClass("Q");
+  ASSERT_TRUE(n.Save()) << n.errDescription();
+  EXPECT_EQ(row("K"), ".Q.N.K.|Q,N,K|1|002.001.001");
+  n.superClass("P");
+  ASSERT_TRUE(n.Save()) << n.errDescription();
+  EXPECT_EQ(row("K"), ".P.N.K.|P,N,K|1|001.001.001");
+}
+
 TEST_F(ReportClasses, GoToTheEndWithEverySaveAndTheRestMovesUp) {
   for (const char* name : {"A", "B", "C"}) add(name);
   Directory a = loaded("A");

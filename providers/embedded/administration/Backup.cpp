@@ -41,7 +41,7 @@ void keep(platform::NewFile& file, const String& path) {
   }
 }
 
-// Puts the sum of what was written behind it.
+// Appends the SHA-256 of what was written.
 void seal(const platform::NewFile& file, const String& path, const Handle& handle) {
   const platform::FileDescriptor written(::open(file.name().c_str(), O_RDWR | O_CLOEXEC));
   struct stat state {};

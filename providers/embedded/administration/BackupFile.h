@@ -28,9 +28,9 @@ class BackupFile {
   sqlite3* get() const { return handle_; }
   // Whether it is a copy of this database, as far as it says so.
   bool isOf(std::size_t database);
-  // Reads all of it: the sum, the structure, and each definition beside the table that it stands for. Throws 3241 for a
-  // damaged one, the time-out behind the deadline. One without a sum, as the first release wrote it, gets the rest of
-  // the checks and a line in the event log.
+  // Reads all of it: the checksum, the structure, and each definition beside the table that it stands for. Throws 3241
+  // for a damaged one, the time-out behind the deadline. One without a checksum, as the first release wrote it, gets
+  // the rest of the checks and a line in the event log.
   void check();
 
  private:

@@ -6,7 +6,7 @@
 
 namespace QVSa::embedded {
 
-// What stands in the file of a backup behind the last page, where the storage library does not look: a mark, the number
+// What stands in the file of a backup behind the last page, where SQLite does not look: a mark, the number
 // of bytes before it, and their SHA-256. It covers every byte of the copy, its free pages too.
 inline constexpr std::size_t trailerSize = 48;
 using Trailer = std::array<std::uint8_t, trailerSize>;

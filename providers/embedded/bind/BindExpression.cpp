@@ -6,6 +6,7 @@
 #include "providers/embedded/bind/Binder.h"
 #include "providers/embedded/bind/Literal.h"
 #include "providers/embedded/bind/TypeRules.h"
+#include "providers/embedded/storage/ColumnType.h"
 #include "providers/tsql/Dialect.h"
 #include "providers/tsql/SqlFailure.h"
 

@@ -10,7 +10,7 @@
 #include "providers/embedded/storage/Catalogue.h"
 
 // The bound tree: what the binder makes of a statement once every name is found, every expression has a type and every
-// conversion that the dialect makes by itself stands in it. The emitter writes it as the storage library's SQL.
+// conversion that the dialect makes by itself stands in it. The emitter writes it as SQLite's SQL.
 namespace QVSa::embedded {
 
 struct BoundSelect;
@@ -24,7 +24,7 @@ struct BoundExpression {
     parameter,  // ?n
     column,     // source.name
     rowid,      // source._rowid_, the key that SQLite gives every row
-    constant,   // a text of the storage library's own, such as a type code
+    constant,   // a text of SQLite's own, such as a type code
     call,       // text(operands), `distinct` for an aggregate; count(*) has the operand constant *
     prefix,     // text operands[0]
     infix,      // operands with text between them

@@ -51,14 +51,6 @@ int compareText(std::string_view a, std::string_view b) {
   return static_cast<int>(atA < endA) - static_cast<int>(atB < endB);
 }
 
-std::string foldCase(const std::string& text) {
-  std::string folded;
-  folded.reserve(text.size());
-  const char* const end = text.data() + text.size();
-  for (const char* at = text.data(); at < end;) appendSymbol(folded, foldCase(nextSymbol(at, end)));
-  return folded;
-}
-
 void registerCollation(sqlite3* handle) {
   const int code = sqlite3_create_collation_v2(handle, "tsql", SQLITE_UTF8, nullptr, collate, nullptr);
   if (code != SQLITE_OK) throwStorageFailure(handle, code);

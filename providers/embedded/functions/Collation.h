@@ -11,9 +11,6 @@ namespace QVSa::embedded {
 // 0 or positive. It is frozen with the layout of the files, whose indices rest on it.
 int compareText(std::string_view a, std::string_view b);
 
-// The text with every symbol folded: two names are the same where these are.
-std::string foldCase(const std::string& text);
-
 // Makes it known to a handle as the collation "tsql".
 void registerCollation(sqlite3* handle);
 

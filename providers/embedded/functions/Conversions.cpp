@@ -302,8 +302,6 @@ Date dateOf(std::int64_t ticks) {
   return Date(whole < 0 ? whole - time : whole + time);
 }
 
-std::int64_t lengthOf(const std::string& text) { return unitsOf(withoutTrailingBlanks(text)); }
-
 Variant variantOf(Value value, const Type& type) {
   if (auto* text = std::get_if<std::string>(&value)) return Variant(std::move(*text));
   if (const auto decimal = asDecimal(value, type)) return numberVariant(doubleOf(*decimal, type.scale), type.base);

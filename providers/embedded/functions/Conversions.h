@@ -28,9 +28,6 @@ Value convert(const Value& value, const Type& from, const Type& to, Purpose purp
 std::int64_t ticksOf(Date date);
 Date dateOf(std::int64_t ticks);
 
-// The text's length in UTF-16 units without its trailing blanks.
-std::int64_t lengthOf(const std::string& text);
-
 // What a caller of the provider sees of a value: bit as Boolean, tinyint and smallint as Integer, int as Long, bigint
 // and decimal as Long where they are whole and fit and as Double otherwise.
 Variant variantOf(Value value, const Type& type);

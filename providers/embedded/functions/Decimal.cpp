@@ -5,6 +5,7 @@
 #include <charconv>
 #include <cmath>
 
+#include "QVSa/values/Text.h"
 #include "providers/embedded/functions/NumberText.h"
 #include "providers/tsql/SqlFailure.h"
 
@@ -184,7 +185,7 @@ Decimal decimalFrom(double value, int scale) {
 }
 
 std::optional<Decimal> readDecimal(std::string_view text, int scale) {
-  text = withoutBlanks(text);
+  text = trimmed(text);
   const bool negative = text.starts_with('-');
   if (negative || text.starts_with('+')) text.remove_prefix(1);
   const std::size_t point = std::min(text.find('.'), text.size());

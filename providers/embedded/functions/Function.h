@@ -11,7 +11,7 @@
 
 namespace QVSa::embedded {
 
-// One call of a function by the storage library. Without a result it gives NULL.
+// One call of a function from SQLite. Without a result it gives NULL.
 class Call {
  public:
   Call(sqlite3_context* context, int count, sqlite3_value** arguments, const FunctionContext& session)

@@ -14,7 +14,7 @@ struct FunctionContext {
   bool hasScopeIdentity = false;
 };
 
-// Registers, on a handle of the storage library, all that the emitter's texts call:
+// Registers, on an SQLite connection, all that the emitter's texts call:
 //   collation tsql             no case, no trailing blanks, Unicode folding, then code order
 //   t_convert(x, fromBase, toBase, size, purpose, style)    Conversions.h, bases and purpose as numbers
 //   t_add(a, b) t_subtract(a, b) t_multiply(a, b) t_negate(a)   int arithmetic; 8115 where the result is no 32-bit

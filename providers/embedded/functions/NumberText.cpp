@@ -4,6 +4,8 @@
 #include <charconv>
 #include <cmath>
 
+#include "QVSa/values/Text.h"
+
 namespace QVSa::embedded {
 
 namespace {
@@ -29,15 +31,9 @@ void widenExponent(std::string& text) {
 
 }  // namespace
 
-std::string_view withoutBlanks(std::string_view text) {
-  const std::size_t first = text.find_first_not_of(' ');
-  if (first == std::string_view::npos) return {};
-  return text.substr(first, text.find_last_not_of(' ') - first + 1);
-}
-
 std::optional<std::int64_t> readWhole(std::string_view text, bool& overflow) {
   overflow = false;
-  text = withoutBlanks(text);
+  text = trimmed(text);
   if (text.empty()) return 0;
   if (!skipPlus(text)) return std::nullopt;
   std::int64_t value = 0;
@@ -49,7 +45,7 @@ std::optional<std::int64_t> readWhole(std::string_view text, bool& overflow) {
 }
 
 std::optional<double> readReal(std::string_view text) {
-  text = withoutBlanks(text);
+  text = trimmed(text);
   if (text.empty()) return 0;
   if (!skipPlus(text) || text.find_first_not_of("0123456789+-.eE") != std::string_view::npos) return std::nullopt;
   double value = 0;

@@ -7,8 +7,6 @@
 
 namespace QVSa::embedded {
 
-std::string_view withoutBlanks(std::string_view text);
-
 // Reads a whole number: blanks around, a sign, digits. The empty text and blanks alone are 0. `overflow` tells a number
 // that 64 bits do not hold from a text that is none.
 std::optional<std::int64_t> readWhole(std::string_view text, bool& overflow);

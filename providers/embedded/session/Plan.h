@@ -12,7 +12,7 @@
 
 namespace QVSa::embedded {
 
-// A text of the storage library, compiled at its first use and kept compiled.
+// An SQLite statement, compiled at its first use and kept compiled.
 class Compiled {
  public:
   explicit Compiled(Emitted emitted) : emitted_(std::move(emitted)) {}

@@ -15,14 +15,14 @@ class EmbeddedRows;
 
 // A session of the engine: one handle, its current database, its transaction.
 //
-// Isolation is read committed. `begin` only marks: the storage library's transaction starts with the first write, after
+// Isolation is read committed. `begin` only marks: SQLite's transaction starts with the first write, after
 // open row sets were read into memory and the write lock was taken, so that what a statement reads is newer than its
 // wait. A read before that would end the transaction in a failure that no retry mends.
 //
 // A write that meets rows which another session has claimed waits for them, and that session may need the write lock to
 // get on: so the lock is given back meanwhile, and what the transaction has written is undone and written again
 // afterwards. Where its work was seen already, the statement fails with 1205 instead. A transaction that has lost its
-// writes, by that or by a failure of the storage library, takes nothing but a rollback (3930).
+// writes, by that or by a failure of SQLite, takes nothing but a rollback (3930).
 class EmbeddedSession : public ProviderSession {
  public:
   EmbeddedSession(PooledHandle handle, std::size_t database, bool administrator);
@@ -118,7 +118,7 @@ class EmbeddedSession : public ProviderSession {
   bool administrator_;
   bool marked_ = false;                    // begin was called
   std::size_t inner_ = 0;                  // transactions within the one that counts
-  bool started_ = false;                   // the storage library's transaction is open
+  bool started_ = false;                   // SQLite's transaction is open
   std::set<std::size_t> writing_;          // databases whose write lock is taken
   std::vector<Change> changes_;            // of the transaction, as long as they can be made again
   bool settled_ = false;                   // they cannot: something was read or defined behind them

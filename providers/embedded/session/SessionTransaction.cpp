@@ -57,7 +57,7 @@ void EmbeddedSession::refuseAfterLoss() const {
   if (lost_) throw tsql::transactionLost();
 }
 
-// The storage library ends its transaction by itself where it had no room or no memory, and where a write ran over its
+// SQLite ends its transaction by itself where it had no room or no memory, and where a write ran over its
 // time. What is written next would be committed alone.
 void EmbeddedSession::afterFailure(Long native) {
   const bool hasWritten = settled_ || !changes_.empty();

@@ -1,14 +1,10 @@
 #include "providers/embedded/storage/Catalogue.h"
 
 #include <algorithm>
-#include <cstdlib>
-#include <iterator>
 #include <string_view>
 #include <utility>
 
-#include "providers/embedded/functions/CaseFolding.h"
-#include "providers/embedded/functions/Decimal.h"
-#include "providers/embedded/functions/Utf8.h"
+#include "providers/embedded/storage/ColumnType.h"
 #include "providers/embedded/storage/OpeningFailure.h"
 #include "providers/tsql/Parser.h"
 #include "providers/tsql/SqlFailure.h"
@@ -28,17 +24,6 @@ std::string filesView(const std::filesystem::path& folder, const std::string& da
   const auto [data, log] = filesOf(folder, database);
   return "create view sysfiles(fileid, groupid, name, filename) as select 1, 1, " + quoted(data.name) + ", " +
          quoted(data.path) + " union all select 2, 0, " + quoted(log.name) + ", " + quoted(log.path);
-}
-
-Type decimalType(const tsql::TypeName& name) {
-  const std::int64_t precision = name.size.value_or(18);
-  const std::int64_t scale = name.scale.value_or(0);
-  if (precision < 1) throw tsql::sqlFailure(1001, "Length or precision specification 0 is invalid.");
-  if (precision > mostDecimalDigits)
-    throw tsql::sqlFailure(2750, "Specified column precision " + std::to_string(precision) +
-                                     " is greater than the maximum precision of 38.");
-  if (scale > precision) throw tsql::sqlFailure(192, "The scale must be less than or equal to the precision.");
-  return {Base::decimal, static_cast<int>(precision), static_cast<int>(scale)};
 }
 
 std::string dotted(const tsql::ObjectName& name) {
@@ -146,52 +131,6 @@ bool Catalogue::exists(std::size_t database, const std::string& name) const {
 const SynonymInfo* Catalogue::synonym(std::size_t database, const std::string& name) const {
   const Entry* entry = lookUp(database, name);
   return entry ? std::get_if<SynonymInfo>(entry) : nullptr;
-}
-
-bool isOwner(const std::string& name) { return name.empty() || sameName(name, "dbo"); }
-
-std::optional<std::size_t> databaseByName(const std::string& name) {
-  for (std::size_t i = 0; i < databaseNames.size(); ++i)
-    if (sameName(name, databaseNames[i])) return i;
-  return std::nullopt;
-}
-
-Type typeOf(const tsql::TypeName& name) {
-  static constexpr std::pair<std::string_view, Base> known[] = {
-      {"bit", Base::bit},         {"tinyint", Base::tinyint},   {"smallint", Base::smallint},
-      {"int", Base::integer},     {"integer", Base::integer},   {"bigint", Base::bigint},
-      {"decimal", Base::decimal}, {"numeric", Base::decimal},   {"float", Base::real},
-      {"real", Base::real},       {"datetime", Base::datetime}, {"smalldatetime", Base::smalldatetime},
-      {"varchar", Base::varchar}, {"char", Base::varchar},      {"nvarchar", Base::nvarchar},
-      {"nchar", Base::nvarchar},  {"text", Base::ntext},        {"ntext", Base::ntext},
-      {"image", Base::image},     {"binary", Base::image},      {"varbinary", Base::image}};
-  const auto* const base = std::ranges::find(known, name.name, [](const auto& entry) { return entry.first; });
-  if (base == std::end(known)) throw tsql::sqlFailure(2715, "Cannot find data type " + name.name + ".");
-  if (base->second == Base::decimal) return decimalType(name);
-  const bool sized = base->second == Base::varchar || base->second == Base::nvarchar ||
-                     (base->second == Base::image && name.name != "image");
-  if (!sized) return {base->second, -1};
-  return {base->second, static_cast<int>(name.size.value_or(1))};
-}
-
-std::string foldName(const std::string& name) {
-  std::string folded;
-  folded.reserve(name.size());
-  const char* at = name.data();
-  const char* end = at + name.size();
-  while (at != end) appendSymbol(folded, foldCase(nextSymbol(at, end)));
-  return folded;
-}
-
-bool sameName(const std::string& a, const std::string& b) { return a == b || foldName(a) == foldName(b); }
-
-std::string quoteName(const std::string& name) {
-  std::string quoted = "\"";
-  for (const char c : name) {
-    if (c == '"') quoted += '"';
-    quoted += c;
-  }
-  return quoted + '"';
 }
 
 }  // namespace QVSa::embedded

@@ -10,6 +10,7 @@
 
 #include "providers/embedded/bind/Types.h"
 #include "providers/embedded/storage/Handle.h"
+#include "providers/embedded/storage/Names.h"
 #include "providers/tsql/Tree.h"
 
 namespace QVSa::embedded {
@@ -76,20 +77,5 @@ class Catalogue {
   std::map<std::pair<std::size_t, std::string>, Entry> entries_;
   std::array<std::optional<Failure>, databaseNames.size()> unreadable_;
 };
-
-// Everything belongs to one owner, "dbo", who need not be named.
-bool isOwner(const std::string& name);
-
-// The position of a database by its name, any case; nothing for an unknown one.
-std::optional<std::size_t> databaseByName(const std::string& name);
-
-// The engine's type for a type's name. Throws 2715 for an unknown one.
-Type typeOf(const tsql::TypeName& name);
-
-// A name as names are compared: without regard to case.
-std::string foldName(const std::string& name);
-bool sameName(const std::string& a, const std::string& b);
-// A name as the storage library's texts hold it: "name", quotation marks doubled.
-std::string quoteName(const std::string& name);
 
 }  // namespace QVSa::embedded

@@ -6,6 +6,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include "platform/FileDescriptor.h"
 #include "providers/embedded/storage/OpeningFailure.h"
 
 namespace QVSa::embedded {
@@ -15,17 +16,12 @@ namespace {
 constexpr std::size_t size = sizeof(std::uint64_t);
 
 void* mapped(const std::filesystem::path& path) {
-  const int file = ::open(path.c_str(), O_RDWR | O_CLOEXEC);
-  if (file < 0) return MAP_FAILED;
+  const platform::FileDescriptor file(::open(path.c_str(), O_RDWR | O_CLOEXEC));
   struct stat known {};
-  void* memory = MAP_FAILED;
+  if (!file.isOpen() || ::fstat(file.get(), &known) != 0) return MAP_FAILED;
   // Two that find the file empty make it equally long.
-  if (::fstat(file, &known) == 0 && (known.st_size >= static_cast<off_t>(size) || ::ftruncate(file, size) == 0))
-    memory = ::mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_SHARED, file, 0);
-  const int reason = errno;
-  ::close(file);
-  errno = reason;
-  return memory;
+  if (known.st_size < static_cast<off_t>(size) && ::ftruncate(file.get(), size) != 0) return MAP_FAILED;
+  return ::mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_SHARED, file.get(), 0);
 }
 
 }  // namespace

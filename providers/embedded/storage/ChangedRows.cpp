@@ -22,7 +22,7 @@ bool ChangedRows::markRest() {
   return claimed_.empty() && !anyClaimed_;
 }
 
-// Called by the storage library, which no exception may pass through.
+// Called by SQLite, which no exception may pass through.
 void ChangedRows::onChange(void* self, int operation, const char*, const char*, sqlite3_int64 row) {
   auto& rows = *static_cast<ChangedRows*>(self);
   ++rows.seen_;

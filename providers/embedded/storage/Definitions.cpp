@@ -5,6 +5,7 @@
 
 #include "platform/PasswordDigest.h"
 #include "providers/embedded/bind/Binder.h"
+#include "providers/embedded/storage/ColumnType.h"
 #include "providers/embedded/storage/NullIndex.h"
 #include "providers/embedded/storage/StorageFailure.h"
 #include "providers/tsql/Parser.h"

@@ -21,11 +21,11 @@
 
 namespace QVSa::embedded {
 
-// What everything of the engine answers in a process that was forked from one that had used it: the storage library's
+// What everything of the engine answers in a process that was forked from one that had used it: SQLite's
 // record of its locks is inherited, the locks are not, and even new handles would read mixtures.
 Failure usedAfterFork();
 
-// One handle of the storage library with all databases of an installation attached under their names, its functions and
+// One SQLite connection with all databases of an installation attached under their names, its functions and
 // its collation registered: WAL journal, full sync. Waits for the writer with short random sleeps up to the deadline,
 // and stops a statement that runs over it.
 class Handle {
@@ -81,14 +81,14 @@ class Handle {
   // Writes this build's layout and the mark of the database into its file.
   void stamp(std::size_t database);
 
-  // Takes the writer's place of one database, inside a transaction of the handle: a write that changes nothing.
+  // Takes the write lock of one database, inside a transaction of the handle: a write that changes nothing.
   void takeWriter(std::size_t database);
-  // Begins and ends a transaction of the storage library.
+  // Begins and ends an SQLite transaction.
   void begin();
   void commit();
-  // Runs statements of the storage library that give no rows.
+  // Runs SQLite statements that give no rows.
   void execute(const std::string& text);
-  // Whether a transaction of the storage library is open.
+  // Whether an SQLite transaction is open.
   bool inTransaction() const;
   // The stored digest of a log-in's password; empty for a log-in that does not exist.
   std::string loginDigest(const std::string& user);

@@ -28,7 +28,7 @@ struct NamedFile {
 };
 std::array<NamedFile, 2> filesOf(const std::filesystem::path& folder, const std::string& database);
 
-// What is wrong with a folder whose absolute path, and `spare` bytes more, is too long for the storage library; empty
+// What is wrong with a folder whose absolute path, and `spare` bytes more, is too long for SQLite; empty
 // where it is not.
 std::string lengthProblem(const std::filesystem::path& folder, std::size_t spare = 0);
 

@@ -16,7 +16,7 @@ Failure cannotOpen(const std::filesystem::path& folder, std::size_t database, co
                    const std::string& advice);
 // The same for a file that is not what it should be: to be replaced by the right one, or by a backup.
 Failure cannotOpen(const std::filesystem::path& folder, std::size_t database, const std::string& wrong);
-// The same by the code that the storage library gave when it opened or read the file.
+// The same by the code that SQLite gave when it opened or read the file.
 Failure cannotOpen(const std::filesystem::path& folder, std::size_t database, sqlite3* handle, int code);
 
 // The same for the lock file of a database, by errno.

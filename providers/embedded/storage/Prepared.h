@@ -9,7 +9,7 @@
 
 namespace QVSa::embedded {
 
-// A prepared statement of the storage library. Throws the failure that belongs to a result code; the statement is reset
+// A prepared SQLite statement. Throws the failure that belongs to a result code; the statement is reset
 // then.
 class Prepared {
  public:

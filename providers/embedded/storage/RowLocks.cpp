@@ -47,10 +47,8 @@ struct flock rangeLock(short type, std::int64_t start, std::int64_t length) {
 }  // namespace
 
 RowLocks::RowLocks(const std::filesystem::path& lockFile) : file_(::open(lockFile.c_str(), O_RDWR | O_CLOEXEC)) {
-  if (file_ < 0) throw cannotOpenLockFile(lockFile);
+  if (!file_.isOpen()) throw cannotOpenLockFile(lockFile);
 }
-
-RowLocks::~RowLocks() { ::close(file_); }
 
 bool RowLocks::tryLock(const std::string& table, std::int64_t row) {
   const std::int64_t range = rangeOf(table);
@@ -81,7 +79,7 @@ bool RowLocks::tryMark(const std::string& table) {
 
 bool RowLocks::othersHold(const std::string& table, std::int64_t row) const {
   struct flock lock = rangeLock(F_WRLCK, byteOf(rangeOf(table), row), 1);
-  if (::fcntl(file_, F_OFD_GETLK, &lock) != 0) throwLockFailure();
+  if (::fcntl(file_.get(), F_OFD_GETLK, &lock) != 0) throwLockFailure();
   return lock.l_type != F_UNLCK;
 }
 
@@ -113,7 +111,7 @@ void RowLocks::endAlone() {
 
 bool RowLocks::setLock(short type, std::int64_t start, std::int64_t length) {
   struct flock lock = rangeLock(type, start, length);
-  if (::fcntl(file_, F_OFD_SETLK, &lock) == 0) return true;
+  if (::fcntl(file_.get(), F_OFD_SETLK, &lock) == 0) return true;
   if (errno == EAGAIN || errno == EACCES) return false;
   throwLockFailure();
 }

@@ -6,6 +6,8 @@
 #include <set>
 #include <string>
 
+#include "platform/FileDescriptor.h"
+
 namespace QVSa::embedded {
 
 // One session's row locks on one database: byte ranges of a lock file beside it, held by this object's own open file,
@@ -24,7 +26,6 @@ class RowLocks {
 
   // Throws 4060 where the file cannot be opened.
   explicit RowLocks(const std::filesystem::path& lockFile);
-  ~RowLocks();
   RowLocks(const RowLocks&) = delete;
   RowLocks& operator=(const RowLocks&) = delete;
 
@@ -62,7 +63,7 @@ class RowLocks {
   bool setLock(short type, std::int64_t start, std::int64_t length);
   bool take(short type, std::int64_t byte, Rows& rows);
 
-  int file_;
+  platform::FileDescriptor file_;
   std::map<std::int64_t, Held> held_;  // by the start of the table's range; made before the first lock in it
   bool entered_ = false;
   bool alone_ = false;

@@ -7,7 +7,7 @@ namespace QVSa::embedded {
 
 namespace {
 
-// The storage library gives no bytes where it had no memory to make them ready.
+// SQLite gives no bytes where it had no memory to make them ready.
 std::string textFrom(const unsigned char* text, int size) {
   if (text == nullptr) throw std::bad_alloc();
   return std::string(reinterpret_cast<const char*>(text), static_cast<std::size_t>(size));

@@ -8,7 +8,7 @@ struct sqlite3_value;
 
 namespace QVSa::embedded {
 
-// Values on their way into and out of the storage library.
+// Values on their way into and out of SQLite.
 Value readValue(sqlite3_value* value);
 Value readColumn(sqlite3_stmt* statement, int ordinal);
 void giveResult(sqlite3_context* context, const Value& value);
