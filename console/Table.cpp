@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "QVSa/values/Text.h"
+
 namespace QVSa::console {
 
 namespace {
@@ -23,15 +25,10 @@ String padded(const String& text, std::size_t width) {
   return text + String(width - std::min(width, widthOf(text)), ' ');
 }
 
-String withoutTrailingBlanks(String line) {
-  line.erase(line.find_last_not_of(' ') + 1);
-  return line;
-}
-
 String lineOf(const std::vector<String>& cells, const std::vector<std::size_t>& widths) {
   String line;
   for (std::size_t i = 0; i < cells.size(); ++i) line += padded(cells[i], widths[i]) + "  ";
-  return withoutTrailingBlanks(line) + "\n";
+  return trimRight(line) + "\n";
 }
 
 }  // namespace

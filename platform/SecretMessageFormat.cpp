@@ -13,6 +13,11 @@ namespace QVSa::platform {
 
 namespace {
 
+constexpr char envelopeType[] = "1.3.6.1.4.1.311.88.3";
+constexpr char contentType[] = "1.3.6.1.4.1.311.88.3.1";
+constexpr long messageVersion = 0x00020001;
+constexpr std::size_t lineLength = 64;
+
 // The message is three nested sequences; the outer two begin with their object identifier.
 struct Sealed {
   ASN1_INTEGER* version;
@@ -52,18 +57,13 @@ ASN1_SEQUENCE(Envelope) = {
   ASN1_SIMPLE(Envelope, type, ASN1_OBJECT),
   ASN1_EXP(Envelope, content, Typed, 0),
 } static_ASN1_SEQUENCE_END(Envelope)
-    // clang-format on
-
-    constexpr char envelopeType[] = "1.3.6.1.4.1.311.88.3";
-constexpr char contentType[] = "1.3.6.1.4.1.311.88.3.1";
-constexpr long messageVersion = 0x00020001;
-constexpr std::size_t lineLength = 64;
 
 struct FreeEnvelope {
   void operator()(Envelope* envelope) const {
     ASN1_item_free(reinterpret_cast<ASN1_VALUE*>(envelope), ASN1_ITEM_rptr(Envelope));
   }
 };
+// clang-format on
 using EnvelopePointer = std::unique_ptr<Envelope, FreeEnvelope>;
 
 struct FreeDecoder {

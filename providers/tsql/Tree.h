@@ -39,11 +39,6 @@ struct WhenBranch {
   ExpressionPtr operand;
 };
 
-// What a binder found an expression to be; empty in a tree that was only parsed. See the provider that binds.
-struct Binding {
-  virtual ~Binding() = default;
-};
-
 struct Expression {
   enum class Kind {
     null,
@@ -82,7 +77,6 @@ struct Expression {
   std::vector<WhenBranch> branches;
   ExpressionPtr otherwise;
   SelectPtr select;
-  std::unique_ptr<Binding> binding;
 
   Expression();
   ~Expression();

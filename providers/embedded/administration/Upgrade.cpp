@@ -38,7 +38,7 @@ void upgradeDatabase(const std::filesystem::path& folder, std::size_t database) 
   PooledHandle handle(new Handle(folder, Handle::Unreadable::replaced));
   if (handle->layout(database) == layoutVersion) return;
   takeAlone(*handle, database);
-  EmbeddedSession(std::move(handle), database, true).upgrade();
+  EmbeddedSession(std::move(handle), database, true).upgrade(database);
 }
 
 }  // namespace

@@ -3,10 +3,12 @@
 #include <algorithm>
 
 #include "platform/Services.h"
+#include "providers/embedded/administration/Upgrade.h"
 #include "providers/embedded/bind/Binder.h"
 #include "providers/embedded/bind/Literal.h"
 #include "providers/embedded/session/Rows.h"
 #include "providers/embedded/storage/Definitions.h"
+#include "providers/embedded/storage/OpeningFailure.h"
 #include "providers/embedded/storage/Savepoint.h"
 #include "providers/embedded/storage/StorageFailure.h"
 #include "providers/tsql/Parser.h"
@@ -14,20 +16,11 @@
 
 namespace QVSa::embedded {
 
-// What a handle keeps between sessions: the catalogue, and the plans that were bound against it.
-struct EmbeddedSession::Cache {
-  std::shared_ptr<const Catalogue> catalogue;
-  std::uint64_t mark = 0;                                 // under which the catalogue was found right
-  std::array<PlanCache, 2 * databaseNames.size()> plans;  // by current database and whether rows are to be written back
-};
-
 namespace {
 
 bool changesNames(const tsql::Statement& statement) {
   return std::holds_alternative<tsql::Use>(statement) || isDefinition(statement);
 }
-
-std::pair<std::size_t, std::string> tableKey(const TableInfo& table) { return {table.database, foldName(table.name)}; }
 
 void skipResult(Prepared& statement) {
   while (statement.step()) {
@@ -85,69 +78,42 @@ bool isRollback(const Step& step) {
 }  // namespace
 
 EmbeddedSession::EmbeddedSession(PooledHandle handle, std::size_t database, bool administrator)
-    : database_(database), administrator_(administrator) {
-  useHandle(std::move(handle));
-  enter(database_);
-  refreshCatalogue();
-  cache_->catalogue->requireReadable(database_);
-}
+    : workspace_(std::move(handle), database),
+      transaction_(workspace_),
+      administration_(*this, workspace_, transaction_, administrator) {}
 
-void EmbeddedSession::useHandle(PooledHandle handle) {
-  handle_ = std::move(handle);
-  if (!handle_->attachment()) handle_->attachment() = std::make_shared<Cache>();
-  cache_ = std::static_pointer_cast<Cache>(handle_->attachment());
-}
+EmbeddedSession::~EmbeddedSession() { workspace_.closeRows(); }
 
-EmbeddedSession::~EmbeddedSession() {
-  for (auto* rows : rows_) rows->close();
-  // What it has defined and not committed is undone now.
-  if (change_) cache_->catalogue.reset();
-  try {
-    endTransaction();
-    if (handle_->inTransaction()) handle_->execute("rollback");
-  } catch (...) {
-    // The pool does not keep a handle whose transaction could not be ended.
-  }
-}
-
-void EmbeddedSession::refreshCatalogue() {
-  const std::uint64_t mark = handle_->mark().value();
-  if (cache_->catalogue && cache_->mark == mark && CatalogueMark::isSettled(mark)) return;
-  // Who reads already goes on seeing what was there before: the mark says nothing of that.
-  const bool readsAlready = sqlite3_txn_state(handle_->get(), nullptr) != SQLITE_TXN_NONE;
-  if (!cache_->catalogue || cache_->catalogue->version() != handle_->catalogueVersion()) {
-    for (auto& plans : cache_->plans) plans.clear();
-    cache_->catalogue = std::make_shared<const Catalogue>(*handle_);
-  }
-  if (!readsAlready) cache_->mark = mark;
-}
+void EmbeddedSession::begin() { transaction_.begin(); }
+void EmbeddedSession::commit() { transaction_.commit(); }
+void EmbeddedSession::rollback() { transaction_.rollback(); }
 
 template <class Work>
 auto EmbeddedSession::guarded(Work work) {
-  handle_->requireOwnProcess();
+  workspace_.handle().requireOwnProcess();
   try {
     auto result = work();
-    leaveOthers();
+    if (!transaction_.isOpen()) workspace_.leaveOthers();
     return result;
   } catch (const Failure& failure) {
-    afterFailure(failure.native());
+    transaction_.afterFailure(failure.native());
     throw;
   } catch (...) {
-    afterFailure(0);
+    transaction_.afterFailure(0);
     throw;
   }
 }
 
 BatchResult EmbeddedSession::run(const Batch& batch) {
   return guarded([&] {
-    const TimeLimit limit(*handle_, batch.timeout);
+    const TimeLimit limit(workspace_.handle(), batch.timeout);
     return runStatements(batch);
   });
 }
 
 BatchResult EmbeddedSession::runStatements(const Batch& batch) {
-  const tsql::Deadline deadline(handle_->deadline());
-  refreshCatalogue();
+  const tsql::Deadline deadline(workspace_.handle().deadline());
+  workspace_.refreshCatalogue();
   auto tokens = tsql::tokenize(batch.text, deadline);
   const auto plan = planFor(batch, tokens);
   std::vector<tsql::Statement> statements;
@@ -160,23 +126,23 @@ BatchResult EmbeddedSession::runStatements(const Batch& batch) {
 }
 
 std::shared_ptr<Plan> EmbeddedSession::planFor(const Batch& batch, std::vector<tsql::Token>& tokens) {
-  PlanCache& plans = cache_->plans[2 * database_ + (batch.updatable ? 1 : 0)];
+  PlanCache& plans = workspace_.plans(batch.updatable);
   const std::string shape = tsql::shapeOf(tokens);
   if (auto known = plans.find(shape, tokens)) return known;
-  const tsql::Deadline deadline(handle_->deadline());
+  const tsql::Deadline deadline(workspace_.handle().deadline());
   auto statements = tsql::parse(tokens, deadline);
   if (std::ranges::any_of(statements, changesNames)) return nullptr;
   auto plan = std::make_shared<Plan>();
-  plan->catalogue = cache_->catalogue;
+  plan->catalogue = workspace_.catalogue();
   LiteralUses uses;
   try {
     for (auto& statement : statements)
       plan->steps.push_back(
-          compile(std::move(statement), *plan->catalogue, database_, batch.updatable, deadline, uses));
+          compile(std::move(statement), *plan->catalogue, workspace_.database(), batch.updatable, deadline, uses));
   } catch (const Failure& failure) {
     // Another session may have made the object since this one looked.
-    if (cache_->catalogue->version() == handle_->catalogueVersion()) throw;
-    refreshCatalogue();
+    if (workspace_.catalogue()->version() == workspace_.handle().catalogueVersion()) throw;
+    workspace_.refreshCatalogue();
     return planFor(batch, tokens);
   }
   plans.add(shape, tokens, std::move(uses), plan);
@@ -188,10 +154,10 @@ BatchResult EmbeddedSession::runUncached(std::vector<tsql::Statement> statements
   BatchResult result;
   for (auto& statement : statements) {
     auto plan = std::make_shared<Plan>();
-    plan->catalogue = cache_->catalogue;
+    plan->catalogue = workspace_.catalogue();
     LiteralUses uses;
-    plan->steps.push_back(compile(std::move(statement), *plan->catalogue, database_, batch.updatable,
-                                  tsql::Deadline(handle_->deadline()), uses));
+    plan->steps.push_back(compile(std::move(statement), *plan->catalogue, workspace_.database(), batch.updatable,
+                                  tsql::Deadline(workspace_.handle().deadline()), uses));
     runStep(plan, plan->steps.front(), tokens, result);
   }
   return result;
@@ -199,10 +165,10 @@ BatchResult EmbeddedSession::runUncached(std::vector<tsql::Statement> statements
 
 void EmbeddedSession::runStep(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens,
                               BatchResult& result) {
-  if (!isRollback(step)) refuseAfterLoss();
-  tsql::Deadline(handle_->deadline()).look();
-  handle_->context().statementTicks = ticksOf(platform::services().localTime());
-  for (const std::size_t database : step.databases) enter(database);
+  if (!isRollback(step)) transaction_.refuseAfterLoss();
+  tsql::Deadline(workspace_.handle().deadline()).look();
+  workspace_.handle().context().statementTicks = ticksOf(platform::services().localTime());
+  for (const std::size_t database : step.databases) workspace_.enter(database);
   if (step.kind == Step::Kind::control) return control(step.control);
   if (step.kind != Step::Kind::query) {
     result.affected = write(plan, step, tokens);
@@ -214,15 +180,17 @@ void EmbeddedSession::runStep(const std::shared_ptr<Plan>& plan, Step& step, con
 
 std::unique_ptr<Rows> EmbeddedSession::query(const std::shared_ptr<Plan>& plan, Step& step,
                                              const std::vector<tsql::Token>& tokens) {
-  const auto locked = step.candidates ? claimRows(step, tokens) : nullptr;
-  Prepared statement = step.main->take(*handle_);
+  // Each row that a select with lock hints may give is locked first, and the select then reads it again.
+  const auto locked =
+      step.candidates ? transaction_.claim(*step.table, candidates(step, tokens), step.locks, step.skips) : nullptr;
+  Prepared statement = step.main->take(workspace_.handle());
   bind(statement, *step.main, step.parameters, tokens, locked);
   auto rows = std::make_unique<EmbeddedRows>(*this, plan, step, std::move(statement));
-  if (locked && !marked_) {
+  if (locked && !transaction_.isOpen()) {
     rows->buffer();
-    handle_->locks(step.table->database).release();
+    workspace_.handle().locks(step.table->database).release();
   }
-  if (started_) settle();
+  transaction_.noteRead();
   return rows;
 }
 
@@ -245,7 +213,7 @@ void EmbeddedSession::bind(Prepared& statement, const Compiled& compiled, const 
 }
 
 ValueList EmbeddedSession::candidates(Step& step, const std::vector<tsql::Token>& tokens) {
-  Prepared statement = step.candidates->take(*handle_);
+  Prepared statement = step.candidates->take(workspace_.handle());
   bind(statement, *step.candidates, step.parameters, tokens);
   ValueList keys;
   while (statement.step()) keys.push_back(statement.column(0));
@@ -253,35 +221,8 @@ ValueList EmbeddedSession::candidates(Step& step, const std::vector<tsql::Token>
   return keys;
 }
 
-// The rows that a select with lock hints may give: each is locked first, and the select then reads it again.
-std::shared_ptr<const ValueList> EmbeddedSession::claimRows(Step& step, const std::vector<tsql::Token>& tokens) {
-  const TableInfo& table = *step.table;
-  RowLocks& locks = handle_->locks(table.database);
-  const auto taken = [&](std::int64_t row) {
-    if (!step.locks) return !locks.othersHold(table.name, row);
-    // Who has the write lock is the only one to change rows. One that waits for it may have marked them already.
-    return writing_.contains(table.database) ? locks.tryMark(table.name, row) : locks.tryLock(table.name, row);
-  };
-  auto mine = std::make_shared<ValueList>();
-  for (auto& key : candidates(step, tokens)) {
-    const std::int64_t row = std::get<std::int64_t>(key);
-    bool have = taken(row);
-    for (; !have && !step.skips; have = taken(row)) {
-      if (started_) giveWriteLockBack();
-      handle_->waitShortly();
-    }
-    if (have)
-      mine->push_back(std::move(key));
-    else if (marked_)
-      passedOver_[tableKey(table)].push_back(std::move(key));
-  }
-  if (undone_) prepareWrite(table.database);
-  std::ranges::sort(*mine);
-  return mine;
-}
-
 Long EmbeddedSession::write(const std::shared_ptr<Plan>& plan, Step& step, const std::vector<tsql::Token>& tokens) {
-  const bool takesIdentity = identityInsert_ == tableKey(*step.table);
+  const bool takesIdentity = identityInsert_ == keyOf(*step.table);
   if (step.givesIdentity && !takesIdentity)
     throw tsql::sqlFailure(544, "Cannot insert explicit value for identity column in table '" + step.table->name +
                                     "' when IDENTITY_INSERT is set to OFF.");
@@ -291,13 +232,14 @@ Long EmbeddedSession::write(const std::shared_ptr<Plan>& plan, Step& step, const
                                     "inserting into a NOT FOR REPLICATION identity column.");
   const bool inserts = step.kind == Step::Kind::insert;
   if (inserts) refusePassedOver(step, tokens);
-  if (!marked_)
-    return change({step.table->database, step.table->name, inserts, [&] { return runWrite(step, tokens); }});
-  const std::int64_t now = handle_->context().statementTicks;
-  return change({step.table->database, step.table->name, inserts, [this, plan, &step, tokens, now] {
-                   handle_->context().statementTicks = now;
-                   return runWrite(step, tokens);
-                 }});
+  if (!transaction_.isOpen())
+    return transaction_.change(
+        {step.table->database, step.table->name, inserts, [&] { return runWrite(step, tokens); }});
+  const std::int64_t now = workspace_.handle().context().statementTicks;
+  return transaction_.change({step.table->database, step.table->name, inserts, [this, plan, &step, tokens, now] {
+                                workspace_.handle().context().statementTicks = now;
+                                return runWrite(step, tokens);
+                              }});
 }
 
 Long EmbeddedSession::runWrite(Step& step, const std::vector<tsql::Token>& tokens) {
@@ -311,14 +253,14 @@ Long EmbeddedSession::runWrite(Step& step, const std::vector<tsql::Token>& token
 }
 
 Long EmbeddedSession::runOnce(Step& step, const std::vector<tsql::Token>& tokens) {
-  Prepared statement = step.main->take(*handle_);
+  Prepared statement = step.main->take(workspace_.handle());
   bind(statement, *step.main, step.parameters, tokens);
   skipResult(statement);
-  const Long changes = static_cast<Long>(sqlite3_changes(handle_->get()));
+  const Long changes = static_cast<Long>(sqlite3_changes(workspace_.handle().get()));
   step.main->giveBack(std::move(statement));
   if (step.kind == Step::Kind::insert && changes > 0 && step.table->identity) {
-    handle_->context().scopeIdentity = sqlite3_last_insert_rowid(handle_->get());
-    handle_->context().hasScopeIdentity = true;
+    workspace_.handle().context().scopeIdentity = sqlite3_last_insert_rowid(workspace_.handle().get());
+    workspace_.handle().context().hasScopeIdentity = true;
   }
   return changes;
 }
@@ -327,7 +269,7 @@ Long EmbeddedSession::runOnce(Step& step, const std::vector<tsql::Token>& tokens
 // new one as well. So the new values are read first, then the old ones are replaced by what collides with nothing, then
 // the new ones come.
 Long EmbeddedSession::moveKeys(Step& step, const std::vector<tsql::Token>& tokens) {
-  Binder binder(*cache_->catalogue, database_);
+  Binder binder(*workspace_.catalogue(), workspace_.database());
   const Compiled select(emit(*binder.bindNewValues(*step.update)));
   const auto parameters = binder.takeParameters();
   const std::string table = std::string(databaseNames[step.table->database]) + "." + quoteName(step.table->name);
@@ -337,14 +279,14 @@ Long EmbeddedSession::moveKeys(Step& step, const std::vector<tsql::Token>& token
     away += (away.empty() ? "" : ",") + column + "=cast('moved away, row ' || _rowid_ as blob)";
     back += (back.empty() ? "" : ",") + column + "=?";
   }
-  Savepoint savepoint(*handle_, step.table->database);
+  Savepoint savepoint(workspace_.handle(), step.table->database);
   std::vector<std::vector<Value>> rows;
-  Prepared read(handle_->get(), select.text());
+  Prepared read(workspace_.handle().get(), select.text());
   bind(read, select, parameters, tokens);
   while (read.step()) rows.push_back(read.row());
-  Prepared moveAway(handle_->get(), "update " + table + " set " + away + " where _rowid_=?");
+  Prepared moveAway(workspace_.handle().get(), "update " + table + " set " + away + " where _rowid_=?");
   for (const auto& row : rows) moveAway.runWith({row.front()});
-  Prepared moveBack(handle_->get(), "update " + table + " set " + back + " where _rowid_=?");
+  Prepared moveBack(workspace_.handle().get(), "update " + table + " set " + back + " where _rowid_=?");
   for (auto& row : rows) {
     std::rotate(row.begin(), row.begin() + 1, row.end());
     moveBack.runWith(row);
@@ -356,10 +298,10 @@ Long EmbeddedSession::moveKeys(Step& step, const std::vector<tsql::Token>& token
 // Who passes over a row and then inserts one of its key has collided, and need not wait for the write lock to hear of
 // it: whoever holds the row may have that lock for long.
 void EmbeddedSession::refusePassedOver(Step& step, const std::vector<tsql::Token>& tokens) {
-  const auto passed = passedOver_.find(tableKey(*step.table));
-  if (passed == passedOver_.end() || !step.candidates) return;
+  const ValueList* const passed = transaction_.passedOver(*step.table);
+  if (!passed || !step.candidates) return;
   for (const Value& key : candidates(step, tokens))
-    if (std::ranges::find(passed->second, key) != passed->second.end()) throw duplicateKey(step.table->name);
+    if (std::ranges::find(*passed, key) != passed->end()) throw duplicateKey(step.table->name);
 }
 
 void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
@@ -370,17 +312,17 @@ void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
   text = std::string("update ") + databaseNames[table.database] + "." + quoteName(table.name) + " set " + text +
          " where _rowid_=?";
   guarded([&] {
-    const TimeLimit limit(*handle_, rowWriteLimit);
-    refuseAfterLoss();
-    enter(table.database);
-    return change({table.database, table.name, false, [this, text, key, values] {
-                     Prepared statement(handle_->get(), text);
-                     int place = 0;
-                     for (const auto& [column, value] : values) statement.bind(++place, value);
-                     statement.bind(++place, key);
-                     skipResult(statement);
-                     return static_cast<Long>(sqlite3_changes(handle_->get()));
-                   }});
+    const TimeLimit limit(workspace_.handle(), rowWriteLimit);
+    transaction_.refuseAfterLoss();
+    workspace_.enter(table.database);
+    return transaction_.change({table.database, table.name, false, [this, text, key, values] {
+                                  Prepared statement(workspace_.handle().get(), text);
+                                  int place = 0;
+                                  for (const auto& [column, value] : values) statement.bind(++place, value);
+                                  statement.bind(++place, key);
+                                  skipResult(statement);
+                                  return static_cast<Long>(sqlite3_changes(workspace_.handle().get()));
+                                }});
   });
 }
 
@@ -388,12 +330,12 @@ void EmbeddedSession::control(const tsql::Statement& statement) {
   if (const auto* option = std::get_if<tsql::SetOption>(&statement)) return setOption(*option);
   if (const auto* transaction = std::get_if<tsql::Transaction>(&statement)) {
     using Kind = tsql::Transaction::Kind;
-    if (transaction->kind == Kind::begin && marked_) return static_cast<void>(++inner_);
+    if (transaction->kind == Kind::begin && transaction_.isOpen()) return transaction_.beginInner();
     if (transaction->kind == Kind::begin) return begin();
     return transaction->kind == Kind::commit ? commit() : rollback();
   }
   if (const auto* named = std::get_if<tsql::Use>(&statement)) return use(named->database);
-  if (administer(statement)) return;
+  if (administration_.run(statement)) return;
   if (const auto* call = std::get_if<tsql::Call>(&statement))
     throw tsql::sqlFailure(2812, "Could not find stored procedure '" + call->procedure.name + "'.");
   defineObject(statement);
@@ -404,76 +346,83 @@ void EmbeddedSession::use(const std::string& database) {
   if (!found)
     throw tsql::sqlFailure(911,
                            "Database '" + database + "' does not exist. Make sure that the name is entered correctly.");
-  enter(*found);
-  database_ = *found;
+  workspace_.use(*found);
 }
 
 void EmbeddedSession::setOption(const tsql::SetOption& option) {
   // Counts are the caller's own business here; every other option than these two is refused by the parser.
   if (option.option != "identity_insert") return;
-  const Object object = cache_->catalogue->find(*option.table, database_);
+  const Object object = workspace_.catalogue()->find(*option.table, workspace_.database());
   const auto* table = std::get_if<const TableInfo*>(&object);
   if (!table || !(*table)->identity)
     throw tsql::sqlFailure(8106, "Table '" + option.table->name +
                                      "' does not have the identity property. Cannot perform "
                                      "SET operation.");
-  const auto key = tableKey(**table);
+  const auto key = keyOf(**table);
   const bool isOther = !identityInsert_.second.empty() && identityInsert_ != key;
   if (option.on && isOther)
     throw tsql::sqlFailure(8107, "IDENTITY_INSERT is already ON for table '" + identityInsert_.second +
                                      "'. Cannot perform SET operation for table '" + option.table->name + "'.");
-  if (!isOther) identityInsert_ = option.on ? key : std::pair<std::size_t, std::string>();
+  if (!isOther) identityInsert_ = option.on ? key : TableKey();
 }
 
 void EmbeddedSession::defineObject(const tsql::Statement& statement) {
   const bool logins = std::holds_alternative<tsql::CreateLogin>(statement) ||
                       (std::holds_alternative<tsql::Drop>(statement) &&
                        std::get<tsql::Drop>(statement).kind == tsql::Drop::Kind::login);
-  if (logins && !administrator_) throw tsql::sqlFailure(229, "User does not have permission to perform this action.");
-  const bool own = !marked_;
+  if (logins) administration_.requireAdministrator();
+  const bool own = !transaction_.isOpen();
   if (own) begin();
   try {
-    if (!change_) change_.emplace(handle_->mark());
-    const std::size_t database = definedDatabase(statement, database_);
-    cache_->catalogue->requireReadable(database);
-    enter(database);
-    prepareWrite(database);
-    settle();
-    define(*handle_, *cache_->catalogue, database_, statement);
-    refreshCatalogue();
+    transaction_.noteDefinition();
+    const std::size_t database = definedDatabase(statement, workspace_.database());
+    workspace_.catalogue()->requireReadable(database);
+    workspace_.enter(database);
+    transaction_.prepareDefinition(database);
+    define(workspace_.handle(), *workspace_.catalogue(), workspace_.database(), statement);
+    workspace_.refreshCatalogue();
     if (own) commit();
   } catch (...) {
     if (own) rollback();
-    refreshCatalogue();
+    workspace_.refreshCatalogue();
     throw;
   }
 }
 
+void EmbeddedSession::upgrade(std::size_t database) {
+  const std::size_t before = workspace_.database();
+  workspace_.use(database);
+  try {
+    upgradeCurrent();
+  } catch (...) {
+    workspace_.use(before);
+    throw;
+  }
+  workspace_.use(before);
+}
+
+void EmbeddedSession::upgradeCurrent() {
+  Handle& handle = workspace_.handle();
+  const std::size_t database = workspace_.database();
+  const int from = handle.layout(database);
+  if (from == layoutVersion) return;
+  begin();
+  try {
+    transaction_.prepareWrite(database);
+    for (const auto& batch : upgradeBatches(databaseNames[database], from))
+      run({batch, false, std::chrono::seconds(0)});
+    handle.stamp(database);
+    commit();
+  } catch (const Failure& failure) {
+    rollback();
+    throw cannotOpen(handle.folder(), database,
+                     "the file is of an older release, and its upgrade failed: " + failure.description());
+  }
+}
+
 void EmbeddedSession::detach(EmbeddedRows& rows) {
-  std::erase(rows_, &rows);
-  leaveOthers();
-}
-
-void EmbeddedSession::enter(std::size_t database) {
-  if (entered_.contains(database)) return;
-  RowLocks& locks = handle_->locks(database);
-  entered_.insert(database);
-  if (locks.tryEnter()) return;
-  entered_.erase(database);
-  throw tsql::sqlFailure(924, std::string("Database '") + databaseNames[database] +
-                                  "' is already open and can only have one user at a time.");
-}
-
-// A database that is not the current one is in use while a statement runs there: up to the end of its row set, or of
-// the transaction.
-void EmbeddedSession::leaveOthers() {
-  if (entered_.size() == 1 || marked_) return;
-  if (std::ranges::any_of(rows_, [](const EmbeddedRows* rows) { return rows->isStreaming(); })) return;
-  std::erase_if(entered_, [this](std::size_t database) {
-    if (database == database_) return false;
-    handle_->locks(database).leave();
-    return true;
-  });
+  workspace_.detach(rows);
+  if (!transaction_.isOpen()) workspace_.leaveOthers();
 }
 
 }  // namespace QVSa::embedded

@@ -33,6 +33,8 @@ std::string dotted(const tsql::ObjectName& name) {
 
 }  // namespace
 
+TableKey keyOf(const TableInfo& table) { return {table.database, foldName(table.name)}; }
+
 TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition) {
   TableInfo table{database, definition.table.name, {}, std::nullopt, {}};
   for (auto& column : definition.columns) {

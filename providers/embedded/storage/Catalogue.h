@@ -5,6 +5,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <utility>
 #include <variant>
 #include <vector>
 
@@ -31,6 +32,10 @@ struct TableInfo {
 
   std::optional<std::size_t> find(const std::string& column) const;
 };
+
+// A table by its database and its name as names are compared.
+using TableKey = std::pair<std::size_t, std::string>;
+TableKey keyOf(const TableInfo& table);
 
 // What a definition makes; its defaults go over.
 TableInfo tableInfo(std::size_t database, tsql::CreateTable& definition);

@@ -1,10 +1,10 @@
+#include "providers/embedded/administration/Administration.h"
+
 #include <algorithm>
 
 #include "providers/embedded/administration/Backup.h"
 #include "providers/embedded/administration/Restore.h"
-#include "providers/embedded/administration/Upgrade.h"
 #include "providers/embedded/session/Session.h"
-#include "providers/embedded/storage/OpeningFailure.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::embedded {
@@ -58,7 +58,7 @@ class AloneMeanwhile {
 
 }  // namespace
 
-bool EmbeddedSession::administer(const tsql::Statement& statement) {
+bool Administration::run(const tsql::Statement& statement) {
   if (const auto* alter = std::get_if<tsql::AlterDatabase>(&statement)) return alterDatabase(*alter), true;
   if (const auto* backup = std::get_if<tsql::BackupDatabase>(&statement)) return backUpDatabase(*backup), true;
   if (const auto* restore = std::get_if<tsql::RestoreDatabase>(&statement)) return restoreDatabase(*restore), true;
@@ -67,118 +67,88 @@ bool EmbeddedSession::administer(const tsql::Statement& statement) {
   return call && callProcedure(*call);
 }
 
-bool EmbeddedSession::callProcedure(const tsql::Call& call) {
+bool Administration::callProcedure(const tsql::Call& call) {
   if (sameName(call.procedure.name, "sp_changedbowner")) return changeOwner(call), true;
   if (sameName(call.procedure.name, "sp_getapplock")) return takeApplicationLock(call), true;
   return false;
 }
 
-void EmbeddedSession::requireNoTransaction() const {
-  if (marked_) throw sqlFailure(3021, "Cannot perform this operation within a transaction.");
+void Administration::requireAdministrator() const {
+  if (!administrator_) throw sqlFailure(229, "User does not have permission to perform this action.");
+}
+
+void Administration::requireNoTransaction() const {
+  if (transaction_.isOpen()) throw sqlFailure(3021, "Cannot perform this operation within a transaction.");
 }
 
 // Waits until every other session has left the database. The mode ends with the session at the latest.
-void EmbeddedSession::alterDatabase(const tsql::AlterDatabase& alter) {
+void Administration::alterDatabase(const tsql::AlterDatabase& alter) {
   requireNoTransaction();
   const std::size_t database = knownDatabase(alter.database);
   if (database == master)
     throw sqlFailure(5058, "Option 'SINGLE_USER' cannot be set in database '" + alter.database + "'.");
-  RowLocks& locks = handle_->locks(database);
+  RowLocks& locks = handle().locks(database);
   if (!alter.singleUser) {
     if (locks.isAlone()) return locks.endAlone();
-    return enter(database);
+    return workspace_.enter(database);
   }
   while (!locks.tryTakeAlone()) {
     if (alter.noWait)
       throw sqlFailure(5061, "ALTER DATABASE failed because a lock could not be placed on database '" + alter.database +
                                  "'. Try again later.");
-    handle_->waitShortly();
+    handle().waitShortly();
   }
 }
 
-void EmbeddedSession::backUpDatabase(const tsql::BackupDatabase& backup) {
+void Administration::backUpDatabase(const tsql::BackupDatabase& backup) {
   requireNoTransaction();
   const std::size_t database = knownDatabase(backup.database);
-  enter(database);
-  backUp(*handle_, database, backup.file.text);
+  workspace_.enter(database);
+  backUp(handle(), database, backup.file.text);
 }
 
-void EmbeddedSession::restoreDatabase(const tsql::RestoreDatabase& restore) {
+void Administration::restoreDatabase(const tsql::RestoreDatabase& restore) {
   requireNoTransaction();
   const std::size_t database = knownDatabase(restore.database);
   if (!administrator_ || database == master)
     throw sqlFailure(3110, "User does not have permission to RESTORE database '" + restore.database + "'.");
-  if (database == database_)
+  if (database == workspace_.database())
     throw sqlFailure(3102, "RESTORE cannot process database '" + restore.database +
                                "' because it is in use by this session. It is recommended that the master database be "
                                "used when performing this operation.");
-  checkMoves(restore, handle_->folder(), database);
-  const AloneMeanwhile alone(handle_->locks(database), restore.database);
+  checkMoves(restore, handle().folder(), database);
+  const AloneMeanwhile alone(handle().locks(database), restore.database);
   {
-    const CatalogueChange change(handle_->mark());
-    restoreCopy(*handle_, database, restore.file.text);
+    const CatalogueChange change(handle().mark());
+    restoreCopy(handle(), database, restore.file.text);
   }
-  if (!handle_->isCurrent()) reopen();
-  refreshCatalogue();
-  const std::size_t before = database_;
-  use(databaseNames[database]);
-  try {
-    upgrade();
-  } catch (...) {
-    database_ = before;
-    throw;
-  }
-  database_ = before;
+  if (!handle().isCurrent()) workspace_.reopen();
+  workspace_.refreshCatalogue();
+  session_.upgrade(database);
 }
 
-// A database that could not be read has got a new file.
-void EmbeddedSession::reopen() {
-  bufferRows();
-  PooledHandle fresh(new Handle(handle_->folder(), Handle::Unreadable::replaced));
-  fresh->adoptLocks(*handle_);
-  retired_ = std::move(handle_);
-  useHandle(std::move(fresh));
-}
-
-void EmbeddedSession::upgrade() {
-  const int from = handle_->layout(database_);
-  if (from == layoutVersion) return;
-  begin();
-  try {
-    prepareWrite(database_);
-    for (const auto& batch : upgradeBatches(databaseNames[database_], from))
-      run({batch, false, std::chrono::seconds(0)});
-    handle_->stamp(database_);
-    commit();
-  } catch (const Failure& failure) {
-    rollback();
-    throw cannotOpen(handle_->folder(), database_,
-                     "the file is of an older release, and its upgrade failed: " + failure.description());
-  }
-}
-
-void EmbeddedSession::verifyBackup(const tsql::VerifyBackup& verify) {
-  BackupFile(verify.file.text, handle_->deadline()).check();
+void Administration::verifyBackup(const tsql::VerifyBackup& verify) {
+  BackupFile(verify.file.text, handle().deadline()).check();
 }
 
 // One log-in owns the databases, from their making on: all that there is to do is to see that it exists.
-void EmbeddedSession::changeOwner(const tsql::Call& call) {
-  if (!administrator_) throw sqlFailure(229, "User does not have permission to perform this action.");
+void Administration::changeOwner(const tsql::Call& call) {
+  requireAdministrator();
   const std::string login = call.arguments.size() == 1 ? call.arguments.front()->token.text : std::string();
-  if (handle_->loginDigest(login).empty())
+  if (handle().loginDigest(login).empty())
     throw sqlFailure(15007, "'" + login + "' is not a valid login or you do not have permission.");
 }
 
 // Of the modes and owners the exclusive lock of the transaction alone: it is let go at the transaction's end. A name
 // takes a table's place among the row locks, so that two names with one hash wait for each other.
-void EmbeddedSession::takeApplicationLock(const tsql::Call& call) {
+void Administration::takeApplicationLock(const tsql::Call& call) {
   const auto& arguments = call.arguments;
   if (arguments.size() != 2 || !sameName(arguments[1]->token.text, "Exclusive"))
     throw sqlFailure(15600, "An invalid parameter or option was specified for procedure 'sp_getapplock'.");
-  if (!marked_)
+  if (!transaction_.isOpen())
     throw sqlFailure(15626, "You attempted to acquire a transactional application lock without an active transaction.");
-  RowLocks& locks = handle_->locks(database_);
-  while (!locks.tryLock("application lock " + arguments[0]->token.text, 0)) handle_->waitShortly();
+  RowLocks& locks = handle().locks(workspace_.database());
+  while (!locks.tryLock("application lock " + arguments[0]->token.text, 0)) handle().waitShortly();
 }
 
 }  // namespace QVSa::embedded
