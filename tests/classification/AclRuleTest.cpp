@@ -31,8 +31,7 @@ TEST_F(AccessRule, IsInsertedOnceAndThenUpdatedWhateverItsId) {
 
   AclRule other;
   other.connect(server());
-  EXPECT_FALSE(other.Save()) << "the rule is there, and was not loaded";
-  EXPECT_EQ(other.errNumber(), number::integrity);
+  EXPECT_EQ(refusal(other, other.Save()), number::integrity) << "the rule is there, and was not loaded";
   EXPECT_EQ(other.Id(), 0);
   EXPECT_TRUE(other.GetOne());
   EXPECT_EQ(other.ExcludeAdmin(), -1);

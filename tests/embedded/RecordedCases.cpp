@@ -1,12 +1,16 @@
-// Runs the data-driven cases: recorded ones of another T-SQL server, and the project's own.
+// Runs the data-driven cases: recorded ones of another T-SQL server, and the project's own. A line of its own is a
+// batch to be taken: one that begins with a number and a colon is refused by that number, or by one of several; behind
+// an arrow stand the rows, a semicolon between two, or "none". Longer cases have the recorded ones' form.
 
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
 #include <gtest/gtest.h>
+#include <regex>
 #include <sstream>
 
 #include "QVSa/frame/ConnectionString.h"
+#include "QVSa/values/Text.h"
 #include "providers/embedded/session/Provider.h"
 #include "tests/support/TestInstallation.h"
 
@@ -20,7 +24,6 @@ struct Case {
   std::string kind;  // statement ok, statement error N..., query
   std::string batch;
   std::vector<std::string> rows;
-  bool ordered = false;
 };
 
 std::vector<std::string> linesOf(const std::filesystem::path& path) {
@@ -30,23 +33,46 @@ std::vector<std::string> linesOf(const std::filesystem::path& path) {
   return lines;
 }
 
-bool opensCase(const std::string& line) { return line.starts_with("statement ") || line == "query"; }
+bool isOrdered(const std::string& batch) {
+  std::string lower = batch;
+  std::ranges::transform(lower, lower.begin(), [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
+  return lower.find("order by") != std::string::npos;
+}
+
+// A case that stands on one line.
+Case shortCase(const std::string& line) {
+  std::smatch parts;
+  if (std::regex_match(line, parts, std::regex("([0-9 ]+): (.*)")))
+    return {"", 0, "statement error " + parts.str(1), parts.str(2), {}};
+  if (!std::regex_match(line, parts, std::regex("(.*) -> (.*)"))) return {"", 0, "statement ok", line, {}};
+  Case found{"", 0, "query", parts.str(1), {}};
+  if (parts.str(2) == "none") return found;
+  const std::string rows = replaceAll(parts.str(2), ", ", "\t");
+  for (const String& row : split(replaceAll(rows, "; ", "\n"), '\n')) found.rows.push_back(row);
+  return found;
+}
+
+// One that opens with its kind, up to an empty line; `at` goes to its last line.
+Case longCase(const std::vector<std::string>& lines, std::size_t& at) {
+  Case found{"", 0, lines[at], "", {}};
+  // A batch ends at the rows' line, at an empty line where there are none.
+  for (++at; at < lines.size() && lines[at] != "----" && !lines[at].empty(); ++at)
+    found.batch += (found.batch.empty() ? "" : "\n") + lines[at];
+  if (at < lines.size() && lines[at] == "----")
+    for (++at; at < lines.size() && !lines[at].empty(); ++at) found.rows.push_back(lines[at]);
+  return found;
+}
 
 std::vector<Case> casesOf(const std::filesystem::path& path) {
   std::vector<Case> cases;
   const auto lines = linesOf(path);
   for (std::size_t i = 0; i < lines.size(); ++i) {
-    if (!opensCase(lines[i])) continue;
-    Case found{path.filename().string(), static_cast<int>(i + 1), lines[i], "", {}};
-    // A batch ends at the rows' line, at an empty line where there are none.
-    for (++i; i < lines.size() && lines[i] != "----" && !lines[i].empty(); ++i)
-      found.batch += (found.batch.empty() ? "" : "\n") + lines[i];
-    if (i < lines.size() && lines[i] == "----")
-      for (++i; i < lines.size() && !lines[i].empty(); ++i) found.rows.push_back(lines[i]);
-    std::string lower = found.batch;
-    std::ranges::transform(lower, lower.begin(), [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
-    found.ordered = lower.find("order by") != std::string::npos;
-    cases.push_back(std::move(found));
+    if (lines[i].empty() || lines[i][0] == '#') continue;
+    const auto line = static_cast<int>(i + 1);
+    const bool isLong = lines[i].starts_with("statement ") || lines[i] == "query";
+    cases.push_back(isLong ? longCase(lines, i) : shortCase(lines[i]));
+    cases.back().file = path.filename().string();
+    cases.back().line = line;
   }
   return cases;
 }
@@ -88,7 +114,7 @@ void runCase(ProviderSession& session, const Case& expected) {
     if (expected.kind != "query") return;
     auto rows = rowsOf(result.rows.get());
     auto wanted = expected.rows;
-    if (!expected.ordered) {
+    if (!isOrdered(expected.batch)) {
       std::ranges::sort(rows);
       std::ranges::sort(wanted);
     }

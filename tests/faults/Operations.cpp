@@ -2,10 +2,6 @@
 
 #include "QVSa/QVSa.h"
 #include "platform/SecretMessage.h"
-#include "tests/faults/LogAndClassOperations.h"
-#include "tests/faults/MaintenanceOperations.h"
-#include "tests/faults/OrganisationOperations.h"
-#include "tests/faults/SettingsOperations.h"
 #include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
 
@@ -23,142 +19,122 @@ void changeAnn(User& user) {
   user.grpName("one");
 }
 
+void newCleo(User& user) {
+  user.Name("Cleo");
+  user.Login("cleo");
+  user.Pwd("right");
+  user.setJobs("3,4");
+  user.grpName("one");
+}
+
+bool signOn(User& user) {
+  String id;
+  return user.loginAuth("ann", "right", &id, false, "", "pc1") && !id.empty();
+}
+
+// Where the policy can't be read, the lock is not seen.
+bool isRefused(User& user) {
+  user.loginAuth("ann", "wrong");
+  return user.errNumber() == messageNumber(1118) || user.errNumber() == messageNumber(1106);
+}
+
 std::vector<Operation> userOperations() {
-  const std::vector<Report> signOn{{"select preFix", LoadResString(1503)},
-                                   {"select maxId", LoadResString(1503)},
-                                   {"insert into idRec", LoadResString(1503)},
-                                   {"insert into seslog", LoadResString(1602)}};
+  const Conduct signingOn{{{"select preFix", LoadResString(1503)},
+                           {"select maxId", LoadResString(1503)},
+                           {"insert into idRec", LoadResString(1503)},
+                           {"insert into seslog", LoadResString(1602)}}};
+  const auto save = [](User& user) { return user.Save(); };
+  const auto waitShortly = [](SignOn& entrance) { entrance.refusalTime(1); };
   return {
-      operation<User>("User.GetOne", nothing<User>, [](User& user, const String&) { return user.GetOne(3, "ann"); }),
-      operation<User>(
-          "User.Save of a new user",
-          [](User& user) {
-            user.Name("Cleo");
-            user.Login("cleo");
-            user.Pwd("right");
-            user.setJobs("3,4");
-            user.grpName("one");
-          },
-          [](User& user, const String&) { return user.Save(); }, {}, true),
-      operation<User>(
-          "User.Save", changeAnn, [](User& user, const String&) { return user.Save(); }, {}, true),
-      operation<User>(
-          "User.Delete", loadAnn, [](User& user, const String&) { return user.Delete(); }, told(1109, " "), true),
-      operation<User>(
-          "User.loginAuth", nothing<User>,
-          [](User& user, const String&) {
-            String id;
-            return user.loginAuth("ann", "right", &id, false, "", "pc1") && !id.empty();
-          },
-          signOn),
-      operation<SignOn>(
-          "SignOn.signOn", [](SignOn& entrance) { entrance.refusalTime(1); },
-          [](SignOn& entrance, const String&) { return entrance.signOn("ann", "right"); }, signOn),
-      operation<User>("User.loginAuth with a wrong password", nothing<User>,
-                      [](User& user, const String&) {
-                        user.loginAuth("ann", "wrong");
-                        // Where the policy can't be read, the lock is not seen.
-                        return user.errNumber() == messageNumber(1118) || user.errNumber() == messageNumber(1106);
-                      }),
-      operation<User>("User.loginAuth_1", nothing<User>,
-                      [](User& user, const String&) { return user.loginAuth_1("ann", platform::md5Hex("right")); }),
-      operation<User>("User.chgPwd", loadAnn, [](User& user, const String&) { return user.chgPwd("right", "other"); }),
+      on<User>("User.GetOne", [](auto& user) { return user.GetOne(3, "ann"); }),
+      on<User>("User.Save of a new user", atomic(), newCleo, save),
+      on<User>("User.Save", atomic(), changeAnn, save),
+      on<User>("User.Delete", atomic(told(1109, " ")), loadAnn, [](auto& user) { return user.Delete(); }),
+      on<User>("User.loginAuth", signingOn, signOn),
+      on<SignOn>("SignOn.signOn", signingOn, waitShortly, [](auto& one) { return one.signOn("ann", "right"); }),
+      on<User>("User.loginAuth with a wrong password", isRefused),
+      on<User>("User.loginAuth_1", [](auto& user) { return user.loginAuth_1("ann", platform::md5Hex("right")); }),
+      on<User>("User.chgPwd", {}, loadAnn, [](auto& user) { return user.chgPwd("right", "other"); }),
   };
+}
+
+bool act(Sessions& sessions, const String& server) {
+  Long uid = 0;
+  return sessions.newAction("s1", server, uid, "", 0);
 }
 
 std::vector<Operation> policyAndSessionOperations() {
+  const auto lengthen = [](safeRule& rule) { rule.minLen(9); };
   return {
-      operation<safeRule>("safeRule.GetOne", nothing<safeRule>,
-                          [](safeRule& rule, const String&) { return rule.GetOne(); }),
-      operation<safeRule>(
-          "safeRule.Save", [](safeRule& rule) { rule.minLen(9); },
-          [](safeRule& rule, const String&) { return rule.Save(); }, {}, true),
-      operation<safeRule>("safeRule.checkPwd", nothing<safeRule>,
-                          [](safeRule& rule, const String&) { return rule.checkPwd("right"); }),
-      operation<Sessions>(
-          "Sessions.connect", nothing<Sessions>,
-          [](Sessions& sessions, const String& server) { return sessions.connect(server, "QVApp"); }, told(1601)),
-      operation<Sessions>(
-          "Sessions.GetAll", nothing<Sessions>,
-          [](Sessions& sessions, const String&) { return sessions.GetAll().toBoolean(); }, told(1601)),
-      operation<Sessions>(
-          "Sessions.Terminate", nothing<Sessions>,
-          [](Sessions& sessions, const String&) { return sessions.Terminate("s1"); }, told(1603)),
-      operation<Sessions>("Sessions.newAction", nothing<Sessions>,
-                          [](Sessions& sessions, const String& server) {
-                            Long uid = 0;
-                            return sessions.newAction("s1", server, uid, "", 0);
-                          }),
+      on<safeRule>("safeRule.GetOne", [](auto& rule) { return rule.GetOne(); }),
+      on<safeRule>("safeRule.Save", atomic(), lengthen, [](auto& rule) { return rule.Save(); }),
+      on<safeRule>("safeRule.checkPwd", [](auto& rule) { return rule.checkPwd("right"); }),
+      on<Sessions>("Sessions.connect", told(1601),
+                   [](auto& sessions, const String& server) { return sessions.connect(server, "QVApp"); }),
+      on<Sessions>("Sessions.GetAll", told(1601), [](auto& sessions) { return sessions.GetAll().toBoolean(); }),
+      on<Sessions>("Sessions.Terminate", told(1603), [](auto& sessions) { return sessions.Terminate("s1"); }),
+      on<Sessions>("Sessions.newAction", act),
   };
+}
+
+void newDepartment(Department& department) {
+  department.Id("N");
+  department.Name("New");
+  department.Super("E");
+}
+
+void moveS(Department& department) {
+  require(department.GetOne(1, "S"));
+  department.Name("Selling");
+  department.Super("O");
 }
 
 std::vector<Operation> departmentOperations() {
+  const auto save = [](Department& department) { return department.Save(); };
   return {
-      operation<Department>("Department.GetOne", nothing<Department>,
-                            [](Department& department, const String&) { return department.GetOne(1, "E"); }),
-      operation<Department>(
-          "Department.Save of a new department",
-          [](Department& department) {
-            department.Id("N");
-            department.Name("New");
-            department.Super("E");
-          },
-          [](Department& department, const String&) { return department.Save(); }),
-      operation<Department>(
-          "Department.Save",
-          [](Department& department) {
-            require(department.GetOne(1, "S"));
-            department.Name("Selling");
-            department.Super("O");
-          },
-          [](Department& department, const String&) { return department.Save(); }, {}, true),
-      operation<Department>("Department.Delete", nothing<Department>,
-                            [](Department& department, const String&) { return department.Delete("E"); }),
+      on<Department>("Department.GetOne", [](auto& department) { return department.GetOne(1, "E"); }),
+      on<Department>("Department.Save of a new department", {}, newDepartment, save),
+      on<Department>("Department.Save", atomic(), moveS, save),
+      on<Department>("Department.Delete", [](auto& department) { return department.Delete("E"); }),
   };
 }
 
-Operation issuing(const char* name, std::function<bool(IdMgr&)> run, bool atomic = true) {
-  return operation<IdMgr>(
-      name, [](IdMgr& rule) { require(rule.GetOne("inv")); }, [run](IdMgr& rule, const String&) { return run(rule); },
-      told(1503), atomic);
+void loadInv(IdMgr& rule) { require(rule.GetOne("inv")); }
+
+void widenInv(IdMgr& rule) {
+  loadInv(rule);
+  rule.numPlace(5);
 }
 
+void narrowUnused(IdMgr& rule) {
+  require(rule.GetOne("unused"));
+  rule.numPlace(1);
+}
+
+bool issueReleased(IdMgr& rule) { return rule.newId("inv", "", -1, "r", "s") == "I001"; }
+
 std::vector<Operation> numberingOperations() {
-  const auto save = [](IdMgr& rule, const String&) { return rule.Save(); };
+  const auto save = [](IdMgr& rule) { return rule.Save(); };
+  const Conduct issuing = atomic(told(1503)), saving = atomic(told(1505));
+  const Conduct renaming = atomic({{{"select * from idRule", ""}, {"", LoadResString(1505)}}});
   return {
-      operation<IdMgr>("IdMgr.GetOne", nothing<IdMgr>, [](IdMgr& rule, const String&) { return rule.GetOne("inv"); }),
-      operation<IdMgr>(
-          "IdMgr.Save of a new rule", [](IdMgr& rule) { rule.idName("new"); }, save, told(1505), true),
-      operation<IdMgr>(
-          "IdMgr.Save that widens",
-          [](IdMgr& rule) {
-            require(rule.GetOne("inv"));
-            rule.numPlace(5);
-          },
-          save, told(1505), true),
-      operation<IdMgr>(
-          "IdMgr.Save that narrows",
-          [](IdMgr& rule) {
-            require(rule.GetOne("unused"));
-            rule.numPlace(1);
-          },
-          save, told(1505), true),
-      operation<IdMgr>(
-          "IdMgr.Delete", nothing<IdMgr>, [](IdMgr& rule, const String&) { return rule.Delete("inv"); }, told(1504)),
-      operation<IdMgr>(
-          "IdMgr.Rename", nothing<IdMgr>, [](IdMgr& rule, const String&) { return rule.Rename("inv", "invoice"); },
-          {{"select * from idRule", ""}, {"", LoadResString(1505)}}, true),
-      issuing("IdMgr.newId", [](IdMgr& rule) { return !rule.newId("inv").empty(); }),
-      issuing("IdMgr.newId of a first number", [](IdMgr& rule) { return !rule.newId("unused").empty(); }),
-      issuing("IdMgr.newId for a record", [](IdMgr& rule) { return !rule.newId("unused", "", -1, "r", "s").empty(); }),
-      issuing(
-          "IdMgr.newId of a released number", [](IdMgr& rule) { return rule.newId("inv", "", -1, "r", "s") == "I001"; },
-          false),
-      issuing("IdMgr.setStartNo", [](IdMgr& rule) { return rule.setStartNo(50); }),
-      operation<IdMgr>("IdMgr.InvalidNumbers", nothing<IdMgr>,
-                       [](IdMgr& rule, const String&) { return rule.InvalidNumbers("inv") != "fail"; },
-                       {{"", "", true}}),
-      operation<IdMgrs>("IdMgrs.GetAll", nothing<IdMgrs>, [](IdMgrs& rules, const String&) { return rules.GetAll(); }),
+      on<IdMgr>("IdMgr.GetOne", [](auto& rule) { return rule.GetOne("inv"); }),
+      on<IdMgr>(
+          "IdMgr.Save of a new rule", saving, [](auto& rule) { rule.idName("new"); }, save),
+      on<IdMgr>("IdMgr.Save that widens", saving, widenInv, save),
+      on<IdMgr>("IdMgr.Save that narrows", saving, narrowUnused, save),
+      on<IdMgr>("IdMgr.Delete", told(1504), [](auto& rule) { return rule.Delete("inv"); }),
+      on<IdMgr>("IdMgr.Rename", renaming, [](auto& rule) { return rule.Rename("inv", "invoice"); }),
+      on<IdMgr>("IdMgr.newId", issuing, loadInv, [](auto& rule) { return !rule.newId("inv").empty(); }),
+      on<IdMgr>("IdMgr.newId of a first number", issuing, loadInv,
+                [](auto& rule) { return !rule.newId("unused").empty(); }),
+      on<IdMgr>("IdMgr.newId for a record", issuing, loadInv,
+                [](auto& rule) { return !rule.newId("unused", "", -1, "r", "s").empty(); }),
+      on<IdMgr>("IdMgr.newId of a released number", told(1503), loadInv, issueReleased),
+      on<IdMgr>("IdMgr.setStartNo", issuing, loadInv, [](auto& rule) { return rule.setStartNo(50); }),
+      on<IdMgr>("IdMgr.InvalidNumbers", {{{"", "", true}}},
+                [](auto& rule) { return rule.InvalidNumbers("inv") != "fail"; }),
+      on<IdMgrs>("IdMgrs.GetAll", [](auto& rules) { return rules.GetAll(); }),
   };
 }
 
@@ -223,9 +199,9 @@ void fillGround(const String& server) {
 const std::vector<Operation>& operations() {
   static const std::vector<Operation> all = [] {
     std::vector<Operation> result;
-    for (auto part : {userOperations(), policyAndSessionOperations(), departmentOperations(), numberingOperations(),
-                      logAndClassOperations(), settingsOperations(), organisationOperations(), maintenanceOperations()})
-      result.insert(result.end(), part.begin(), part.end());
+    for (const auto part : {userOperations, policyAndSessionOperations, departmentOperations, numberingOperations,
+                            logAndClassOperations, settingsOperations, organisationOperations, maintenanceOperations})
+      append(result, part());
     return result;
   }();
   return all;

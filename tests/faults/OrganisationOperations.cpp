@@ -1,5 +1,3 @@
-#include "tests/faults/OrganisationOperations.h"
-
 #include "QVSa/QVSa.h"
 #include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
@@ -13,159 +11,116 @@ constexpr Long roleClerk = 7;
 constexpr Long jobInE = 6;
 
 void loadClerk(Role& role) { require(role.GetOne(1, roleClerk)); }
+void renameClerk(Role& role) {
+  loadClerk(role);
+  role.Name("Scribe");
+}
 void loadBoth(userGroup& group) { require(group.GetOne(2, "both")); }
+void renameBoth(userGroup& group) {
+  loadBoth(group);
+  group.Name("all");
+}
 void loadE(Department& department) { require(department.GetOne(1, "E")); }
 void loadAnn(User& user) { require(user.GetOne(3, "ann")); }
 
-template <class List>
-Operation listing(const char* name, std::function<bool(List&)> run, std::vector<Report> reports) {
-  return operation<List>(
-      name, nothing<List>, [run](List& list, const String&) { return run(list); }, std::move(reports));
-}
-
 std::vector<Operation> departmentLists() {
-  const std::vector<Report> listing1117 = told(1117, " ");
+  const Conduct listing = told(1117, " ");
   return {
-      listing<Departments>("Departments.GetAll", [](Departments& list) { return list.GetAll(); }, {}),
-      listing<Departments>("Departments.GetAll of a subtree", [](Departments& list) { return list.GetAll(-1, "3"); },
-                           {}),
-      listing<Departments>("Departments.GetAllWithLevel", [](Departments& list) { return list.GetAllWithLevel(); }, {}),
-      listing<Departments>(
-          "Departments.getAllSuper", [](Departments& list) { return list.getAllSuper("6"); }, listing1117),
-      listing<Departments>(
-          "Departments.getAllSuperWithLevel",
-          [](Departments& list) { return list.getAllSuperWithLevel("6,7", 1, "_root", 1); }, listing1117),
-      operation<Department>("Department.GetAllSub", loadE,
-                            [](Department& department, const String&) { return department.GetAllSub() != nullptr; }),
-      operation<Department>("Department.GetSub", loadE,
-                            [](Department& department, const String&) { return department.GetSub() != nullptr; }),
-      operation<Department>(
-          "Department.GetUsers", loadE,
-          [](Department& department, const String&) { return department.GetUsers() != nullptr; }, listing1117),
+      on<Departments>("Departments.GetAll", [](auto& list) { return list.GetAll(); }),
+      on<Departments>("Departments.GetAll of a subtree", [](auto& list) { return list.GetAll(-1, "3"); }),
+      on<Departments>("Departments.GetAllWithLevel", [](auto& list) { return list.GetAllWithLevel(); }),
+      on<Departments>("Departments.getAllSuper", listing, [](auto& list) { return list.getAllSuper("6"); }),
+      on<Departments>("Departments.getAllSuperWithLevel", listing,
+                      [](auto& list) { return list.getAllSuperWithLevel("6,7", 1, "_root", 1); }),
+      on<Department>("Department.GetAllSub", {}, loadE, [](auto& e) { return e.GetAllSub() != nullptr; }),
+      on<Department>("Department.GetSub", {}, loadE, [](auto& e) { return e.GetSub() != nullptr; }),
+      on<Department>("Department.GetUsers", listing, loadE, [](auto& e) { return e.GetUsers() != nullptr; }),
   };
 }
 
+bool tellHolders(Role& role) {
+  String xml;
+  return role.GetUsers2(xml) && !xml.empty();
+}
+
 std::vector<Operation> roleOperations() {
-  std::vector<Report> setting = told(1208);
-  setting[0].number = messageNumber(1208);
-  const auto save = [](Role& role, const String&) { return role.Save(); };
+  Conduct setting = atomic(told(1208));
+  setting.reports[0].number = messageNumber(1208);
+  const auto save = [](Role& role) { return role.Save(); };
+  const Conduct listing = told(1117, " ");
   return {
-      operation<Role>("Role.GetOne", nothing<Role>, [](Role& role, const String&) { return role.GetOne(2, "Clerk"); }),
-      operation<Role>(
-          "Role.Save of a new role", [](Role& role) { role.Name("New"); }, save, {}, true),
-      operation<Role>(
-          "Role.Save",
-          [](Role& role) {
-            loadClerk(role);
-            role.Name("Scribe");
-          },
-          save, told(1204, " "), true),
-      operation<Role>(
-          "Role.Delete", loadClerk, [](Role& role, const String&) { return role.Delete(); }, told(1205, " "), true),
-      operation<Role>(
-          "Role.GetUsers", loadClerk, [](Role& role, const String&) { return role.GetUsers() != nullptr; },
-          told(1117, " ")),
-      operation<Role>(
-          "Role.GetUsersOfRole", loadClerk,
-          [](Role& role, const String&) { return role.GetUsersOfRole("3", "Clerk") != nullptr; }, told(1117, " ")),
-      operation<Role>(
-          "Role.setJobs", loadClerk, [](Role& role, const String&) { return role.setJobs("3", "4"); }, setting, true),
-      operation<Role>("Role.getAcl", loadClerk, [](Role& role, const String&) { return !role.getAcl().empty(); }),
-      operation<Role>("Role.GetJobIdOfTheDept", loadClerk,
-                      [](Role& role, const String&) { return role.GetJobIdOfTheDept("4") == jobInE; }),
-      operation<Role>("Role.GetUsers2", loadClerk,
-                      [](Role& role, const String&) {
-                        String xml;
-                        return role.GetUsers2(xml) && !xml.empty();
-                      }),
-      operation<Role>("Role.UpdateUsers", loadClerk,
-                      [](Role& role, const String&) { return role.UpdateUsers("3,6|3,7", "2,6"); }),
-      listing<Roles>(
-          "Roles.GetAll", [](Roles& roles) { return roles.GetAll(); }, told(1207, " ")),
+      on<Role>("Role.GetOne", [](auto& role) { return role.GetOne(2, "Clerk"); }),
+      on<Role>(
+          "Role.Save of a new role", atomic(), [](auto& role) { role.Name("New"); }, save),
+      on<Role>("Role.Save", atomic(told(1204, " ")), renameClerk, save),
+      on<Role>("Role.Delete", atomic(told(1205, " ")), loadClerk, [](auto& role) { return role.Delete(); }),
+      on<Role>("Role.GetUsers", listing, loadClerk, [](auto& role) { return role.GetUsers() != nullptr; }),
+      on<Role>("Role.GetUsersOfRole", listing, loadClerk,
+               [](auto& role) { return role.GetUsersOfRole("3", "Clerk") != nullptr; }),
+      on<Role>("Role.setJobs", setting, loadClerk, [](auto& role) { return role.setJobs("3", "4"); }),
+      on<Role>("Role.getAcl", {}, loadClerk, [](auto& role) { return !role.getAcl().empty(); }),
+      on<Role>("Role.GetJobIdOfTheDept", {}, loadClerk,
+               [](auto& role) { return role.GetJobIdOfTheDept("4") == jobInE; }),
+      on<Role>("Role.GetUsers2", {}, loadClerk, tellHolders),
+      on<Role>("Role.UpdateUsers", {}, loadClerk, [](auto& role) { return role.UpdateUsers("3,6|3,7", "2,6"); }),
+      on<Roles>("Roles.GetAll", told(1207, " "), [](auto& roles) { return roles.GetAll(); }),
   };
 }
 
 std::vector<Operation> jobAndUserLists() {
-  const std::vector<Report> ofJobs = told(3101, " "), ofUsers = told(1117, " ");
+  const Conduct ofJobs = told(3101, " "), ofUsers = told(1117, " ");
   return {
-      listing<Jobs>(
-          "Jobs.GetAll", [](Jobs& jobs) { return jobs.GetAll("E", "Clerk", 2); }, ofJobs),
-      listing<Jobs>(
-          "Jobs.GetAllOfDept", [](Jobs& jobs) { return jobs.GetAllOfDept(3); }, ofJobs),
-      listing<Jobs>(
-          "Jobs.GetAllSameRole", [](Jobs& jobs) { return jobs.GetAllSameRole(2); }, ofJobs),
-      listing<Users>(
-          "Users.GetAll", [](Users& users) { return users.GetAll(); }, ofUsers),
-      listing<Users>("Users.GetAllReg", [](Users& users) { return users.GetAllReg(); }, {}),
-      listing<Users>(
-          "Users.GetAllOfTheDept", [](Users& users) { return users.GetAllOfTheDept(3); }, ofUsers),
-      listing<Users>(
-          "Users.GetAllOfTheDeptAndRole", [](Users& users) { return users.GetAllOfTheDeptAndRole(3, "Clerk"); },
-          ofUsers),
-      listing<Users>(
-          "Users.getAllForSelUser", [](Users& users) { return users.getAllForSelUser("6", 2, 1); }, ofUsers),
-      listing<Users>(
-          "Users.GetList", [](Users& users) { return users.GetList(0) > 0; }, ofUsers),
+      on<Jobs>("Jobs.GetAll", ofJobs, [](auto& jobs) { return jobs.GetAll("E", "Clerk", 2); }),
+      on<Jobs>("Jobs.GetAllOfDept", ofJobs, [](auto& jobs) { return jobs.GetAllOfDept(3); }),
+      on<Jobs>("Jobs.GetAllSameRole", ofJobs, [](auto& jobs) { return jobs.GetAllSameRole(2); }),
+      on<Users>("Users.GetAll", ofUsers, [](auto& users) { return users.GetAll(); }),
+      on<Users>("Users.GetAllReg", [](auto& users) { return users.GetAllReg(); }),
+      on<Users>("Users.GetAllOfTheDept", ofUsers, [](auto& users) { return users.GetAllOfTheDept(3); }),
+      on<Users>("Users.GetAllOfTheDeptAndRole", ofUsers,
+                [](auto& users) { return users.GetAllOfTheDeptAndRole(3, "Clerk"); }),
+      on<Users>("Users.getAllForSelUser", ofUsers, [](auto& users) { return users.getAllForSelUser("6", 2, 1); }),
+      on<Users>("Users.GetList", ofUsers, [](auto& users) { return users.GetList(0) > 0; }),
   };
 }
 
+bool tellRoles(userGroup& group) {
+  String roles;
+  return group.GetRoles(roles) && !roles.empty();
+}
+
+bool tellManager(User& user) {
+  Integer flag = 0;
+  Long job = 0, person = 0;
+  return user.getManager(flag, job, person) && person == 3;
+}
+
 std::vector<Operation> groupAndSupervisorOperations() {
-  const auto save = [](userGroup& group, const String&) { return group.Save(); };
+  const auto save = [](userGroup& group) { return group.Save(); };
+  const Conduct renaming = atomic({{{"update ItemGroups", LoadResString(1803) + " "}}});
   return {
-      operation<userGroup>("userGroup.GetOne", nothing<userGroup>,
-                           [](userGroup& group, const String&) { return group.GetOne(2, "both"); }),
-      operation<userGroup>("userGroup.GetUsers", loadBoth,
-                           [](userGroup& group, const String&) { return !group.GetUsers().empty(); }),
-      operation<userGroup>(
-          "userGroup.SetUsers", loadBoth, [](userGroup& group, const String&) { return group.SetUsers("3"); },
-          told(1808, " "), true),
-      operation<userGroup>(
-          "userGroup.GetRoles", loadBoth,
-          [](userGroup& group, const String&) {
-            String roles;
-            return group.GetRoles(roles) && !roles.empty();
-          },
-          told(1807, " ")),
-      operation<userGroup>(
-          "userGroup.SetRoles", loadBoth,
-          [](userGroup& group, const String&) { return group.SetRoles("Report Owners"); }, told(1806, " "), true),
-      operation<userGroup>(
-          "userGroup.Save of a new group", [](userGroup& group) { group.Name("new"); }, save, {}, true),
-      operation<userGroup>(
-          "userGroup.Save",
-          [](userGroup& group) {
-            loadBoth(group);
-            group.Name("all");
-          },
-          save, {{"update ItemGroups", LoadResString(1803) + " "}}, true),
-      operation<userGroup>(
-          "userGroup.Delete", loadBoth, [](userGroup& group, const String&) { return group.Delete(); }, told(1804, " "),
-          true),
-      listing<userGroups>(
-          "userGroups.GetAll", [](userGroups& groups) { return groups.GetAll(); }, told(1809, " ")),
-      operation<User>(
-          "User.setManager", loadAnn, [](User& user, const String&) { return user.setManager(1, jobInE); }, told(1114),
-          true),
-      operation<User>(
-          "User.getManager", loadAnn,
-          [](User& user, const String&) {
-            Integer flag = 0;
-            Long job = 0, person = 0;
-            return user.getManager(flag, job, person) && person == 3;
-          },
-          told(1115)),
-      operation<User>(
-          "User.getSubUsers", loadAnn, [](User& user, const String&) { return user.getSubUsers() != nullptr; },
-          told(1116)),
+      on<userGroup>("userGroup.GetOne", [](auto& group) { return group.GetOne(2, "both"); }),
+      on<userGroup>("userGroup.GetUsers", {}, loadBoth, [](auto& group) { return !group.GetUsers().empty(); }),
+      on<userGroup>("userGroup.SetUsers", atomic(told(1808, " ")), loadBoth,
+                    [](auto& group) { return group.SetUsers("3"); }),
+      on<userGroup>("userGroup.GetRoles", told(1807, " "), loadBoth, tellRoles),
+      on<userGroup>("userGroup.SetRoles", atomic(told(1806, " ")), loadBoth,
+                    [](auto& group) { return group.SetRoles("Report Owners"); }),
+      on<userGroup>(
+          "userGroup.Save of a new group", atomic(), [](auto& group) { group.Name("new"); }, save),
+      on<userGroup>("userGroup.Save", renaming, renameBoth, save),
+      on<userGroup>("userGroup.Delete", atomic(told(1804, " ")), loadBoth, [](auto& group) { return group.Delete(); }),
+      on<userGroups>("userGroups.GetAll", told(1809, " "), [](auto& groups) { return groups.GetAll(); }),
+      on<User>("User.setManager", atomic(told(1114)), loadAnn, [](auto& user) { return user.setManager(1, jobInE); }),
+      on<User>("User.getManager", told(1115), loadAnn, tellManager),
+      on<User>("User.getSubUsers", told(1116), loadAnn, [](auto& user) { return user.getSubUsers() != nullptr; }),
   };
 }
 
 }  // namespace
 
 std::vector<Operation> organisationOperations() {
-  std::vector<Operation> result;
-  for (auto part : {departmentLists(), roleOperations(), jobAndUserLists(), groupAndSupervisorOperations()})
-    result.insert(result.end(), part.begin(), part.end());
+  std::vector<Operation> result = departmentLists();
+  for (const auto part : {roleOperations, jobAndUserLists, groupAndSupervisorOperations}) append(result, part());
   return result;
 }
 

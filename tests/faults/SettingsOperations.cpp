@@ -1,5 +1,3 @@
-#include "tests/faults/SettingsOperations.h"
-
 #include "QVSa/QVSa.h"
 #include "platform/Services.h"
 #include "tests/faults/Shapes.h"
@@ -12,12 +10,11 @@ namespace {
 // A directory that knows everybody, and a program in a folder without a place for pictures, while an operation runs.
 template <class Body>
 bool withDirectory(Body body) {
-  const platform::Services before = platform::services();
-  platform::Services services = before;
+  platform::Services services = platform::services();
   services.getUsersFromLD = [](const platform::DirectoryQuery&, const String&, Integer&) { return String("found"); };
   services.programFolder = [] { return String("/dev/null"); };
   services.openSettings = [](const String&) { return nullptr; };
-  platform::replaceServices(services);
+  const platform::Services before = platform::replaceServices(services);
   const bool result = body();
   platform::replaceServices(before);
   return result;
@@ -35,37 +32,27 @@ void apply(User& user) {
   user.Email("cleo@example.org");
 }
 
-std::vector<Operation> homeOperations() {
-  return {
-      operation<Home>("Home.connect", nothing<Home>,
-                      [](Home& home, const String& server) { return home.connect(server, "QVApp"); }),
-      operation<Home>("Home.getImage", nothing<Home>,
-                      [](Home& home, const String& server) {
-                        return withDirectory([&] { return home.getImage(server, "QVApp"); });
-                      }),
-      operation<Home>(
-          "Home.Save", changeHome, [](Home& home, const String&) { return home.Save(); }, {}, true),
-      operation<Home>(
-          "Home.Save without pictures", nothing<Home>, [](Home& home, const String&) { return home.Save(); }, {}, true),
-      operation<Home>("Home.roleGrpNum", nothing<Home>,
-                      [](Home& home, const String&) { return home.roleGrpNum() > 0; }),
-      operation<Home>("Home.outerUserNum", nothing<Home>,
-                      [](Home& home, const String&) { return home.outerUserNum() == 1; }),
-  };
-}
+void loadDora(User& user) { require(user.GetOne(3, "dora")); }
 
 }  // namespace
 
 std::vector<Operation> settingsOperations() {
-  std::vector<Operation> result = homeOperations();
-  result.push_back(operation<User>("User.Reg", apply, [](User& user, const String&) { return user.Reg("Sales"); }));
-  result.push_back(operation<User>(
-      "User.regAudit", [](User& user) { require(user.GetOne(3, "dora")); },
-      [](User& user, const String&) { return user.regAudit(true, "welcome"); }, {}, true));
-  result.push_back(operation<User>("User.GetOne of a directory user", nothing<User>, [](User& user, const String&) {
-    return withDirectory([&] { return user.GetOne(3, "lena", true, "right"); });
-  }));
-  return result;
+  const auto save = [](Home& home) { return home.Save(); };
+  return {
+      on<Home>("Home.connect", [](auto& home, const String& server) { return home.connect(server, "QVApp"); }),
+      on<Home>("Home.getImage",
+               [](auto& home, const String& server) {
+                 return withDirectory([&] { return home.getImage(server, "QVApp"); });
+               }),
+      on<Home>("Home.Save", atomic(), changeHome, save),
+      on<Home>("Home.Save without pictures", atomic(), save),
+      on<Home>("Home.roleGrpNum", [](auto& home) { return home.roleGrpNum() > 0; }),
+      on<Home>("Home.outerUserNum", [](auto& home) { return home.outerUserNum() == 1; }),
+      on<User>("User.Reg", {}, apply, [](auto& user) { return user.Reg("Sales"); }),
+      on<User>("User.regAudit", atomic(), loadDora, [](auto& user) { return user.regAudit(true, "welcome"); }),
+      on<User>("User.GetOne of a directory user",
+               [](auto& user) { return withDirectory([&] { return user.GetOne(3, "lena", true, "right"); }); }),
+  };
 }
 
 void fillSettings(const String& server) {

@@ -2,14 +2,31 @@
 
 #include <memory>
 #include <stdexcept>
+#include <utility>
 
 #include "QVSa/resources/Messages.h"
 #include "tests/faults/Operations.h"
 
 namespace QVSa::test {
 
+// The operations come in parts, each with what it works on; the parts are filled in this order.
+std::vector<Operation> logAndClassOperations();  // with the access rule and the template password
+void fillLogAndClasses(const String& server);
+std::vector<Operation> settingsOperations();  // with self-registration and the accounts that others vouch for
+void fillSettings(const String& server);
+std::vector<Operation> organisationOperations();  // but for the department itself
+std::vector<LetPass> organisationLetPass();
+void fillOrganisation(const String& server);
+std::vector<Operation> maintenanceOperations();
+std::vector<LetPass> maintenanceLetPass();
+void fillMaintenance(const String& server);
+
 inline void require(Boolean done) {
   if (!done) throw std::logic_error("the ground of the test could not be made");
+}
+
+inline void append(std::vector<Operation>& all, std::vector<Operation> part) {
+  for (Operation& one : part) all.push_back(std::move(one));
 }
 
 template <class Class>
@@ -20,28 +37,43 @@ String descriptionOf(const Class& object) {
     return object.errDescription();
 }
 
-// An operation of a class that is connected first and prepared by `load`.
-template <class Class>
-Operation operation(const char* name, std::function<void(Class&)> load,
-                    std::function<bool(Class&, const String& server)> run, std::vector<Report> reports = {},
-                    bool atomic = false) {
+// How an operation tells its failures, and whether it is one transaction.
+struct Conduct {
+  std::vector<Report> reports;
+  bool isAtomic = false;
+};
+
+inline Conduct told(Long messageId, const String& blank = "") { return {{{"", LoadResString(messageId) + blank}}}; }
+
+inline Conduct atomic(Conduct conduct = {}) { return {std::move(conduct.reports), true}; }
+
+// An operation of a class that is connected first and prepared by `load`. `run` may take the server as well.
+template <class Class, class Run>
+Operation on(const char* name, Conduct conduct, std::function<void(Class&)> load, Run run) {
   const auto prepare = [load, run](const String& server) -> std::function<Outcome()> {
     auto object = std::make_shared<Class>();
     object->connect(server, "QVApp");
-    load(*object);
+    if (load) load(*object);
     return [object, run, server] {
-      const bool positive = run(*object, server);
+      bool positive = false;
+      if constexpr (std::is_invocable_v<Run, Class&>)
+        positive = run(*object);
+      else
+        positive = run(*object, server);
       return Outcome{positive, object->errNumber(), descriptionOf(*object)};
     };
   };
-  return {name, prepare, std::move(reports), atomic};
+  return {name, prepare, std::move(conduct.reports), conduct.isAtomic};
 }
 
-template <class Class>
-void nothing(Class&) {}
+template <class Class, class Run>
+Operation on(const char* name, Conduct conduct, Run run) {
+  return on<Class>(name, std::move(conduct), nullptr, run);
+}
 
-inline std::vector<Report> told(Long messageId, const String& blank = "") {
-  return {{"", LoadResString(messageId) + blank}};
+template <class Class, class Run>
+Operation on(const char* name, Run run) {
+  return on<Class>(name, Conduct{}, nullptr, run);
 }
 
 }  // namespace QVSa::test

@@ -60,15 +60,13 @@ TEST_F(DomainTest, ADirectoryUserBindsWithHisOwnPassword) {
   EXPECT_EQ(tables_.text("select lgts from users where userLogin='ann'"), "0") << "nothing is counted";
 }
 
-// The clock gives the package back at its end.
 TEST_F(DomainTest, ADirectoryIsAskedByTheUserOrByTheServiceAccountAndNeverByNobody) {
   std::vector<String> asked;
-  platform::Services services = platform::services();
-  services.getUsersFromLD = [&](const platform::DirectoryQuery& query, const String& password, Integer&) {
+  replace(&platform::Services::getUsersFromLD, {[&](const platform::DirectoryQuery& query, const String& password,
+                                                    Integer&) {
     asked.push_back(query.host + ":" + text(query.port) + " " + query.bindDn + " " + password + " " + query.searchText);
     return String("somebody");
-  };
-  platform::replaceServices(services);
+  }});
   addDirectoryUser("ann", "cn=ann");
   addDirectoryUser("bare", "");
   tables_.run("update homeinfo set ldHost='box',LDport=636,ldBindDN='cn=service',ldPasswd='" + scrambleText("abc") +

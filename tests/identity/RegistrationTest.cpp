@@ -87,22 +87,18 @@ TEST_F(RegistrationTest, AnOutsideApplicantKeepsHisCompanyAndGoesToTheOutside) {
 TEST_F(RegistrationTest, ARefusedApplicationLeavesNothing) {
   savePolicy([](safeRule& rule) { rule.minLen(8); });
   User ann = applicant();
-  EXPECT_FALSE(ann.Reg());
-  EXPECT_EQ(ann.errNumber(), messageNumber(3000));
+  EXPECT_EQ(refusal(ann, ann.Reg()), messageNumber(3000));
   savePolicy([](safeRule& rule) { rule.minLen(0); });
   ann.Name("");
-  EXPECT_FALSE(ann.Reg());
-  EXPECT_EQ(ann.errNumber(), messageNumber(1102));
+  EXPECT_EQ(refusal(ann, ann.Reg()), messageNumber(1102));
   User second = applicant("Admin");
-  EXPECT_FALSE(second.Reg());
-  EXPECT_EQ(second.errNumber(), number::integrity) << "the login is taken";
+  EXPECT_EQ(refusal(second, second.Reg()), number::integrity) << "the login is taken";
   test::RecordingProvider recorder;
   recorder.beforeEach([&](const String& event) {
     if (event.starts_with("select * from QVUserRegInfo")) tables_.run("delete from QVUserRegInfo");
   });
   User lost = applicant();
-  EXPECT_FALSE(lost.Reg()) << "without the row of extra data he is deleted again";
-  EXPECT_EQ(lost.errNumber(), messageNumber(1130));
+  EXPECT_EQ(refusal(lost, lost.Reg()), messageNumber(1130)) << "without the row of extra data he is deleted again";
   EXPECT_EQ(tables_.text("select count(*) from users"), "1");
   EXPECT_EQ(tables_.text("select count(*) from QVUserRegInfo"), "0");
   EXPECT_EQ(mails(), "");

@@ -61,8 +61,7 @@ TEST_F(SessionEnd, WithoutAnApplicationDatabaseTakesTheSessionAndLeavesTheNumber
   issue("r1", id_);
   Sessions sessions;
   sessions.connect(server());
-  EXPECT_FALSE(sessions.Terminate(id_));
-  EXPECT_EQ(sessions.errNumber(), number::noTable);
+  EXPECT_EQ(refusal(sessions, sessions.Terminate(id_)), number::noTable);
   EXPECT_EQ(sessions.errDescription(), "Disconnection error.Invalid object name 'QVIdDel'.");
   EXPECT_EQ(tables_.text("select count(*) from seslog"), "0");
   EXPECT_EQ(tables_.text("select rcId,sesId from idDel"), "r1|" + id_);

@@ -108,26 +108,22 @@ TEST_F(UserRecord, ARefusedSaveWritesNothing) {
   second.Name("Second");
   second.Login("second");
   second.deptId("nowhere");
-  EXPECT_FALSE(second.Save());
-  EXPECT_EQ(second.errNumber(), number::noRow) << "no department to put him in";
+  EXPECT_EQ(refusal(second, second.Save()), number::noRow) << "no department to put him in";
   second.deptId("");
   second.Login("ANN ");
-  EXPECT_FALSE(second.Save());
-  EXPECT_EQ(second.errNumber(), number::integrity) << "log-ins are unique without regard to case";
+  EXPECT_EQ(refusal(second, second.Save()), number::integrity) << "log-ins are unique without regard to case";
   // The jobs of a new user are found by his name, and Ann's own are among them.
   second.Name("Ann");
   second.Login("ann2");
   second.setJobs("1");
-  EXPECT_FALSE(second.Save());
-  EXPECT_EQ(second.errNumber(), number::integrity);
+  EXPECT_EQ(refusal(second, second.Save()), number::integrity);
   EXPECT_EQ(second.Id(), 0);
   EXPECT_EQ(tables_.text("select count(*) from users"), "2");
 
   User ann = loaded("ann");
   ann.Name("Other");
   ann.setJobs("1,");
-  EXPECT_FALSE(ann.Save());
-  EXPECT_EQ(ann.errNumber(), number::statement);
+  EXPECT_EQ(refusal(ann, ann.Save()), number::statement);
   EXPECT_EQ(loaded("ann").Name(), "Ann");
   EXPECT_EQ(jobs(2), "1");
 }

@@ -85,13 +85,11 @@ TEST_F(BackupPlans, AreStoredAndLoadedAgain) {
     EXPECT_EQ(when.cycle() * 1000 + when.cycleNum() * 100 + when.monthDay() * 10 + when.interval(), 1245);
     EXPECT_EQ(when.valUnit() + when.timesOneDay(), 2);
   }
-  EXPECT_FALSE(found.GetOne(1, ""));
-  EXPECT_EQ(found.errNumber(), messageNumber(3100));
+  EXPECT_EQ(refusal(found, found.GetOne(1, "")), messageNumber(3100));
   EXPECT_EQ(found.errDescription(), "Can not find the backup plan.");
 
   BKPlan twin = plan("Weekly");
-  EXPECT_FALSE(twin.Save());
-  EXPECT_EQ(twin.errNumber(), number::integrity);
+  EXPECT_EQ(refusal(twin, twin.Save()), number::integrity);
   EXPECT_EQ(twin.errDescription(), "The name of backup plan is dulplicate.");
 
   // No day of it can be computed, nor its unit be named.
@@ -194,11 +192,9 @@ TEST_F(BackupPlans, GoOnWhereABackupFails) {
 TEST_F(BackupPlans, WithoutAFolderWriteNothing) {
   BKPlan lost = saved("lost");
   lost.bkPath("");
-  EXPECT_FALSE(lost.exec(1));
-  EXPECT_EQ(lost.errNumber(), number::noPath);
+  EXPECT_EQ(refusal(lost, lost.exec(1)), number::noPath);
   lost.bkPath(path() + "\\missing\\deeper");
-  EXPECT_FALSE(lost.exec(1));
-  EXPECT_EQ(lost.errNumber(), number::noPath) << "one level is made, not two";
+  EXPECT_EQ(refusal(lost, lost.exec(1)), number::noPath) << "one level is made, not two";
   EXPECT_EQ(runs(), "1|1|2024-03-07 10:30:00|0|-");
   EXPECT_EQ(tables_.text("select count(*) from syslog"), "0");
 }
@@ -284,8 +280,7 @@ TEST_F(BackupPlans, AreListedByName) {
   EXPECT_EQ(plans.Item("WEEKLY")->schedule()->StartTime(), *Date::parse("10:30"));
   EXPECT_EQ(plans.Item("nobody"), nullptr);
   EXPECT_EQ(plans.Item(3), nullptr);
-  EXPECT_FALSE(plans.GetAll()) << "the list is not emptied first";
-  EXPECT_EQ(plans.errNumber(), number::keyExists);
+  EXPECT_EQ(refusal(plans, plans.GetAll()), number::keyExists) << "the list is not emptied first";
   EXPECT_EQ(plans.errDescription().rfind("Fail to get backup plans.", 0), 0U);
 
   String where = "D:\\bak";

@@ -81,15 +81,13 @@ TEST_F(Backups, AreRefusedWhereAFileIsMissing) {
   std::filesystem::remove(folder_.path() / "sys.bak");
   EXPECT_FALSE(restore());
   EXPECT_EQ(manager_.errNumber(), messageNumber(2904));
-  EXPECT_FALSE(manager_.BackUpDB(server(), file("no\\sys.bak"), file("app.bak")));
-  EXPECT_EQ(manager_.errNumber(), messageNumber(2906));
+  EXPECT_EQ(refusal(manager_, manager_.BackUpDB(server(), file("no\\sys.bak"), file("app.bak"))), messageNumber(2906));
   EXPECT_EQ(manager_.errDescription().rfind("Database backup error.Cannot open backup device", 0), 0U);
 }
 
 TEST_F(Backups, NeedTheAdministratorToRestore) {
   backUp();
-  EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), "wrong"));
-  EXPECT_EQ(manager_.errNumber(), number::login);
+  EXPECT_EQ(refusal(manager_, manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), "wrong")), number::login);
   EXPECT_EQ(manager_.errDescription(), "Login failed for user 'sa'.:18456");
   EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), defaultDbPwd(), false, "QVUser"));
   EXPECT_EQ(manager_.errDescription(), "User does not have permission to RESTORE database 'QVSys'.:3110");
@@ -116,8 +114,7 @@ TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
   QVAgent agent;
   agent.connect(server());
   EXPECT_EQ(agent.hiddenReps(), "3.5");
-  EXPECT_FALSE(manager_.decryptTmps(server(), "Lock"));
-  EXPECT_EQ(manager_.errNumber(), messageNumber(2909));
+  EXPECT_EQ(refusal(manager_, manager_.decryptTmps(server(), "Lock")), messageNumber(2909));
   EXPECT_EQ(manager_.errDescription(), "Incorrect password.");
   EXPECT_EQ(spec(), locked);
   EXPECT_TRUE(manager_.decryptTmps(server(), "lock"));
@@ -218,8 +215,7 @@ TEST_F(Backups, ComeBackWhereADatabaseCannotBeRead) {
     damage();
     User user;
     user.connect(server());
-    EXPECT_FALSE(user.GetOne(3, "ann"));
-    EXPECT_EQ(user.errNumber(), number::login);
+    EXPECT_EQ(refusal(user, user.GetOne(3, "ann")), number::login);
     EXPECT_NE(user.errDescription().find(sysFile.string()), String::npos) << user.errDescription();
     EXPECT_FALSE(manager_.BackUpDB(server(), file("other.bak"), file("other2.bak")));
     EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), "wrong"));

@@ -122,8 +122,7 @@ TEST_F(Numbers, ARuleIsNarrowedOnlyBeforeItsFirstNumber) {
   narrow = rule("inv");
   narrow.numPlace(2);
   narrow.preFix("X");
-  EXPECT_FALSE(narrow.Save());
-  EXPECT_EQ(narrow.errNumber(), messageNumber(1508));
+  EXPECT_EQ(refusal(narrow, narrow.Save()), messageNumber(1508));
   EXPECT_EQ(narrow.errDescription(),
             "Error in saving sequential number.This number has been used, sequential number can be altered bigger, can "
             "not less.");
@@ -191,8 +190,7 @@ TEST_F(Numbers, StartWhereTheyAreTold) {
   EXPECT_EQ(issue("inv"), "N2403006");
   EXPECT_TRUE(told.setStartNo(-3)) << "an ordinary issue";
   EXPECT_EQ(issue("inv"), "N2403008");
-  EXPECT_FALSE(told.setStartNo(1001));
-  EXPECT_EQ(told.errNumber(), messageNumber(1507));
+  EXPECT_EQ(refusal(told, told.setStartNo(1001)), messageNumber(1507));
 }
 
 TEST_F(Numbers, ANewStartForgetsWhatWasIssuedOnThePeriodsFirstDay) {
@@ -216,14 +214,12 @@ TEST_F(Numbers, OfARenamedRuleBeginAnewAndATakenNameIsRefused) {
   addRule("taken", noDate, 3);
   issue("old");
   auto subject = connected<IdMgr>();
-  EXPECT_FALSE(subject.Rename("old", "Taken"));
-  EXPECT_EQ(subject.errNumber(), number::integrity);
+  EXPECT_EQ(refusal(subject, subject.Rename("old", "Taken")), number::integrity);
   EXPECT_EQ(subject.errDescription(), "Sequential number is duplicate.");
   EXPECT_TRUE(subject.Rename("old", "new"));
   EXPECT_EQ(issue("new"), "N001");
   EXPECT_EQ(issue("old"), "");
-  EXPECT_FALSE(subject.Rename("old", "newer"));
-  EXPECT_EQ(subject.errNumber(), messageNumber(1502));
+  EXPECT_EQ(refusal(subject, subject.Rename("old", "newer")), messageNumber(1502));
 
   auto rules = connected<IdMgrs>();
   EXPECT_TRUE(rules.GetAll());

@@ -56,22 +56,20 @@ TEST_F(DepartmentsTest, ASubtreeIsFoundByTheInnerIdsInItsPaths) {
 
   ASSERT_TRUE(departments_.GetAll(0, idOf("W") + "," + idOf("S") + "," + idOf("H")));
   EXPECT_EQ(numbers(departments_), (Lines{"S", "E", "H", "W"})) << "each once, however many of the ids lead to it";
-  EXPECT_FALSE(departments_.GetAll(-1, "E"));
-  EXPECT_EQ(departments_.errNumber(), number::statement) << "the ids stand in the statement as they are";
+  EXPECT_EQ(refusal(departments_, departments_.GetAll(-1, "E")), number::statement)
+      << "the ids stand in the statement as they are";
   ASSERT_TRUE(departments_.GetAll(1, idOf("S")));
   EXPECT_EQ(departments_.Count(), 0);
 }
 
 TEST_F(DepartmentsTest, ANumberThatStandsTwiceEndsTheTree) {
   tables_.run("update departments set deptNo='S' where deptNo='H'");
-  EXPECT_FALSE(departments_.GetAll());
-  EXPECT_EQ(departments_.errNumber(), number::keyExists);
+  EXPECT_EQ(refusal(departments_, departments_.GetAll()), number::keyExists);
   EXPECT_EQ(numbers(departments_), (Lines{"_root", "S", "E"}));
 }
 
 TEST_F(DepartmentsTest, TheRootsFailForTheColumnThatTheirStatementLacks) {
-  EXPECT_FALSE(departments_.GetRoot());
-  EXPECT_EQ(departments_.errNumber(), number::noField);
+  EXPECT_EQ(refusal(departments_, departments_.GetRoot()), number::noField);
   EXPECT_EQ(departments_.Count(), 0);
   tables_.run("delete from departments where superDept=0");
   EXPECT_TRUE(departments_.GetRoot());
@@ -153,8 +151,7 @@ TEST_F(WaysUpTest, ANameThatComesAgainEndsTheListByPathAlone) {
   auto works = department("W");
   works.Name("East");
   ASSERT_TRUE(works.Save());
-  EXPECT_FALSE(departments_.getAllSuper(both()));
-  EXPECT_EQ(departments_.errNumber(), number::keyExists);
+  EXPECT_EQ(refusal(departments_, departments_.getAllSuper(both())), number::keyExists);
   EXPECT_EQ(departments_.errDescription().substr(0, 23), "Error in listing users ");
   EXPECT_EQ(departments_.Count(), 4);
   EXPECT_TRUE(departments_.getAllSuperWithLevel(both()));

@@ -56,17 +56,14 @@ TEST_F(HardTextsTest, ATextOfFourThousandCharactersIsRefusedWhereItsColumnIsShor
   const String longText(4000, 'x');
   auto role = connected<Role>();
   role.Name(longText);
-  EXPECT_FALSE(role.Save());
-  EXPECT_EQ(role.errNumber(), number::range);
+  EXPECT_EQ(refusal(role, role.Save()), number::range);
   tables_.run("update departments set fullName='Sales-East-'+replicate('x',3985) where deptNo='H'");
   const test::Lines before = tree();
   Department sales = department("S");
   sales.Name("Sales and more");
-  EXPECT_FALSE(sales.Save()) << "too long a full name, two levels below";
-  EXPECT_EQ(sales.errNumber(), number::range);
+  EXPECT_EQ(refusal(sales, sales.Save()), number::range) << "too long a full name, two levels below";
   EXPECT_EQ(tree(), before);
-  EXPECT_FALSE(role.GetOne(2, longText));
-  EXPECT_EQ(role.errNumber(), messageNumber(1201));
+  EXPECT_EQ(refusal(role, role.GetOne(2, longText)), messageNumber(1201));
 }
 
 TEST_F(HardTextsTest, ATokenInACallersOwnSqlIsNone) {

@@ -69,21 +69,17 @@ TEST_F(RoleTest, AllOfARoleIsStoredAndLoaded) {
 TEST_F(RoleTest, RefusalsTellTheirReason) {
   auto role = connected<Role>();
   for (const Integer key : {Integer{2}, Integer{3}}) {
-    EXPECT_FALSE(role.GetOne(key, key == 2 ? "Boss" : "Manager"));
-    EXPECT_EQ(role.errNumber(), messageNumber(1201));
+    EXPECT_EQ(refusal(role, role.GetOne(key, key == 2 ? "Boss" : "Manager")), messageNumber(1201));
   }
   EXPECT_EQ(role.errDescription(), "Undefined role [Manager].");
-  EXPECT_FALSE(role.Save());
-  EXPECT_EQ(role.errNumber(), messageNumber(1202));
+  EXPECT_EQ(refusal(role, role.Save()), messageNumber(1202));
   role.Name("manager");
-  EXPECT_FALSE(role.Save());
-  EXPECT_EQ(role.errNumber(), messageNumber(1209));
+  EXPECT_EQ(refusal(role, role.Save()), messageNumber(1209));
   role.Id(999);
   EXPECT_TRUE(role.Save()) << "the update of a role that is not there changes nothing";
   role.Name(String(60, 'x'));
   role.Id(manager_.Id());
-  EXPECT_FALSE(role.Save());
-  EXPECT_EQ(role.errNumber(), number::range);
+  EXPECT_EQ(refusal(role, role.Save()), number::range);
   EXPECT_EQ(role.errDescription().substr(0, 38), "Fail to update the role properties. St");
   role.Id(0);
   EXPECT_FALSE(role.Save());
@@ -156,12 +152,11 @@ TEST_F(RoleTest, HoldersAreAddedAndRemovedByPairsAndTellTheirJobsAsXml) {
   EXPECT_EQ(xml, "<users>" + start + hub + "\" deptno=\"E\"/>" + start + works + "\" deptno=\"E\"/></users>");
 
   EXPECT_TRUE(manager_.UpdateUsers("", ""));
-  EXPECT_FALSE(manager_.UpdateUsers(ann + "," + works + "|" + ann + "," + hub, ann + "," + hub));
-  EXPECT_EQ(manager_.errNumber(), number::integrity);
+  EXPECT_EQ(refusal(manager_, manager_.UpdateUsers(ann + "," + works + "|" + ann + "," + hub, ann + "," + hub)),
+            number::integrity);
   EXPECT_EQ(tables_.rows("select jobId from userJob where userId=" + ann), (Lines{works}))
       << "what was removed stays so";
-  EXPECT_FALSE(manager_.UpdateUsers("7", ""));
-  EXPECT_EQ(manager_.errNumber(), number::position);
+  EXPECT_EQ(refusal(manager_, manager_.UpdateUsers("7", "")), number::position);
 }
 
 TEST_F(RoleTest, TheReachIsWhatReportsAndTasksGive) {

@@ -91,8 +91,8 @@ TEST_F(UsersTest, RegistrationsAreListedByTheirStateWithWhatTheySaidOfThemselves
   EXPECT_EQ(names(users_), (Lines{"ann"}));
   ASSERT_TRUE(users_.GetAllReg(3));
   EXPECT_EQ(users_.Count(), 0);
-  EXPECT_FALSE(users_.GetAllReg(-1, 5)) << "the clause of the department is never filled";
-  EXPECT_EQ(users_.errNumber(), number::statement);
+  EXPECT_EQ(refusal(users_, users_.GetAllReg(-1, 5)), number::statement)
+      << "the clause of the department is never filled";
 }
 
 TEST_F(UsersTest, ASubtreeListsItsUsersAndByRoleEachNameOnce) {
@@ -194,12 +194,10 @@ TEST_F(UsersTest, SupervisionGoesByJobOrByPersonAndIsReplacedNotAdded) {
 TEST_F(UsersTest, ASupervisorThatIsNotNamedIsRefusedAndNothingChanges) {
   auto ann = connected<User>(), bob = connected<User>();
   ASSERT_TRUE(ann.GetOne(3, "ann") && ann.setManager(2, 0, bob_));
-  EXPECT_FALSE(ann.setManager(1, 0, bob_));
-  EXPECT_EQ(ann.errNumber(), messageNumber(1112));
+  EXPECT_EQ(refusal(ann, ann.setManager(1, 0, bob_)), messageNumber(1112));
   EXPECT_EQ(ann.errDescription(),
             "Error in setting up supervisor.Incomplete input, please provide superior department and role.");
-  EXPECT_FALSE(ann.setManager(2, 5));
-  EXPECT_EQ(ann.errNumber(), messageNumber(1113));
+  EXPECT_EQ(refusal(ann, ann.setManager(2, 5)), messageNumber(1113));
   ASSERT_TRUE(bob.GetOne(3, "bob"));
   EXPECT_EQ(bob.getSubUsers()->Count(), 1);
 }

@@ -132,8 +132,7 @@ TEST_F(HomeTest, ANullReadsAsItsOwnDefaultAndFailsTheDaysOfAccount) {
   for (const char* column : {"AcctDay", "AcctTime"}) {
     store(String(column) + "=null,companyName='Read before'");
     Home failed;
-    EXPECT_FALSE(failed.connect(server()));
-    EXPECT_EQ(failed.errNumber(), number::type) << column;
+    EXPECT_EQ(refusal(failed, failed.connect(server())), number::type) << column;
     EXPECT_EQ(failed.homeName(), "Read before");
     store(String(column) + "=1");
   }
@@ -197,8 +196,7 @@ TEST_F(HomeTest, AMissingRowGivesDefaultsAndIsNotMadeByASave) {
 
   const String root = tables_.text("select deptName from departments where deptNo='_root'");
   home.homeName("New name");
-  EXPECT_FALSE(home.Save());
-  EXPECT_EQ(home.errNumber(), number::statement);
+  EXPECT_EQ(refusal(home, home.Save()), number::statement);
   EXPECT_EQ(tables_.text("select count(*) from homeinfo"), "0");
   EXPECT_EQ(tables_.text("select deptName from departments where deptNo='_root'"), root);
 }
@@ -209,15 +207,13 @@ TEST_F(HomeTest, AFailedSaveLeavesNothing) {
   home.ldPasswd("abc");
   home.Fax("not stored");
   test::PlainSession(server(), "QVSys").run("drop table departments");
-  EXPECT_FALSE(home.Save()) << "the root department can't be named";
-  EXPECT_EQ(home.errNumber(), number::noTable);
+  EXPECT_EQ(refusal(home, home.Save()), number::noTable) << "the root department can't be named";
   EXPECT_NE(stored("fax"), "not stored");
 
   home = connected<Home>();
   home.homeName("Company");
   home.ldPasswd("z;");
-  EXPECT_FALSE(home.Save()) << "what can't be scrambled is not stored";
-  EXPECT_EQ(home.errNumber(), number::argument);
+  EXPECT_EQ(refusal(home, home.Save()), number::argument) << "what can't be scrambled is not stored";
   EXPECT_FALSE(Home().Save()) << "not connected";
 }
 

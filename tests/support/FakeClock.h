@@ -13,7 +13,7 @@ class FakeClock {
   FakeClock& operator=(const FakeClock&) = delete;
 
   void set(Date now) {
-    platform::Services services = before_;
+    platform::Services services = platform::services();
     services.localTime = [now] { return now; };
     platform::replaceServices(services);
   }

@@ -44,7 +44,21 @@ class Scene : public testing::Test {
     return user;
   }
 
+  // The number that a call of the object failed with; 0 where it was done.
+  template <class Class>
+  static Long refusal(const Class& object, Boolean done) {
+    return done ? 0 : object.errNumber();
+  }
+
   String server() const { return installation_.server(); }
+
+  // A service of the machine for this test; its own come back with the clock's end.
+  template <class Service>
+  static void replace(Service platform::Services::*member, Service service) {
+    platform::Services services = platform::services();
+    services.*member = std::move(service);
+    platform::replaceServices(services);
+  }
 
   FakeClock clock_{Date(2024, 3, 7, 10, 0, 0)};
   TestInstallation installation_;

@@ -5,6 +5,7 @@
 #include <fstream>
 #include <signal.h>
 #include <spawn.h>
+#include <sstream>
 #include <stdexcept>
 #include <sys/socket.h>
 #include <sys/wait.h>
@@ -18,87 +19,11 @@ namespace {
 
 constexpr const char* program = "/usr/sbin/slapd";
 
-constexpr const char* configuration = R"(
-include /etc/ldap/schema/core.schema
-include /etc/ldap/schema/cosine.schema
-include /etc/ldap/schema/inetorgperson.schema
-attributetype ( 1.1.1 NAME 'sAMAccountName' EQUALITY caseIgnoreMatch SYNTAX 1.3.6.1.4.1.1466.115.121.1.15 )
-attributetype ( 1.1.2 NAME 'userPrincipalName' EQUALITY caseIgnoreMatch SYNTAX 1.3.6.1.4.1.1466.115.121.1.15 )
-objectclass ( 1.1.3 NAME 'windowsAccount' SUP top AUXILIARY MAY ( sAMAccountName $ userPrincipalName ) )
-objectclass ( 1.1.4 NAME 'computer' SUP person STRUCTURAL )
-modulepath /usr/lib/ldap
-moduleload back_mdb
-pidfile FOLDER/slapd.pid
-TLSCertificateFile TRUST/certificate.pem
-TLSCertificateKeyFile TRUST/key.pem
-database mdb
-maxsize 10485760
-suffix "dc=example,dc=org"
-directory FOLDER/data
-sizelimit size.soft=500 size.hard=500 size.prtotal=unlimited
-access to attrs=userPassword by anonymous auth by * none
-access to * by users read by * none
-)";
-
-constexpr const char* content = R"(dn: dc=example,dc=org
-objectClass: domain
-dc: example
-
-dn: cn=service,dc=example,dc=org
-objectClass: organizationalRole
-objectClass: simpleSecurityObject
-cn: service
-userPassword: Reader-7
-
-dn: ou=people,dc=example,dc=org
-objectClass: organizationalUnit
-ou: people
-
-dn: ou=empty,dc=example,dc=org
-objectClass: organizationalUnit
-ou: empty
-
-dn: uid=ann,ou=people,dc=example,dc=org
-objectClass: inetOrgPerson
-uid: ann
-cn: Ann
-sn: Example
-displayName: Ann Example
-mail: ann@example.org
-userPassword: Secret-1
-
-dn: uid=bob,ou=people,dc=example,dc=org
-objectClass: inetOrgPerson
-uid: bob
-cn: Bob (Sales) *\
-sn: Sales
-
-dn: ou=windows,dc=example,dc=org
-objectClass: organizationalUnit
-ou: windows
-
-dn: cn=Carl,ou=windows,dc=example,dc=org
-objectClass: inetOrgPerson
-objectClass: windowsAccount
-cn: Carl
-sn: Example
-uid: c1
-sAMAccountName: carl
-userPrincipalName: carl@corp
-
-dn: cn=Dora,ou=windows,dc=example,dc=org
-objectClass: person
-objectClass: windowsAccount
-cn: Dora
-sn: Example
-userPrincipalName: dora@corp
-
-dn: cn=box,ou=windows,dc=example,dc=org
-objectClass: computer
-cn: box
-sn: box
-
-)";
+String fileOf(const char* name) {
+  std::ostringstream content;
+  content << std::ifstream(std::filesystem::path(QVSA_SOURCE_DIR) / "tests/support" / name).rdbuf();
+  return content.str();
+}
 
 String manyEntries() {
   String entries = "dn: ou=many,dc=example,dc=org\nobjectClass: organizationalUnit\nou: many\n\n";
@@ -184,8 +109,8 @@ Slapd::Slapd() : port_(std::make_unique<Port>()), tlsPort_(std::make_unique<Port
   const String settings = folder / "slapd.conf";
   const String entries = folder / "entries.ldif";
   std::filesystem::create_directory(folder / "data");
-  write(settings, configuration, folder);
-  write(entries, content + manyEntries(), folder);
+  write(settings, fileOf("slapd.conf"), folder);
+  write(entries, fileOf("slapd.ldif") + manyEntries(), folder);
   int status = 0;
   waitpid(spawn({program, "-Tadd", "-q", "-f", settings, "-l", entries}), &status, 0);
   if (status != 0) throw std::runtime_error("slapd does not take its entries");

@@ -48,11 +48,9 @@ TEST_F(LogExport, LeavesTheOldFileWhereItCannotBeDone) {
   writeThree();
   std::ofstream(path("log.txt")) << "old";
   std::filesystem::create_directory(path("taken"));
-  EXPECT_FALSE(log_.saveLog(path("taken")));
-  EXPECT_EQ(log_.errNumber(), number::pathAccess);
+  EXPECT_EQ(refusal(log_, log_.saveLog(path("taken"))), number::pathAccess);
   EXPECT_EQ(log_.errDescription(), "Error in saving system log." + runtimeFailure(number::pathAccess).description());
-  EXPECT_FALSE(log_.saveLog(path("missing/log.txt")));
-  EXPECT_EQ(log_.errNumber(), number::noPath);
+  EXPECT_EQ(refusal(log_, log_.saveLog(path("missing/log.txt"))), number::noPath);
   EXPECT_FALSE(log_.saveLog((installation_.folder() / "QVSys.db").string()));
   EXPECT_EQ(log_.errDescription(), "Error in saving system log.A file of an installation is not written over");
   EXPECT_EQ(left(), "a\nb\nc");
@@ -63,8 +61,7 @@ TEST_F(LogExport, LeavesTheOldFileWhereItCannotBeDone) {
   server.answer("select * from syslog",
                 {{{"LogTime"}, {"UserName"}, {"UserLogin"}, {"LogType"}, {"Computer"}, {"FuncName"}, {"OpDesc"}},
                  {{"", "", "", 1, "", "", much}, {"", "", "", 1, "", "", Bytes{1}}, {"", "", "", 1, "", "", ""}}});
-  EXPECT_FALSE(log_.saveLog(path("log.txt")));
-  EXPECT_EQ(log_.errNumber(), number::type);
+  EXPECT_EQ(refusal(log_, log_.saveLog(path("log.txt"))), number::type);
   EXPECT_EQ(server.fetchedRows, 2);
   EXPECT_TRUE(server.lastBatch.updatable) << "a dynamic cursor, of which nothing is kept";
   EXPECT_EQ(content("log.txt"), "old");
@@ -122,8 +119,7 @@ TEST_F(LogExport, ClearingExportsFirstWhereToldToAndDeletesWhateverComesOfIt) {
   EXPECT_EQ(log_.errDescription().find("Error in saving system log."), 0U);
 
   tables_.run("drop table syslog");
-  EXPECT_FALSE(log_.clearLog());
-  EXPECT_EQ(log_.errNumber(), number::noTable);
+  EXPECT_EQ(refusal(log_, log_.clearLog()), number::noTable);
   EXPECT_EQ(log_.errDescription().find("Error in deleting system log."), 0U);
 }
 

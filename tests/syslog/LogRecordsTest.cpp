@@ -50,8 +50,7 @@ TEST_F(LogWriting, AnEntryOfNobodyIsNotWrittenAndUsesANumberUp) {
 
 TEST_F(LogWriting, AFailureIsToldBehindTheLogsOwnSentence) {
   tables_.run("delete from idRule where idName='_log'");
-  EXPECT_FALSE(log_.Add(1, 1, "f", "d"));
-  EXPECT_EQ(log_.errNumber(), messageNumber(1502));
+  EXPECT_EQ(refusal(log_, log_.Add(1, 1, "f", "d")), messageNumber(1502));
   EXPECT_EQ(log_.errDescription(), "Error in recording system log. " + LoadResString(1502));
 
   LogRecords unconnected;
@@ -105,8 +104,7 @@ TEST_F(LogQueries, AllAsksByTypeDaysUserTemplateAndDescription) {
   EXPECT_EQ(all(never, never, 0, "", "BETA"), "b a");
   EXPECT_TRUE(log_.GetAll(3));
   EXPECT_EQ(found(), "d");
-  EXPECT_FALSE(log_.GetAll(0, never, Date(9999, 12, 31)));
-  EXPECT_EQ(log_.errNumber(), number::overflow);
+  EXPECT_EQ(refusal(log_, log_.GetAll(0, never, Date(9999, 12, 31))), number::overflow);
 }
 
 TEST_F(LogQueries, TheWebPageAloneGetsItems) {
@@ -164,8 +162,7 @@ TEST_F(LogQueries, TheListsDaysCountInWholeAndOneDayTakesTheNextMidnightAsWell) 
   EXPECT_EQ(found(), "e d c");
   EXPECT_EQ(turned[1], Variant(never));
   std::vector<Variant> endless = query(never, Date(9999, 12, 31));
-  EXPECT_FALSE(log_.GetLogByQuery(endless));
-  EXPECT_EQ(log_.errNumber(), number::overflow) << "no day is behind it";
+  EXPECT_EQ(refusal(log_, log_.GetLogByQuery(endless)), number::overflow) << "no day is behind it";
 }
 
 TEST_F(LogQueries, ANullInTheListIsNotSet) {
