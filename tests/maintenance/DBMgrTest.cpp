@@ -188,12 +188,6 @@ TEST_F(Backups, LeaveTheDatabaseToAllWhereARestoreFails) {
   }
 }
 
-TEST(ARotatedKey, BeginsAtTheStartThatIsForcedIntoItsRange) {
-  const String all(secrets::rotatedKeyCharacters.begin(), secrets::rotatedKeyCharacters.end());
-  const std::pair<Integer, std::size_t> cases[] = {{0, 0}, {3, 3}, {9, 9}, {-1, 0}, {12, 9}};
-  for (const auto& [start, first] : cases) EXPECT_EQ(rotatedKey(start), all.substr(first) + all.substr(0, first));
-}
-
 // A host that is not the administrator's hears which file it is; the administrator gets his backup in.
 TEST_F(Backups, ComeBackWhereADatabaseCannotBeRead) {
   addUser("ann");
