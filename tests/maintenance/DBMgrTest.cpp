@@ -85,15 +85,6 @@ TEST_F(Backups, AreRefusedWhereAFileIsMissing) {
   EXPECT_EQ(manager_.errDescription().rfind("Database backup error.Cannot open backup device", 0), 0U);
 }
 
-TEST_F(Backups, NeedTheAdministratorToRestore) {
-  backUp();
-  EXPECT_EQ(refusal(manager_, manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), "wrong")), number::login);
-  EXPECT_EQ(manager_.errDescription(), "Login failed for user 'sa'.:18456");
-  EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), defaultDbPwd(), false, "QVUser"));
-  EXPECT_EQ(manager_.errDescription(), "User does not have permission to RESTORE database 'QVSys'.:3110");
-  EXPECT_EQ(tables_.text("select count(*) from users"), "1") << "and the database is back for all";
-}
-
 TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
   backUp("lock");
   EXPECT_EQ(spec(), "-") << "without reports there is nothing to lock";
