@@ -60,16 +60,6 @@ TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   EXPECT_EQ(run("doctor").exitCode, 1);
 }
 
-TEST_F(Program, AnExpiredPasswordCanStillBeChanged) {
-  addAnn();
-  ASSERT_EQ(run("policy set --max-days 5").exitCode, 0);
-  execute("update users set pwdDate='20200101' where userLogin='ann'");
-  EXPECT_EQ(run("sign-on ann", "Ann-pass-1\n").error(), "0x8004045F");
-  EXPECT_EQ(run("password ann", "wrong\nAnn-pass-2\n").error(), "0x80040452");
-  EXPECT_EQ(run("password ann", "Ann-pass-1\nAnn-pass-2\n").exitCode, 0);
-  EXPECT_NE(signOn("ann", "Ann-pass-2"), "");
-}
-
 TEST_F(Program, AChangeOfPasswordLeavesNoSessionAndHeedsTheFlagAgainstIt) {
   addAnn();
   ASSERT_EQ(run("password ann", "Ann-pass-1\nAnn-pass-2\n").exitCode, 0);

@@ -273,30 +273,6 @@ TEST_F(Administration, ACopyWithoutASumGetsAllOtherChecksAndIsTold) {
   platform::replaceServices(before);
 }
 
-// What stands in the place of such a database is empty, and must not be taken for it.
-TEST_F(Administration, ADatabaseThatCannotBeReadIsThereToBeRestoredOnly) {
-  administrator()->run({"create table QVSys..t (n int null)"});
-  administrator()->run({"backup database QVSys to disk='" + file("a") + "' with init"});
-  embedded::discardIdleHandle(installation_.folder());
-  std::filesystem::resize_file(embedded::databaseFile(installation_.folder(), "QVSys"), 100);
-  EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 4060);
-  EXPECT_EQ(native(*open("QVApp"), "create table u (n int)"), 0);
-  auto session = administrator();
-  for (const std::string& text :
-       {std::string("select n from QVSys..t"), std::string("create table QVSys..u (n int)"),
-        std::string("use QVSys drop table t"), "backup database QVSys to disk='" + file("b") + "' with init"})
-    EXPECT_EQ(native(*session, text), 4060) << text;
-  session->run({"use master"});
-  session->run({"backup database QVApp to disk='" + file("b") + "' with init"});
-  session->run({restoring("QVSys", "a")});
-  EXPECT_EQ(native(*session, "select n from QVSys..t"), 0);
-  EXPECT_EQ(native(*open("QVSys"), "select n from t"), 0);
-  // Found out only when it is restored.
-  std::ofstream(embedded::databaseFile(installation_.folder(), "QVSys")) << std::string(9000, 'x');
-  session->run({restoring("QVSys", "a")});
-  EXPECT_EQ(native(*session, "select n from QVSys..t"), 0);
-}
-
 TEST_F(Administration, ABackupTakesTheOldFilesPlaceOnlyWhenItIsWhole) {
   auto session = open("master");
   const auto backingUp = [](const std::string& path) {

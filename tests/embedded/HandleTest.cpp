@@ -181,31 +181,6 @@ TEST_F(HandleOfAnInstallation, BrokenRulesOfATableHaveSqlServersNumbers) {
   EXPECT_EQ(failing("2,null,'C'").number(), number::integrity);
 }
 
-TEST_F(HandleOfAnInstallation, TheWritersPlaceIsWaitedForUpToTheDeadline) {
-  Handle first(folder_.data()), second(folder_.data());
-  first.execute("begin");
-  first.takeWriter(qvSys);
-  second.execute("begin");
-  second.takeWriter(qvApp);  // another database has a writer of its own
-  second.execute("rollback");
-
-  const auto start = steady_clock::now();
-  second.deadline(start + milliseconds(60));
-  second.execute("begin");
-  EXPECT_EQ(failureOf([&] { second.takeWriter(qvSys); }).number(), number::timeout);
-  EXPECT_GE(steady_clock::now() - start, milliseconds(60));
-  EXPECT_LT(steady_clock::now() - start, milliseconds(2000));
-
-  second.deadline(steady_clock::now() + std::chrono::seconds(10));
-  auto released = std::async(std::launch::async, [&] {
-    std::this_thread::sleep_for(milliseconds(30));
-    first.execute("rollback");
-  });
-  second.takeWriter(qvSys);
-  released.get();
-  second.execute("rollback");
-}
-
 TEST_F(HandleOfAnInstallation, AWriteOverOldRowsIsADeadlock) {
   Handle first(folder_.data()), second(folder_.data());
   first.execute("begin");
@@ -214,19 +189,6 @@ TEST_F(HandleOfAnInstallation, AWriteOverOldRowsIsADeadlock) {
   const Failure failure = failureOf([&] { first.takeWriter(qvSys); });
   EXPECT_EQ(failure.native(), 1205);
   EXPECT_EQ(failure.number(), number::general);
-}
-
-TEST_F(HandleOfAnInstallation, AStatementThatRunsTooLongIsStopped) {
-  Handle handle(folder_.data());
-  handle.deadline(steady_clock::now() + milliseconds(50));
-  const auto start = steady_clock::now();
-  const Failure failure = failureOf(
-      [&] { count(handle, "(with recursive c(i) as (select 1 union all select i+1 from c) select * from c)"); });
-  EXPECT_EQ(failure.number(), number::timeout);
-  EXPECT_LT(steady_clock::now() - start, milliseconds(2000));
-  EXPECT_EQ(failureOf([&] { handle.waitShortly(); }).number(), number::timeout);
-  handle.deadline(std::nullopt);
-  EXPECT_EQ(count(handle, "QVSys.engine"), 1);
 }
 
 }  // namespace

@@ -47,16 +47,6 @@ TEST(Pool, AWarmHandleComesBackWithoutWhatTheLastSessionLeft) {
   }
 }
 
-TEST(Pool, AHandleWhoseFilesWereReplacedIsNotUsedAgain) {
-  InstallationFolder folder;
-  acquireHandle(folder.data())->execute("create table QVSys.old(x)");
-  std::filesystem::rename(folder.data(), folder.root() / "moved");
-  EXPECT_EQ(failureOf([&] { acquireHandle(folder.data()); }).native(), 17);
-  createInstallation(folder.plan());
-  EXPECT_EQ(failureOf([&] { acquireHandle(folder.data())->execute("select * from QVSys.old"); }).number(),
-            number::noTable);
-}
-
 TEST(Pool, AFileThatAnotherOneHasReplacedIsNoticedWhicheverItIs) {
   InstallationFolder folder;
   const auto replace = [&](const char* name) {
@@ -73,21 +63,6 @@ TEST(Pool, AFileThatAnotherOneHasReplacedIsNoticedWhicheverItIs) {
     replace(name);
     EXPECT_EQ(failureOf([&] { open->catalogueVersion(); }).native(), 4060) << name;
   }
-}
-
-TEST(Pool, ThreadsHaveAHandleEach) {
-  InstallationFolder folder;
-  acquireHandle(folder.data())->execute("create table QVSys.t(x integer)");
-  std::vector<std::thread> threads;
-  for (int i = 0; i < 4; ++i)
-    threads.emplace_back([&] {
-      for (int n = 0; n < 25; ++n) acquireHandle(folder.data())->execute("insert into QVSys.t values(1)");
-    });
-  for (auto& thread : threads) thread.join();
-  const PooledHandle handle = acquireHandle(folder.data());
-  Prepared sum(handle->get(), "select count(*) from QVSys.t");
-  sum.step();
-  EXPECT_EQ(std::get<std::int64_t>(sum.column(0)), 100);
 }
 
 TEST(Pool, AForkedProcessIsRefusedAndHarmsNothing) {

@@ -69,28 +69,5 @@ TEST_F(RowLocksOfAFile, ManyRowsBecomeTheWholeTable) {
   EXPECT_FALSE(mine.tryLock("users", 1'000'000));
 }
 
-TEST_F(RowLocksOfAFile, AKilledProcessLeavesNoLock) {
-  RowLocks mine(file_);
-  int ready[2];
-  ASSERT_EQ(::pipe(ready), 0);
-  ChildProcess child([&] {
-    RowLocks locks(file_);
-    const char taken = locks.tryLock("idRec", 1) ? 'y' : 'n';
-    if (::write(ready[1], &taken, 1) == 1) ::pause();
-    return 0;
-  });
-  char taken = 0;
-  ASSERT_EQ(::read(ready[0], &taken, 1), 1);
-  EXPECT_EQ(taken, 'y');
-  EXPECT_FALSE(mine.tryLock("idRec", 1));
-  child.kill();
-  EXPECT_TRUE(mine.tryLock("idRec", 1));
-}
-
-TEST_F(RowLocksOfAFile, AMissingLockFileIsNotMade) {
-  EXPECT_THROW(RowLocks(folder_.root() / "QVApp.lock"), Failure);
-  EXPECT_FALSE(std::filesystem::exists(folder_.root() / "QVApp.lock"));
-}
-
 }  // namespace
 }  // namespace QVSa::embedded

@@ -2,12 +2,10 @@
 #include <array>
 #include <gtest/gtest.h>
 
-#include "providers/embedded/storage/Pool.h"
+#include "tests/faults/Ground.h"
 #include "tests/faults/Operations.h"
 #include "tests/support/FakeClock.h"
-#include "tests/support/PlainSession.h"
 #include "tests/support/RecordingProvider.h"
-#include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {
 
@@ -17,46 +15,15 @@ namespace {
 
 const Failure madeUp(number::of(0x80041234), "a test", "This failure is made up.");
 
-// A filled installation of its own for each attempt, all copies of one.
-class Ground {
- public:
-  Ground() { std::filesystem::copy(filled(), folder_.path()); }
-
-  String server() const { return "file:" + folder_.path().string(); }
-
-  // All that the operations write.
-  Lines tables() const { return asked("select * from "); }
-  // Of each: encrypted texts are never the same twice.
-  Lines counts() const { return asked("select count(*) from "); }
-
- private:
-  Lines asked(const String& query) const {
-    const PlainSession session(server());
-    Lines result;
-    for (const char* table :
-         {"users",        "userPwdHis", "userJob",   "GrpUser", "agentuser", "saferule",      "seslog",
-          "departments",  "jobs",       "idRule",    "idRec",   "idDel",     "QVSys..idRec",  "syslog",
-          "RptDirectory", "AclRule",    "QVTmpSafe", "repTmps", "homeinfo",  "QVUserRegInfo", "QVMailQ",
-          "roles",        "ItemGroups", "grpRole",   "userMgr", "fldAcl",    "cftJob",        "repAcl",
-          "tasks",        "QVBkPlan",   "QVTaskSche"})
-      result.push_back(session.text(query + table));
-    return result;
-  }
-
-  static const std::filesystem::path& filled() {
-    static const TestInstallation installation;
-    static const bool done = [] {
-      fillGround(installation.server());
-      // Closes the files, which brings all of the content into them.
-      embedded::discardIdleHandle(installation.folder());
-      return true;
-    }();
-    static_cast<void>(done);
-    return installation.folder();
-  }
-
-  TestFolder folder_;
-};
+const std::filesystem::path& filledFolder() {
+  static const TestInstallation installation;
+  static const bool done = [] {
+    fillGround(installation);
+    return true;
+  }();
+  static_cast<void>(done);
+  return installation.folder();
+}
 
 bool beginsWith(const String& text, const String& beginning) { return text.rfind(beginning, 0) == 0; }
 
@@ -123,7 +90,7 @@ class EveryOperation : public testing::TestWithParam<Operation> {
  protected:
   // The events of an undisturbed call.
   Lines undisturbed() {
-    const Ground ground;
+    const Ground ground(filledFolder());
     const auto call = GetParam().prepare(ground.server());
     Lines events;
     {
@@ -139,7 +106,7 @@ class EveryOperation : public testing::TestWithParam<Operation> {
 
   void failAt(const Lines& events, std::size_t place) {
     const Operation& operation = GetParam();
-    const Ground ground;
+    const Ground ground(filledFolder());
     const auto call = operation.prepare(ground.server());
     const Lines before = ground.tables();
     {

@@ -22,7 +22,7 @@ std::vector<Operation> logOperations() {
                      [](auto& log) { return log.GetAll(1, Date::empty(), Date::empty(), 0, "", "", "", 0, 2); }),
       on<LogRecords>("LogRecords.GetLogByQuery", told(1702), queryLog),
       on<LogRecords>("LogRecords.saveLog", told(1704),
-                     [](auto& log, const String& server) { return log.saveLog(server.substr(5) + "/log.txt"); }),
+                     [](auto& log, const Place& place) { return log.saveLog(place.log); }),
       on<LogRecords>("LogRecords.clearLog", told(1703), [](auto& log) { return log.clearLog(); }),
   };
 }
@@ -61,7 +61,7 @@ std::vector<Operation> ruleAndSafeOperations() {
       on<AclRule>("AclRule.Save of a new rule", [](auto& rule) { return rule.Save() && rule.Id() == 1; }),
       on<AclRule>(
           "AclRule.Save", {}, [](auto& rule) { rule.Id(1); }, [](auto& rule) { return rule.Save(); }),
-      on<tmpSafe>("tmpSafe.connect", [](auto& safe, const String& server) { return safe.connect(server); }),
+      on<tmpSafe>("tmpSafe.connect", [](auto& safe, const Place& place) { return safe.connect(place.server); }),
       on<tmpSafe>("tmpSafe.Save of a first password", [](auto& safe) { return safe.Save(); }),
       on<tmpSafe>("tmpSafe.Save for all", [](auto& safe) { return safe.Save(true); }),
       on<tmpSafe>("tmpSafe.getPwd", readPassword),
@@ -80,7 +80,7 @@ void fillLogAndClasses(const String& server) {
   }
   LogRecords log;
   log.connect(server, "QVApp");
-  require(log.Add(1, 1, "f", "d"));
+  require(log.Add(1, 1, "f", "d") && log.saveLog(Place(server).log));
   PlainSession(server).run("insert into repTmps(rtUid,rtPwd) values('t','" +
                            platform::encryptText(secrets::defaultTemplatePwd, secrets::templatePwdKey) + "')");
 }

@@ -1,3 +1,5 @@
+#include <optional>
+
 #include "QVSa/QVSa.h"
 #include "QVSa/maintenance/internal/BackupLock.h"
 #include "tests/faults/Shapes.h"
@@ -8,19 +10,13 @@ namespace QVSa::test {
 
 namespace {
 
-// Where the plan's backups go; each run of a test writes the same folder.
-String backupPath() {
-  static const TestFolder folder;
-  return folder.path().string();
-}
-
-String groundCopy(const String& name) { return backupPath() + "/ground-" + name; }
-
 void loadPlan(BKPlan& plan) { require(plan.GetOne(2, "nightly")); }
 
+// The plan's backups go into a folder of the test.
 void fillPlan(BKPlan& plan) {
+  static const TestFolder folder;
   plan.Name("weekly");
-  plan.bkPath(backupPath());
+  plan.bkPath(folder.path().string());
   plan.schedule()->timesOneDay(1);
 }
 
@@ -54,41 +50,48 @@ std::vector<Operation> planOperations() {
 
 // Of a class without the usual connect: the operation names its server, and may raise.
 template <class Class>
-Operation unconnected(const char* name, std::vector<Report> reports, bool (*run)(Class&, const String& server)) {
-  const auto prepare = [run](const String& server) -> std::function<Outcome()> {
-    return [run, server] {
+Operation unconnected(const char* name, std::vector<Report> reports, bool (*run)(Class&, const Place&)) {
+  const auto prepare = [run](const String& server) -> Call {
+    auto object = std::make_shared<Class>();
+    auto raised = std::make_shared<std::optional<Failure>>();
+    const auto call = [raised, object, run, place = Place(server)] {
+      raised->reset();
       try {
-        Class object;
-        const bool positive = run(object, server);
-        return Outcome{positive, object.errNumber(), object.errDescription()};
+        return run(*object, place);
       } catch (const Failure& failure) {
-        return Outcome{false, failure.number(), failure.description()};
+        *raised = failure;
+        return false;
       }
     };
+    return {call, [=] { return *raised ? (*raised)->number() : object->errNumber(); },
+            [=] { return *raised ? (*raised)->description() : object->errDescription(); }};
   };
   return {name, prepare, std::move(reports), false};
 }
 
-bool backUpWithALock(DBMgr& manager, const String& server) {
-  return manager.BackUpDB(server, backupPath() + "/sys", backupPath() + "/app", "", "lock");
+bool backUpWithALock(DBMgr& manager, const Place& place) {
+  return manager.BackUpDB(place.server, place.sys, place.app, "", "lock");
 }
 
-bool decrypt(DBMgr& manager, const String& server) { return manager.decryptTmps(server, "lock"); }
+bool decrypt(DBMgr& manager, const Place& place) { return manager.decryptTmps(place.server, "lock"); }
 
-bool restoreBoth(DBMgr& manager, const String& server) {
-  return manager.RestoreDB(server, groundCopy("sys"), groundCopy("app"), TestInstallation::administratorPassword);
+bool restoreBoth(DBMgr& manager, const Place& place) {
+  return manager.RestoreDB(place.server, place.groundSys, place.groundApp, TestInstallation::administratorPassword);
 }
 
-bool mendPlan(BKPlan& plan, const String& server) {
-  plan.connect(server, "QVApp");
+bool mendPlan(BKPlan& plan, const Place& place) {
+  plan.connect(place.server, "QVApp");
   if (!plan.GetOne(2, "broken")) return false;
   plan.newSche();
   return true;
 }
 
-bool askAgent(QVAgent& agent, const String& server) {
-  agent.connect(server);
-  return agent.newFiles() == 1;
+// By one that goes with the call: it keeps its connection.
+bool askAgent(QVAgent&, const Place& place) {
+  QVAgent agent;
+  agent.connect(place.server);
+  if (agent.newFiles() == 1) return true;
+  throw Failure(agent.errNumber(), "", agent.errDescription());
 }
 
 }  // namespace
@@ -118,6 +121,7 @@ std::vector<LetPass> maintenanceLetPass() {
 }
 
 void fillMaintenance(const String& server) {
+  const Place place(server);
   for (const char* name : {"nightly", "broken"}) {
     BKPlan plan;
     plan.connect(server, "QVApp");
@@ -130,7 +134,7 @@ void fillMaintenance(const String& server) {
                            BackupLock{"3", "lock"}.cipher() + "' where roleId=4 delete from QVTaskSche where taskId=2");
   PlainSession(server, "QVUpdate").run("insert into sysfile(fileName) values('QVSa.dll')");
   DBMgr manager;
-  require(manager.BackUpDB(server, groundCopy("sys"), groundCopy("app")));
+  require(manager.BackUpDB(server, place.groundSys, place.groundApp));
 }
 
 }  // namespace QVSa::test

@@ -2,6 +2,8 @@
 
 #include "QVSa/QVSa.h"
 #include "platform/SecretMessage.h"
+#include "providers/embedded/storage/Pool.h"
+#include "tests/faults/Ground.h"
 #include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
 
@@ -58,9 +60,9 @@ std::vector<Operation> userOperations() {
   };
 }
 
-bool act(Sessions& sessions, const String& server) {
+bool act(Sessions& sessions, const Place& place) {
   Long uid = 0;
-  return sessions.newAction("s1", server, uid, "", 0);
+  return sessions.newAction("s1", place.server, uid, "", 0);
 }
 
 std::vector<Operation> policyAndSessionOperations() {
@@ -70,7 +72,7 @@ std::vector<Operation> policyAndSessionOperations() {
       on<safeRule>("safeRule.Save", atomic(), lengthen, [](auto& rule) { return rule.Save(); }),
       on<safeRule>("safeRule.checkPwd", [](auto& rule) { return rule.checkPwd("right"); }),
       on<Sessions>("Sessions.connect", told(1601),
-                   [](auto& sessions, const String& server) { return sessions.connect(server, "QVApp"); }),
+                   [](auto& sessions, const Place& place) { return sessions.connect(place.server, "QVApp"); }),
       on<Sessions>("Sessions.GetAll", told(1601), [](auto& sessions) { return sessions.GetAll().toBoolean(); }),
       on<Sessions>("Sessions.Terminate", told(1603), [](auto& sessions) { return sessions.Terminate("s1"); }),
       on<Sessions>("Sessions.newAction", act),
@@ -171,7 +173,8 @@ void addRule(const String& server, const String& name) {
 
 }  // namespace
 
-void fillGround(const String& server) {
+void fillGround(const TestInstallation& installation) {
+  const String server = installation.server();
   const PlainSession tables(server);
   tables.run(
       "insert into saferule(id,minLen,cycle,lockErr,errTimes) values(1,1,3,1,1)"
@@ -194,6 +197,8 @@ void fillGround(const String& server) {
   fillSettings(server);
   fillOrganisation(server);
   fillMaintenance(server);
+  // Closes the files, which brings all of the content into them.
+  embedded::discardIdleHandle(installation.folder());
 }
 
 const std::vector<Operation>& operations() {

@@ -13,6 +13,18 @@ struct Outcome {
   String errDescription;
 };
 
+// One call of an operation, on an object that is made and loaded.
+struct Call {
+  std::function<bool()> run;
+  std::function<Long()> errNumber;
+  std::function<String()> errDescription;
+
+  Outcome operator()() const {
+    const bool positive = run();
+    return {positive, errNumber(), errDescription()};
+  }
+};
+
 // How a failure is told that comes with a statement of this beginning.
 struct Report {
   String statement;
@@ -25,8 +37,8 @@ struct Report {
 
 struct Operation {
   const char* name;
-  // Makes the object and loads what the operation needs; the result is the operation itself.
-  std::function<std::function<Outcome()>(const String& server)> prepare;
+  // Makes the object and loads what the operation needs.
+  std::function<Call(const String& server)> prepare;
   // The first that fits holds; without one the failure is told as it is.
   std::vector<Report> reports;
   // Whether it writes in one transaction: up to the commit nothing may have changed.
@@ -41,9 +53,6 @@ struct LetPass {
   const char* reason;
   bool alone = false;  // the statement, but not the opening and the beginning before it
 };
-
-// Makes what the operations work on, in an installation as it is shipped.
-void fillGround(const String& server);
 
 const std::vector<Operation>& operations();
 const std::vector<LetPass>& letPass();

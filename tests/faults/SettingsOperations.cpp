@@ -39,10 +39,10 @@ void loadDora(User& user) { require(user.GetOne(3, "dora")); }
 std::vector<Operation> settingsOperations() {
   const auto save = [](Home& home) { return home.Save(); };
   return {
-      on<Home>("Home.connect", [](auto& home, const String& server) { return home.connect(server, "QVApp"); }),
+      on<Home>("Home.connect", [](auto& home, const Place& place) { return home.connect(place.server, "QVApp"); }),
       on<Home>("Home.getImage",
-               [](auto& home, const String& server) {
-                 return withDirectory([&] { return home.getImage(server, "QVApp"); });
+               [](auto& home, const Place& place) {
+                 return withDirectory([&] { return home.getImage(place.server, "QVApp"); });
                }),
       on<Home>("Home.Save", atomic(), changeHome, save),
       on<Home>("Home.Save without pictures", atomic(), save),

@@ -29,6 +29,17 @@ inline void append(std::vector<Operation>& all, std::vector<Operation> part) {
   for (Operation& one : part) all.push_back(std::move(one));
 }
 
+// Where an operation works. Its texts are made beforehand: a call has no memory of its own.
+struct Place {
+  explicit Place(const String& where) : server(where) {}
+
+  String server;
+  String folder = server.substr(5);
+  String sys = folder + "/sys", app = folder + "/app";
+  String groundSys = folder + "/ground-sys", groundApp = folder + "/ground-app";
+  String log = folder + "/log.txt";
+};
+
 template <class Class>
 String descriptionOf(const Class& object) {
   if constexpr (requires { object.errDesc(); })
@@ -47,21 +58,20 @@ inline Conduct told(Long messageId, const String& blank = "") { return {{{"", Lo
 
 inline Conduct atomic(Conduct conduct = {}) { return {std::move(conduct.reports), true}; }
 
-// An operation of a class that is connected first and prepared by `load`. `run` may take the server as well.
+// An operation of a class that is connected first and prepared by `load`. `run` may take its place as well.
 template <class Class, class Run>
 Operation on(const char* name, Conduct conduct, std::function<void(Class&)> load, Run run) {
-  const auto prepare = [load, run](const String& server) -> std::function<Outcome()> {
+  const auto prepare = [load, run](const String& server) -> Call {
     auto object = std::make_shared<Class>();
     object->connect(server, "QVApp");
     if (load) load(*object);
-    return [object, run, server] {
-      bool positive = false;
+    const auto call = [object, run, place = Place(server)]() -> bool {
       if constexpr (std::is_invocable_v<Run, Class&>)
-        positive = run(*object);
+        return run(*object);
       else
-        positive = run(*object, server);
-      return Outcome{positive, object->errNumber(), descriptionOf(*object)};
+        return run(*object, place);
     };
+    return {call, [object] { return object->errNumber(); }, [object] { return descriptionOf(*object); }};
   };
   return {name, prepare, std::move(conduct.reports), conduct.isAtomic};
 }

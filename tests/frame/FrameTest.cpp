@@ -64,14 +64,6 @@ class FrameTest : public testing::Test {
   Record record;
 };
 
-TEST_F(FrameTest, BeforeConnectAnOperationFailsInTheDatabaseLayer) {
-  Record fresh;
-  EXPECT_FALSE(fresh.Delete(plain()));
-  EXPECT_EQ(fresh.errNumber(), number::general);
-  fresh.connect("", "");
-  EXPECT_FALSE(fresh.Delete(plain()));
-}
-
 TEST_F(FrameTest, AnOperationLeavesNothingOpenAndASuccessClearsNoFailure) {
   failing(number::timeout);
   EXPECT_FALSE(record.Delete(plain()));
@@ -89,16 +81,6 @@ TEST_F(FrameTest, AResultOfItsOwnIsTheLastOneStored) {
   EXPECT_EQ(record.Count(plain()), 0);
   server.fail("open", Failure(number::login, "Provider", "No."));
   EXPECT_EQ(record.Count(plain()), -1);
-}
-
-TEST_F(FrameTest, AFailureGivesTheNegativeResultOfEachType) {
-  const auto breaks = [](bool broken) {
-    if (broken) throw runtimeFailure(number::type);
-  };
-  EXPECT_EQ(record.perform([&] { return breaks(true), String("text"); }), "");
-  EXPECT_EQ(record.perform([&] { return breaks(true), std::make_shared<int>(1); }), nullptr);
-  EXPECT_EQ(record.perform([&] { return breaks(false), String("text"); }), "text");
-  EXPECT_EQ(record.errNumber(), number::type);
 }
 
 TEST_F(FrameTest, OtherExceptionsStayInsideToo) {

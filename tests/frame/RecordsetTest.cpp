@@ -46,31 +46,6 @@ TEST_F(RecordsetTest, StreamsRowByRow) {
   EXPECT_EQ(join(names, " "), "first second third");
 }
 
-TEST_F(RecordsetTest, FieldsAreFoundByNameOrPosition) {
-  Recordset rows = connection.Execute("jobs");
-  EXPECT_EQ(rows.fieldCount(), 4U);
-  EXPECT_EQ(rows["name"].Name(), "Name");
-  EXPECT_EQ(rows[0].asLong(), 1);
-  EXPECT_EQ(rows[3].asText(), "x");
-  EXPECT_TRUE(rows[""].isNull());
-  EXPECT_EQ(failureOf([&] { rows["deptId"]; }), number::noField);
-  EXPECT_EQ(failureOf([&] { rows[4]; }), number::noField);
-  EXPECT_EQ(failureOf([&] { rows[-1]; }), number::noField);
-}
-
-TEST_F(RecordsetTest, PlainReadersTakeNullAsNothing) {
-  server.answer("null", {{{"x"}}, {{Variant::null()}, {1}, {-1}, {true}, {"1"}, {"no"}}});
-  Recordset rows = connection.Execute("null");
-  EXPECT_EQ(rows[0].asLong(), 0);
-  EXPECT_EQ(rows[0].asInteger(), 0);
-  EXPECT_EQ(rows[0].asText(), "");
-  EXPECT_EQ(rows[0].asDate(), Date());
-  EXPECT_FALSE(rows[0].asBoolean());
-  String flags;
-  for (; !rows.EOF_(); rows.MoveNext()) flags += rows[0].isOne() ? "1" : "0";
-  EXPECT_EQ(flags, "010110");
-}
-
 TEST_F(RecordsetTest, AtTheEndThereIsNothingToRead) {
   Recordset rows = connection.Execute("none");
   EXPECT_TRUE(rows.EOF_());

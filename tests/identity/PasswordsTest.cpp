@@ -1,10 +1,33 @@
+#include <gtest/gtest.h>
+
+#include "QVSa/identity/internal/IpRules.h"
+#include "QVSa/identity/safeRule.h"
+#include "QVSa/resources/Messages.h"
 #include "platform/SecretMessage.h"
+#include "tests/support/FakeSession.h"
 #include "tests/support/Scene.h"
 
 namespace QVSa {
 namespace {
 
 using test::Lines;
+
+TEST(IpRules, MatchOneAddressAStarForItsLastPartOrARangeThere) {
+  const std::pair<const char*, const char*> matches[] = {{"10.0.0.5", " 10.0. 0.5 "}, {"fe80::1", "fe80::1"},
+                                                         {"10.0.0.5", "10.0.0.*"},    {"10.0.0.1", "10.0.0.1-9"},
+                                                         {"10.0.0.9", "10.0.0.1-9"},  {"10.0.0.10", "10.0.0.9-11"}};
+  for (const auto& [address, rule] : matches) EXPECT_TRUE(ipMatchesOne(address, rule)) << address << " " << rule;
+  for (const char* rule : {"10.0.0.50", "*", "10.0.1.*", "10.0.*.5", "10.0.0.5*", "10.0.0.6-9", "10.0.0.1-4",
+                           "10.0.1.1-9", "10.0.0.-", "10.0.0.1-", "10.0.0.-9", "10.0.0.1-9-12", "10.0.0.a-z"})
+    EXPECT_FALSE(ipMatchesOne("10.0.0.5", rule)) << rule;
+  EXPECT_FALSE(ipMatchesOne("fe80::1", "10.0.0.*"));
+}
+
+TEST(IpRules, OneMatchingPatternOfTheListIsEnoughAndAnEmptyListPermitsNothing) {
+  EXPECT_TRUE(ipMatches("10.0.0.5", "192.168.1.*|10.0.0.1-9"));
+  EXPECT_FALSE(ipMatches("10.0.0.15", "192.168.1.*|10.0.0.1-9"));
+  EXPECT_FALSE(ipMatches("", ""));
+}
 
 // Ann, under a policy that keeps three passwords. Each change is made an hour after the last one.
 class Passwords : public test::Scene {
@@ -165,6 +188,48 @@ TEST_F(Passwords, APolicyWithoutARowIsMadeByItsFirstSave) {
   EXPECT_TRUE(rule.GetOne());
   EXPECT_EQ(rule.minLen(), 0);
   EXPECT_FALSE(rule.lockErr() || rule.hasSpecialChar());
+}
+
+TEST(SafeRule, TellsEachThingThatAPasswordLacks) {
+  const String shortOne = fillMsg(LoadResString(3001), {6});
+  const String cases = LoadResString(3002), kinds = LoadResString(3003), special = LoadResString(3004);
+  const struct {
+    Integer minLen;
+    bool caseMixed, numCharMixed, hasSpecialChar;
+    const char* password;
+    String problems;
+  } judged[] = {{6, false, false, false, "", shortOne},
+                {6, false, false, false, "密码密码密", shortOne},
+                {6, false, false, false, "密码密码密码", ""},
+                {0, true, true, false, "abc", cases + kinds},
+                {0, true, true, false, "123", cases + kinds},
+                {0, true, true, false, "ABC1", cases},
+                {0, true, true, false, "aB1", ""},
+                {0, false, false, true, "aB1", special},
+                {0, false, false, true, "", special},
+                {0, false, false, true, "aB 1", ""},
+                {0, false, false, true, "密", ""}};
+  for (const auto& [minLen, caseMixed, numCharMixed, hasSpecialChar, password, problems] : judged) {
+    safeRule rule;
+    rule.minLen(minLen);
+    rule.caseMixed(caseMixed);
+    rule.numCharMixed(numCharMixed);
+    rule.hasSpecialChar(hasSpecialChar);
+    EXPECT_EQ(rule.checkPwd(password), problems.empty()) << password;
+    EXPECT_EQ(rule.errDescription(), problems) << password;
+    EXPECT_TRUE(problems.empty() || rule.errNumber() == messageNumber(3000)) << password;
+  }
+}
+
+TEST(SafeRule, APolicyReadHalfWayIsNotJudgedBy) {
+  test::FakeServer server;
+  server.answer("select * from saferule where id=1",
+                {{{"minLen"}, {"maxDay"}, {"charSet"}}, {{Integer{6}, Integer{30}, "111"}}});
+  safeRule rule;
+  rule.connect("host");
+  EXPECT_FALSE(rule.GetOne());
+  EXPECT_TRUE(rule.checkPwd("")) << rule.errDescription();
+  EXPECT_EQ(rule.maxDay(), 0);
 }
 
 }  // namespace

@@ -85,15 +85,6 @@ TEST_F(Backups, AreRefusedWhereAFileIsMissing) {
   EXPECT_EQ(manager_.errDescription().rfind("Database backup error.Cannot open backup device", 0), 0U);
 }
 
-TEST_F(Backups, NeedTheAdministratorToRestore) {
-  backUp();
-  EXPECT_EQ(refusal(manager_, manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), "wrong")), number::login);
-  EXPECT_EQ(manager_.errDescription(), "Login failed for user 'sa'.:18456");
-  EXPECT_FALSE(manager_.RestoreDB(server(), file("sys.bak"), file("app.bak"), defaultDbPwd(), false, "QVUser"));
-  EXPECT_EQ(manager_.errDescription(), "User does not have permission to RESTORE database 'QVSys'.:3110");
-  EXPECT_EQ(tables_.text("select count(*) from users"), "1") << "and the database is back for all";
-}
-
 TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
   backUp("lock");
   EXPECT_EQ(spec(), "-") << "without reports there is nothing to lock";
@@ -186,12 +177,6 @@ TEST_F(Backups, LeaveTheDatabaseToAllWhereARestoreFails) {
     EXPECT_EQ(manager_.errDescription(), "Made up.:911");
     EXPECT_EQ(recorder.log().at(recorder.log().size() - 2), "alter database QVSys set MULTI_USER");
   }
-}
-
-TEST(ARotatedKey, BeginsAtTheStartThatIsForcedIntoItsRange) {
-  const String all(secrets::rotatedKeyCharacters.begin(), secrets::rotatedKeyCharacters.end());
-  const std::pair<Integer, std::size_t> cases[] = {{0, 0}, {3, 3}, {9, 9}, {-1, 0}, {12, 9}};
-  for (const auto& [start, first] : cases) EXPECT_EQ(rotatedKey(start), all.substr(first) + all.substr(0, first));
 }
 
 // A host that is not the administrator's hears which file it is; the administrator gets his backup in.

@@ -109,12 +109,5 @@ TEST_F(AgentInformation, TellsTheReleasesAndTheHiddenReports) {
   EXPECT_EQ(third.buildNo(), "") << "one part is no release to compare";
 }
 
-TEST_F(AgentInformation, RaisesWhatStopsItsConnectionAndReportsTheRest) {
-  QVAgent agent;
-  EXPECT_EQ(failureOf([&] { agent.connect(server() + "-gone"); }), number::general);
-  EXPECT_EQ(agent.newFiles(), -1);
-  EXPECT_EQ(agent.errNumber(), number::general);
-}
-
 }  // namespace
 }  // namespace QVSa::test

@@ -1,17 +1,17 @@
 #include <algorithm>
+#include <cctype>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <gtest/gtest.h>
 #include <iterator>
-#include <limits>
 #include <sys/mman.h>
 
-#include "providers/embedded/storage/Pool.h"
+#include "QVSa/values/Failure.h"
 #include "tests/embedded/ChildProcess.h"
+#include "tests/faults/Ground.h"
+#include "tests/faults/Operations.h"
 #include "tests/memory/FailingAllocator.h"
-#include "tests/memory/Operations.h"
-#include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {
 
@@ -23,13 +23,19 @@ using embedded::ChildProcess;
 enum class Process { cold, warm };
 
 struct Case {
-  MemoryOperation operation;
+  const char* operation;
   Process process;
   Shortage shortage;
 };
 
+const Operation& operationOf(const Case& tried) {
+  return *std::ranges::find_if(operations(), [&](const auto& one) { return String(one.name) == tried.operation; });
+}
+
 std::string nameOf(const Case& tried) {
-  return std::string(tried.operation.name) + (tried.process == Process::cold ? "Cold" : "Warm") +
+  std::string name = tried.operation;
+  std::erase_if(name, [](char c) { return std::isalnum(static_cast<unsigned char>(c)) == 0; });
+  return name + (tried.process == Process::cold ? "Cold" : "Warm") +
          (tried.shortage == Shortage::once ? "Once" : "Lasting");
 }
 
@@ -37,7 +43,9 @@ void PrintTo(const Case& tried, std::ostream* out) { *out << nameOf(tried); }
 
 std::vector<Case> cases() {
   std::vector<Case> result;
-  for (const auto& operation : memoryOperations())
+  for (const char* operation : {"Home.connect", "User.loginAuth", "User.loginAuth with a wrong password", "User.chgPwd",
+                                "User.Save", "IdMgr.newId for a record", "LogRecords.Add", "LogRecords.saveLog",
+                                "DBMgr.BackUpDB with a lock", "DBMgr.RestoreDB"})
     for (const Process process : {Process::cold, Process::warm})
       for (const Shortage shortage : {Shortage::once, Shortage::lasting})
         result.push_back({operation, process, shortage});
@@ -46,54 +54,48 @@ std::vector<Case> cases() {
 
 // What a child tells its parent, also where it dies.
 struct Told {
+  std::size_t tablesBefore, countsBehind;  // of an undisturbed call
+  bool writes;
   std::size_t tried;
   char complaint[1000];
 };
+
+std::size_t markOf(const Lines& lines) {
+  std::string all;
+  for (const String& line : lines) all += line + '\n';
+  return std::hash<std::string>()(all);
+}
 
 Told& told() {
   static void* const shared = ::mmap(nullptr, sizeof(Told), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
   return *static_cast<Told*>(shared);
 }
 
-// Empty where a call that was short of memory kept its word.
-std::string complaintOf(const Call& call, long first, Shortage shortage) {
-  bool positive = false;
-  bool left = false;
-  {
-    const FailingAllocations failing(first, shortage);
-    try {
-      positive = call.run();
-    } catch (...) {
-      left = true;
-    }
-  }
-  if (left) return "an exception left it";
-  if (positive && !call.isTrue()) return "True that is not so";
-  if (!positive && (call.errNumber() != number::memory || !call.errDescription().ends_with("Out of memory")))
-    return "it reads as " + std::to_string(call.errNumber()) + ": " + call.errDescription();
-  return call.isWhole() ? "" : "something is half done";
-}
-
-std::string complaintOf(const Call& undisturbed) {
-  if (!undisturbed.run())
-    return "the next call fails: " + std::to_string(undisturbed.errNumber()) + ": " + undisturbed.errDescription();
-  return undisturbed.isTrue() && undisturbed.isWhole() ? "" : "the next call is wrong";
-}
-
 // Everything happens in children of a process that has used nothing of the library itself.
 class WantOfMemory : public testing::TestWithParam<Case> {
  protected:
   WantOfMemory() {
-    std::filesystem::copy(ground(), folder_.path());
     told() = {};
+    filled();  // once, and not by each child
+    ChildProcess undisturbed([] {
+      const Ground ground(filled());
+      told().tablesBefore = markOf(ground.tables());
+      const bool done = operationOf(GetParam()).prepare(ground.server())().positive;
+      told().countsBehind = markOf(ground.counts());
+      told().writes = markOf(ground.tables()) != told().tablesBefore;
+      return done ? 0 : 1;
+    });
+    EXPECT_EQ(undisturbed.exitCode(), 0) << "the operation does not work";
   }
 
   // The numbers of the allocations that ask for memory from different places.
   std::vector<long> places() const {
-    const std::filesystem::path file = folder_.path() / "places";
+    const TestFolder folder;
+    const std::filesystem::path file = folder.path() / "places";
     ChildProcess child([&] {
-      warmUp();
-      const Call undisturbed = call();
+      const Ground ground(filled());
+      warmUp(ground);
+      const Call undisturbed = operationOf(GetParam()).prepare(ground.server());
       startNoting();
       const bool done = undisturbed.run();
       const std::vector<long> allocations = stopNoting();
@@ -111,10 +113,8 @@ class WantOfMemory : public testing::TestWithParam<Case> {
   bool tryNext(const std::vector<long>& allocations) {
     told().complaint[0] = '\0';
     ChildProcess child([&] {
-      warmUp();
       do {
-        std::string complaint = complaintOf(call(), allocations[told().tried], GetParam().shortage);
-        if (complaint.empty()) complaint = complaintOf(call());
+        const std::string complaint = complaintOf(allocations[told().tried]);
         std::strncpy(told().complaint, complaint.c_str(), sizeof told().complaint - 1);
         if (!complaint.empty()) return 1;
         ++told().tried;
@@ -130,12 +130,11 @@ class WantOfMemory : public testing::TestWithParam<Case> {
   }
 
  private:
-  static const std::filesystem::path& ground() {
+  static const std::filesystem::path& filled() {
     static const TestFolder folder;
     static const int made = ChildProcess([] {
                               const TestInstallation installation;
-                              fillMemoryGround(installation.server());
-                              embedded::discardIdleHandle(installation.folder());
+                              fillGround(installation);
                               std::filesystem::copy(installation.folder(), folder.path());
                               return 0;
                             }).exitCode();
@@ -143,14 +142,39 @@ class WantOfMemory : public testing::TestWithParam<Case> {
     return folder.path();
   }
 
-  Call call() const { return GetParam().operation.call("file:" + folder_.path().string()); }
-
-  void warmUp() const {
-    if (GetParam().process == Process::warm && !complaintOf(call()).empty())
-      throw std::logic_error("the operation does not work");
+  // The handle that a session leaves behind is kept for the next one.
+  static void warmUp(const Ground& ground) {
+    if (GetParam().process == Process::warm) static_cast<void>(ground.counts());
   }
 
-  TestFolder folder_;
+  // Empty where a call that was short of memory kept its word.
+  static std::string complaintOf(long first) {
+    const Ground ground(filled());
+    warmUp(ground);
+    const Call call = operationOf(GetParam()).prepare(ground.server());
+    bool positive = false;
+    {
+      const FailingAllocations failing(first, GetParam().shortage);
+      try {
+        positive = call.run();
+      } catch (...) {
+        return "an exception left it";
+      }
+    }
+    if (!positive && (call.errNumber() != number::memory || !call.errDescription().ends_with("Out of memory")))
+      return "it reads as " + std::to_string(call.errNumber()) + ": " + call.errDescription();
+    return complaintOfTables(ground, call, positive);
+  }
+
+  static std::string complaintOfTables(const Ground& ground, const Call& call, bool positive) {
+    const bool hasWritten = markOf(ground.tables()) != told().tablesBefore;
+    const bool isWhole = hasWritten == told().writes && markOf(ground.counts()) == told().countsBehind;
+    if (positive) return isWhole ? "" : "True that is not so";
+    // What was committed before stays, as where a statement fails.
+    if (hasWritten) return "";
+    if (!call.run()) return "the next call fails: " + call.errDescription();
+    return markOf(ground.counts()) == told().countsBehind ? "" : "the next call is wrong";
+  }
 };
 
 // So many as QVSA_ALLOCATIONS says, or "all", at even distances.

@@ -54,12 +54,6 @@ TEST_F(DepartmentTree, AMoveOrANewNameGoesThroughAllThatLiesBelow) {
   EXPECT_EQ(tree()[2], "H|.1.4.5.|West-Hub");
 }
 
-TEST_F(DepartmentTree, AMoveBelowItselfIsNotRefused) {
-  move("S", "H");
-  EXPECT_EQ(tree(), (Lines{"S|.1.3.4.5.3.|Sales-East-Hub-Sales", "E|.1.3.4.5.3.4.|Sales-East-Hub-Sales-East",
-                           "H|.1.3.4.5.3.4.5.|Sales-East-Hub-Sales-East-Hub", "W|.1.6.|Works"}));
-}
-
 TEST_F(DepartmentTree, ARefusedSaveChangesNothing) {
   const Lines before = tree();
   auto empty = connected<Department>();

@@ -62,12 +62,6 @@ TEST_F(DepartmentsTest, ASubtreeIsFoundByTheInnerIdsInItsPaths) {
   EXPECT_EQ(departments_.Count(), 0);
 }
 
-TEST_F(DepartmentsTest, ANumberThatStandsTwiceEndsTheTree) {
-  tables_.run("update departments set deptNo='S' where deptNo='H'");
-  EXPECT_EQ(refusal(departments_, departments_.GetAll()), number::keyExists);
-  EXPECT_EQ(numbers(departments_), (Lines{"_root", "S", "E"}));
-}
-
 TEST_F(DepartmentsTest, TheRootsFailForTheColumnThatTheirStatementLacks) {
   EXPECT_EQ(refusal(departments_, departments_.GetRoot()), number::noField);
   EXPECT_EQ(departments_.Count(), 0);

@@ -150,19 +150,6 @@ TEST_F(UsersTest, TheGridStandsByItselfUntilTheNextOneReplacesIt) {
   EXPECT_EQ(grid["Remark"].asText(), "BuiltIn");
 }
 
-TEST_F(UsersTest, AUserInMemoryHoldsWhatHeWasGiven) {
-  const auto added = users_.Add("dan", "d", 9, "pw", "m", "e", "D", "Name", "Full-Name", true, true, true);
-  EXPECT_EQ(added->Id(), 9);
-  EXPECT_EQ(added->Login() + added->MobilePhone() + added->Email() + added->deptId() + added->deptName() +
-                added->deptFullName(),
-            "dmeDNameFull-Name");
-  EXPECT_TRUE(added->PwdNoChange());
-  EXPECT_FALSE(added->sendSms() || added->keyLogin());
-  EXPECT_EQ(test::failureOf([&] { users_.Add("DAN", "other"); }), number::keyExists);
-  EXPECT_TRUE(users_.Clear().isEmpty());
-  EXPECT_EQ(users_.Count(), 0);
-}
-
 TEST_F(UsersTest, SupervisionGoesByJobOrByPersonAndIsReplacedNotAdded) {
   auto ann = connected<User>(), bob = connected<User>(), cleo = connected<User>();
   ASSERT_TRUE(ann.GetOne(3, "ann") && bob.GetOne(3, "bob") && cleo.GetOne(3, "cleo"));

@@ -163,32 +163,6 @@ TEST_F(Contention, KilledProcessesLeaveNoLockAndTakeNoMoreThanTheNumberInTheirHa
   EXPECT_LE(all.size() - issued.size(), static_cast<std::size_t>(rounds * each));
 }
 
-TEST_F(Contention, WhoHoldsARowIsNotWaitedForAndItsDeathFreesTheRow) {
-  addRule("inv");
-  addRule("other");
-  auto rule = connected<IdMgr>();
-  EXPECT_EQ(rule.newId("inv"), "2024030700001");
-  auto holder = start(1, "hold", {"inv"});
-  go(holder);
-  ASSERT_EQ(holder.front().line(), "holding");
-  const auto before = std::chrono::steady_clock::now();
-  EXPECT_EQ(rule.newId("inv"), "");
-  EXPECT_EQ(rule.errNumber(), number::integrity);
-  EXPECT_LT(std::chrono::steady_clock::now() - before, std::chrono::seconds(10)) << "a third of the time-out";
-  EXPECT_EQ(rule.newId("other"), "2024030700001");
-  holder.front().kill();
-  EXPECT_EQ(rule.newId("inv"), "2024030700002") << rule.errDescription();
-
-  auto writer = start(1, "hold", {"inv", "written"});
-  go(writer);
-  ASSERT_EQ(writer.front().line(), "holding");
-  EXPECT_EQ(rule.newId("inv"), "") << "what is changed and not committed counts as held";
-  EXPECT_EQ(rule.errNumber(), number::integrity);
-  EXPECT_LT(std::chrono::steady_clock::now() - before, std::chrono::seconds(10));
-  writer.front().kill();
-  EXPECT_EQ(rule.newId("inv"), "2024030700003") << rule.errDescription();
-}
-
 TEST_F(Contention, ASignOnWhileTheLogIsClearedWaitsAndSucceeds) {
   addUser("ann");
   const PlainSession system(server(), "QVSys");

@@ -75,17 +75,6 @@ void issue(const Words& words) {
   writeLine("collisions " + std::to_string(collisions));
 }
 
-void hold(const Words& words) {
-  Connection connection;
-  connection.Open(buildConnString(words.at(0), "QVApp", false));
-  connection.BeginTrans();
-  connection.Execute("select maxId=max(maxId) from idRec with (rowlock xlock readpast) where idName='" + words.at(1) +
-                     "'");
-  if (words.size() > 2) connection.Execute("update idRec set maxId='half' where idName='" + words.at(1) + "'");
-  writeLine("holding");
-  ::pause();
-}
-
 void restore(const Words& words) {
   DBMgr manager;
   const bool done = manager.RestoreDB(words.at(0), words.at(1), words.at(2), words.at(3));
@@ -160,7 +149,6 @@ int doWork(const Words& words) {
   if (words.at(0) == "sign-on") signOn(arguments);
   if (words.at(0) == "guess") guess(arguments);
   if (words.at(0) == "issue") issue(arguments);
-  if (words.at(0) == "hold") hold(arguments);
   if (words.at(0) == "restore") restore(arguments);
   if (words.at(0) == "back-up") backUp(arguments);
   if (words.at(0) == "write") write(arguments);

@@ -12,8 +12,6 @@ namespace QVSa::test {
 //                                   answer than the two right ones, then "told" and how often it was not the lock
 //   issue SERVER RULE COUNT         asks for numbers until it has so many: a line for each, one with "collisions" and
 //                                   their count at the end, and one for each failure that is no clean collision
-//   hold SERVER RULE [written]      locks the rule's row as an issuer does, or has written to it too, without a
-//                                   commit; then "holding", and stays
 //   restore SERVER SYS APP PASSWORD restores the two files; "done", or the failure's number and text
 //   back-up SERVER SYS APP [SIZE]   backs up into the two files, on a disk that takes none above so many bytes; "done",
 //                                   or the failure's number and text

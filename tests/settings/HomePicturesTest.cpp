@@ -59,11 +59,6 @@ TEST_F(HomePicturesTest, AnEmptyFileSendsNothingAndAnEmptyPathClears) {
   EXPECT_FALSE(exists("LoginImage")) << "the local copy goes with the stored picture";
 }
 
-TEST_F(HomePicturesTest, AStoredPictureOfNoBytesBecomesAnEmptyFile) {
-  store("LoginImage=0x");
-  EXPECT_EQ(platform::readFile(fetched().LoginImageFile()).size(), 0U);
-}
-
 TEST_F(HomePicturesTest, AHomeThatFetchedThePicturesSendsThemBack) {
   Home home = connected<Home>();
   home.LoginImageFile(picture(5000));

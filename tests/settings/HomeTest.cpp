@@ -235,28 +235,5 @@ TEST_F(HomeTest, TheCountsOfTheSettingsScreenAreReadAtTheCall) {
   EXPECT_NE(nowhere.errNumber(), 0);
 }
 
-TEST_F(HomeTest, TheDirectoryIsAskedOnlyWhereItIsEnabled) {
-  String asked;
-  replace(&platform::Services::getUsersFromLD,
-          {[&](const platform::DirectoryQuery& query, const String& password, Integer& status) {
-            asked = query.host + " " + text(query.port) + " " + query.bindDn + " " + password + " " + query.searchText;
-            status = platform::directoryDone;
-            return String("a list");
-          }});
-  Home home = connected<Home>();
-  home.ldHost("box");
-  home.ldBindDN("cn=service");
-  home.ldPasswd("abc");
-  home.ldBaseDN("dc=example");
-  String items = "left over";
-  EXPECT_EQ(home.getUsersFromLDS(items), 3);
-  EXPECT_EQ(items, "");
-  EXPECT_EQ(asked, "");
-  home.ldEnabled(true);
-  EXPECT_EQ(home.getUsersFromLDS(items), 0);
-  EXPECT_EQ(items, "a list");
-  EXPECT_EQ(asked, "box 389 cn=service abc dc=example");
-}
-
 }  // namespace
 }  // namespace QVSa

@@ -5,12 +5,11 @@
 
 #include "QVSa/values/Text.h"
 #include "platform/Services.h"
-#include "providers/embedded/storage/Pool.h"
+#include "tests/faults/Ground.h"
 #include "tests/faults/Operations.h"
 #include "tests/support/EnvironmentLocale.h"
 #include "tests/support/FakeClock.h"
 #include "tests/support/RecordingProvider.h"
-#include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {
 namespace {
@@ -24,9 +23,8 @@ String withoutChance(String text) {
 
 // The events of an operation, on a copy of the filled installation.
 String eventsOf(const Operation& operation, const std::filesystem::path& filled) {
-  const TestFolder folder;
-  std::filesystem::copy(filled, folder.path());
-  const auto call = operation.prepare("file:" + folder.path().string());
+  const Ground ground(filled);
+  const Call call = operation.prepare(ground.server());
   const RecordingProvider recorder;
   EXPECT_TRUE(call().positive) << operation.name;
   String events;
@@ -55,9 +53,7 @@ TEST(Statements, OfEveryOperationAreThoseOfTheTable) {
   const EnvironmentLocale english("C");
   const FakeClock clock(Date(2024, 3, 7, 10, 0, 0));
   const TestInstallation installation;
-  fillGround(installation.server());
-  // Closes the files, which brings all of the content into them.
-  embedded::discardIdleHandle(installation.folder());
+  fillGround(installation);
 
   const auto table = readTable(QVSA_SOURCE_DIR "/tests/statements/statements.txt");
   std::ofstream actual("statements.actual");

@@ -45,20 +45,9 @@ TEST(Lexer, tells_numbers_apart_by_what_they_fit) {
   EXPECT_EQ(tokensOf("0xFF0 0x"), "b:FF0 b:");
 }
 
-TEST(Lexer, undoes_doubled_quotes_and_keeps_what_looks_like_a_comment_inside) {
-  EXPECT_EQ(tokensOf("'O''Brien' N'' '--' '/*'"), "s:O'Brien s: s:-- s:/*");
-}
-
 TEST(Lexer, takes_comments_for_blanks) {
   EXPECT_EQ(tokensOf("a--b\nc/* d /* e */ f */g -- end"), "w:a w:c w:g");
   EXPECT_EQ(tokensOf("a-b - -c"), "w:a - w:b - - w:c");
-}
-
-TEST(Lexer, knows_the_old_outer_joins_from_stars_beside_equals) {
-  EXPECT_EQ(tokensOf("d1.superDept*=d2.deptId"), "w:d1 . w:superDept *= w:d2 . w:deptId");
-  EXPECT_EQ(tokensOf("a=*b"), "w:a =* w:b");
-  EXPECT_EQ(tokensOf("count(*)=1"), "w:count ( * ) = i:1");
-  EXPECT_EQ(tokensOf("a!=b!<c!>d<>e"), "w:a <> w:b >= w:c <= w:d <> w:e");
 }
 
 TEST(Lexer, makes_one_token_of_a_list_of_literals) {

@@ -1,9 +1,6 @@
-// Runs the data-driven cases: recorded ones of another T-SQL server, and the project's own. A line of its own is a
-// batch to be taken: one that begins with a number and a colon is refused by that number, or by one of several; behind
-// an arrow stand the rows, a semicolon between two, or "none". Longer cases have the recorded ones' form.
+#include "tests/support/Cases.h"
 
 #include <algorithm>
-#include <filesystem>
 #include <fstream>
 #include <gtest/gtest.h>
 #include <regex>
@@ -12,7 +9,6 @@
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/values/Text.h"
 #include "providers/embedded/session/Provider.h"
-#include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {
 
@@ -124,14 +120,16 @@ void runCase(ProviderSession& session, const Case& expected) {
   }
 }
 
-void runFolder(const std::filesystem::path& folder) {
+}  // namespace
+
+void runCases(const std::filesystem::path& folder, TestInstallation::Content content) {
   std::vector<std::filesystem::path> files;
   for (const auto& entry : std::filesystem::directory_iterator(folder))
     if (entry.path().extension() == ".test") files.push_back(entry.path());
   std::ranges::sort(files);
   std::size_t count = 0;
   for (const auto& file : files) {
-    const TestInstallation installation(TestInstallation::Content::empty);
+    const TestInstallation installation(content);
     const auto session =
         embedded::provider().open(parseConnectionString(buildConnString(installation.server(), "QVSys", false)));
     for (const auto& expected : casesOf(file)) {
@@ -141,16 +139,5 @@ void runFolder(const std::filesystem::path& folder) {
   }
   EXPECT_GT(count, 0U) << "no case in the folder";
 }
-
-}  // namespace
-
-TEST(TheEngine, AnswersAsTheRecordedServerDid) {
-  const std::filesystem::path recorded = std::filesystem::path(QVSA_SOURCE_DIR) / ".." / "shared" / "tsql";
-  if (!std::filesystem::is_directory(recorded))
-    GTEST_SKIP() << "the recorded cases are not here; the project's own cases stand alone";
-  runFolder(recorded);
-}
-
-TEST(TheEngine, AnswersTheProjectsOwnCases) { runFolder(std::filesystem::path(QVSA_SOURCE_DIR) / "tests" / "tsql"); }
 
 }  // namespace QVSa::test

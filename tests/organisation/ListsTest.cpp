@@ -1,7 +1,59 @@
+#include "QVSa/frame/Collection.h"
 #include "tests/organisation/Company.h"
+#include "tests/support/Failures.h"
 
 namespace QVSa {
 namespace {
+
+using test::failureOf;
+using test::names;
+
+TEST(CollectionTest, WhatIsNotThereIsNoObjectForItemAndAFailureForRemove) {
+  userGroups groups;
+  groups.Add("one");
+  for (const Variant& index : {Variant(Long{0}), Variant(Long{2}), Variant("1"), Variant::null()})
+    EXPECT_EQ(groups.Item(index), nullptr);
+  EXPECT_EQ(groups.errNumber(), 0);
+  EXPECT_EQ(failureOf([&] { groups.Remove(Long{2}); }), number::position);
+  EXPECT_EQ(failureOf([&] { groups.Remove("1"); }), number::argument);
+  EXPECT_EQ(groups.errNumber(), 0);
+  EXPECT_TRUE(groups.Remove("ONE").isEmpty());
+  EXPECT_EQ(groups.Count(), 0);
+  groups.Add("one");
+}
+
+TEST(CollectionTest, ACollectionThatOutgrewItsCounterCanNoLongerBeEmptied) {
+  Users users;
+  for (int i = 0; i < 32'767; ++i) users.Add(std::to_string(i), "");
+  EXPECT_EQ(users.Count(), 32'767);
+  users.Add("one more", "");
+  EXPECT_EQ(failureOf([&] { users.Count(); }), number::overflow);
+  EXPECT_EQ(failureOf([&] { users.Clear(); }), number::overflow);
+  EXPECT_FALSE(users.GetAll());
+  EXPECT_EQ(users.errNumber(), number::overflow);
+  EXPECT_EQ(users.errDescription(), "Error in listing users Overflow");
+  EXPECT_NE(users.Item("one more"), nullptr);
+}
+
+class ListsTest : public test::Company {};
+
+TEST_F(ListsTest, AListThatMeetsAKeyTwiceFailsAndKeepsWhatItHad) {
+  Role second = addRole("Second");
+  second.Name("MANAGER");
+  ASSERT_TRUE(second.Save()) << "only an insert looks whether the name is taken";
+  auto roles = connected<Roles>();
+  EXPECT_EQ(refusal(roles, roles.GetAll()), number::keyExists);
+  EXPECT_EQ(roles.errDescription(),
+            "Error in getting all roles. This key is already associated with an element of this collection");
+  EXPECT_EQ(roles.Count(), 7);
+
+  addUser("twin", "E");
+  tables_.run(
+      "insert into users(userName,userLogin,deptId) select userName,'other',deptId from users where userName='twin'");
+  auto users = connected<Users>();
+  EXPECT_FALSE(users.GetAllOfTheDept(0));
+  EXPECT_EQ(names(users), (test::Lines{"Administrator", "twin"}));
+}
 
 // Texts that would break a statement, an XML text or a pattern which does not hold them apart from its own signs.
 const String hardTexts[] = {"O'Brien''s",
@@ -50,20 +102,6 @@ TEST_F(HardTextsTest, ARoleAGroupAndADepartmentAreFoundByThemAgain) {
   EXPECT_EQ(tables_.text("select count(*) from roles where builtIn=1"), "6");
   auto groups = connected<userGroups>();
   EXPECT_TRUE(groups.GetAll()) << groups.errDescription();
-}
-
-TEST_F(HardTextsTest, ATextOfFourThousandCharactersIsRefusedWhereItsColumnIsShorter) {
-  const String longText(4000, 'x');
-  auto role = connected<Role>();
-  role.Name(longText);
-  EXPECT_EQ(refusal(role, role.Save()), number::range);
-  tables_.run("update departments set fullName='Sales-East-'+replicate('x',3985) where deptNo='H'");
-  const test::Lines before = tree();
-  Department sales = department("S");
-  sales.Name("Sales and more");
-  EXPECT_EQ(refusal(sales, sales.Save()), number::range) << "too long a full name, two levels below";
-  EXPECT_EQ(tree(), before);
-  EXPECT_EQ(refusal(role, role.GetOne(2, longText)), messageNumber(1201));
 }
 
 TEST_F(HardTextsTest, ATokenInACallersOwnSqlIsNone) {
