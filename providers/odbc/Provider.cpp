@@ -3,6 +3,7 @@
 #include <cstdlib>
 #include <unistd.h>
 
+#include "providers/ServerDriver.h"
 #include "providers/odbc/Driver.h"
 #include "providers/odbc/Session.h"
 
@@ -35,5 +36,7 @@ Provider& provider() {
   static auto& instance = *new OdbcProvider();
   return instance;
 }
+
+String serverDriver() { return systemAccess().driver.name; }
 
 }  // namespace QVSa::odbc

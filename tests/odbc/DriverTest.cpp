@@ -1,6 +1,7 @@
 #include <cstdlib>
 #include <fstream>
 #include <gtest/gtest.h>
+#include <sstream>
 
 #include "platform/ServerSettings.h"
 #include "providers/odbc/Driver.h"
@@ -90,6 +91,16 @@ TEST(ConnectionText, RefusesWhatWouldSmuggleInASettingAndWhatIsNoPort) {
   hidden.password = "x};Server={db2";
   EXPECT_THROW(connectionText(hidden, access("FreeTDS")), Failure);
   EXPECT_NE(connectionText(hidden, access("Other")).find("PWD={x}};Server={db2};"), String::npos);
+}
+
+TEST(Access, StandsInTheDocumentAsItIs) {
+  std::stringstream document;
+  document << std::ifstream(QVSA_SOURCE_DIR "/docs/sql-server.md").rdbuf();
+  for (const auto& setting : platform::serverSettings) {
+    const String standard = *setting.standard == '\0' ? "" : String("`") + setting.standard + "` ";
+    const String row = String("| `") + setting.name + "` | `" + setting.variable + "` | " + standard + "|";
+    EXPECT_NE(document.str().find(row), String::npos) << row;
+  }
 }
 
 TEST(Access, IsWhatTheNearestPlaceSays) {
