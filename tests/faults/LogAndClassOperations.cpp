@@ -3,10 +3,17 @@
 #include "platform/SecretMessage.h"
 #include "tests/faults/Shapes.h"
 #include "tests/support/PlainSession.h"
+#include "tests/support/TestInstallation.h"
 
 namespace QVSa::test {
 
 namespace {
+
+// Each run of a test writes the same file.
+String logFile() {
+  static const TestFolder folder;
+  return (folder.path() / "log.txt").string();
+}
 
 bool queryLog(LogRecords& log) {
   std::vector<Variant> values{Date::empty(), Date::empty(), "", "ann", "", ""};
@@ -21,8 +28,7 @@ std::vector<Operation> logOperations() {
       on<LogRecords>("LogRecords.GetAll", told(1702),
                      [](auto& log) { return log.GetAll(1, Date::empty(), Date::empty(), 0, "", "", "", 0, 2); }),
       on<LogRecords>("LogRecords.GetLogByQuery", told(1702), queryLog),
-      on<LogRecords>("LogRecords.saveLog", told(1704),
-                     [](auto& log, const String& server) { return log.saveLog(server.substr(5) + "/log.txt"); }),
+      on<LogRecords>("LogRecords.saveLog", told(1704), [](auto& log) { return log.saveLog(logFile()); }),
       on<LogRecords>("LogRecords.clearLog", told(1703), [](auto& log) { return log.clearLog(); }),
   };
 }

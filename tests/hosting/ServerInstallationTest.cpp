@@ -2,8 +2,11 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/hosting/ServerInstallation.h"
+#include "QVSa/identity/User.h"
 #include "database/Scripts.h"
 #include "providers/tsql/Parser.h"
+#include "tests/support/TestInstallation.h"
+#include "tests/support/TestServer.h"
 
 namespace QVSa {
 namespace {
@@ -33,6 +36,19 @@ TEST(ServerInstallation, WritesAScriptWhoseDatabasesAreFilledAsAWhole) {
     EXPECT_EQ(batches[place + 2], "commit transaction");
     EXPECT_EQ(batches[place + 3], "set noexec off");
   }
+}
+
+TEST(ServerInstallation, IsLeftAloneByWhoMakesItAgain) {
+  if (!test::onServer()) GTEST_SKIP() << "no server";
+  const test::TestInstallation installation;
+  User admin;
+  const auto& server = test::TestServer::instance();
+  ServerInstallation again;
+  for (const char* password : {"Adm1n-first", "Adm1n-second"})
+    EXPECT_TRUE(again.make(server.server(), "sa", server.administratorPassword(), password)) << again.errDescription();
+  ASSERT_TRUE(admin.connect(server.server()));
+  EXPECT_FALSE(admin.loginAuth("Admin", "Adm1n-second"));
+  EXPECT_TRUE(admin.loginAuth("Admin", "Adm1n-first")) << admin.errDescription();
 }
 
 }  // namespace
