@@ -8,7 +8,7 @@ JOBS ?= $(shell nproc)
 export CTEST_PARALLEL_LEVEL ?= $(JOBS)
 say = @printf '\n== %s\n'
 
-.PHONY: help packages build demo test test-long mutate sanitize bench fuzz docs format lint clean
+.PHONY: help packages build demo test test-server test-long mutate sanitize bench fuzz docs format lint clean
 
 help:  ## List the targets
 	@grep -hE '^[a-z-]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
@@ -33,6 +33,13 @@ test: build  ## Build and run all tests, then the quick ones once more under the
 	@red=0; ctest --preset release || red=1; \
 	  $(MAKE) sanitize BUILD='--target quick_tests' TESTS='-LE slow' || red=1; \
 	  exit $$red
+
+test-server: packages  ## Test against a SQL Server: SERVER=host,port, the password of its sa in QVSA_TEST_PASSWORD
+	@: "$${QVSA_TEST_PASSWORD:?the password of sa is wanted there}" '$(if $(SERVER),,$(error SERVER=host,port is wanted))'
+	@cmake --preset release --log-level=NOTICE
+	@cmake --build --preset release -j $(JOBS) --target server_tests
+	$(say) 'Testing against $(SERVER)'
+	@QVSA_TEST_SERVER='$(SERVER)' ctest --preset release -L server -j 1
 
 test-long: build  ## Run every allocation of the operations out of memory, and not a sample of them
 	$(say) 'Testing want of memory'

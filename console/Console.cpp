@@ -6,6 +6,7 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/hosting/SafeTexts.h"
+#include "QVSa/hosting/ServerAccess.h"
 #include "QVSa/values/Failure.h"
 
 namespace QVSa::console {
@@ -17,6 +18,14 @@ constexpr const char* filePrefix = "file:";
 String variable(const char* name) {
   const char* value = std::getenv(name);
   return value == nullptr ? "" : value;
+}
+
+void tellSetting(const String& name, const String& value) {
+  try {
+    setServerAccess(name, value);
+  } catch (const Failure& failure) {
+    throw CLI::ValidationError(failure.description());
+  }
 }
 
 String dump(const Json& document) { return document.dump(2, ' ', false, Json::error_handler_t::replace); }
@@ -41,7 +50,16 @@ Console::Console() : app_("Manages the organisation, its people, their sessions 
       ->envname("QVSA_SERVER")
       ->default_str("file:" + ownFolder());
   app_.add_option("--database", place_.database, "The database to work in")->capture_default_str();
+  addServerSettings();
   app_.add_flag("--json", json_, "One JSON document in place of the text");
+}
+
+void Console::addServerSettings() {
+  for (const ServerSetting& setting : serverAccessNames())
+    app_.add_option_function<String>(
+            "--" + setting.name, [name = setting.name](const String& value) { tellSetting(name, value); },
+            setting.meaning)
+        ->group("SQL Server");
 }
 
 void Console::command(CLI::App* subcommand, std::function<Answer()> run) {

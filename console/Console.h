@@ -37,6 +37,7 @@ class Console {
   }
 
  private:
+  void addServerSettings();
   void print(const Answer& answer) const;
   int refuse(const String& description, Long number) const;
 

@@ -19,5 +19,7 @@ create table updateInfo (
   version nvarchar(20) null,
   build nvarchar(50) null
 )
+go
+
 insert into updateInfo (version, build) values ('8.1', '1')
 go

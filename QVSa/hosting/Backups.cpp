@@ -45,7 +45,9 @@ Boolean Backups::isLocked(Boolean& locked) {
 
 void Backups::nameFiles(const String& folder) {
   require(isPlainPath(folder), "The path of a backup must hold no quote.");
-  const String separator = isFolder(serverOnly(server())) ? "/" : "\\";
+  // A server's paths are parted as its system does it, which the caller knows.
+  const bool hasSlashes = isFolder(serverOnly(server())) || folder.find('/') != String::npos;
+  const String separator = hasSlashes ? "/" : "\\";
   sysFile_ = folder + separator + "sys.bak";
   appFile_ = folder + separator + "app.bak";
 }

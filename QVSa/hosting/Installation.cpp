@@ -2,7 +2,7 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/frame/DeploymentSecrets.h"
-#include "QVSa/identity/User.h"
+#include "QVSa/hosting/internal/FirstAdministrator.h"
 #include "database/Scripts.h"
 #include "providers/Installation.h"
 
@@ -33,17 +33,6 @@ Boolean Installation::make(const String& folder, const String& adminPassword, co
     embedded::createInstallation(plan);
     return true;
   });
-}
-
-// The first row of the administrator is locked and without a password; his first save opens it.
-void Installation::setAdministratorsPassword(const String& server, const String& password) {
-  constexpr const char* job = "1";
-  User admin;
-  const Boolean loaded = admin.connect(server) && admin.GetOne(User::byLogin, "Admin");
-  admin.Pwd(password);
-  admin.regState(accountNormal);
-  admin.setJobs(job);
-  if (!loaded || !admin.Save()) throw Failure(admin.errNumber(), "Installation", admin.errDescription());
 }
 
 Boolean Installation::canLieIn(const String& folder) { return serverOf(folder).find_first_of(";|'\\") == String::npos; }

@@ -29,9 +29,6 @@ class Installation : private Frame {
   static String serverOf(const String& folder);
   // Whether this build uses the deployment secrets that come with the source, which everybody knows.
   static Boolean hasBuiltInSecrets();
-
- private:
-  static void setAdministratorsPassword(const String& server, const String& password);
 };
 
 }  // namespace QVSa

@@ -1,4 +1,6 @@
 #include "QVSa/hosting/Installation.h"
+#include "QVSa/hosting/ServerAccess.h"
+#include "QVSa/hosting/ServerInstallation.h"
 #include "QVSa/identity/Sessions.h"
 #include "QVSa/identity/User.h"
 #include "QVSa/identity/safeRule.h"
@@ -107,12 +109,41 @@ void checkAdministrator(const Console& console, Findings& findings) {
     findings.good(point);
 }
 
+// How this machine reaches the server, and what is weaker than it need be.
+void checkAccess(Findings& findings) {
+  for (const ServerSetting& setting : serverAccess()) {
+    const String point = "Setting " + setting.name;
+    const String detail = setting.value + " (" + setting.source + ")";
+    const bool isClear = setting.name == "encryption" && setting.value != "required";
+    if (isClear)
+      findings.warn(point, detail + ": passwords may travel in clear");
+    else
+      findings.good(point, detail);
+  }
+}
+
+// Keys and names are compared by the database.
+void checkCase(const String& server, const String& database, Findings& findings) {
+  const String point = "Texts of " + database + " without regard to case";
+  ServerInstallation installation;
+  if (installation.ignoresCase(server, database))
+    findings.good(point);
+  else if (installation.errNumber() == 0)
+    findings.bad(point, "its collation heeds case");
+  else
+    findings.failed(point, installation);
+}
+
 Answer doctor(const Console& console) {
   Findings findings;
+  const String& server = console.place().server;
+  if (!folderOf(server)) {
+    checkAccess(findings);
+    for (const char* database : {"QVSys", "QVApp"}) checkCase(server, database, findings);
+  }
   checkPolicy(console, findings);
   checkSessions(console, findings);
   for (const char* number : {"_root", "_out"}) checkDepartment(console, findings, number);
-  const String& server = console.place().server;
   checkRule(server, "QVSys", findings, "_ses");
   for (const char* name : {"_log", "_RC"}) checkRule(server, console.place().database, findings, name);
   checkAdministrator(console, findings);

@@ -1,10 +1,14 @@
 #include <filesystem>
 #include <memory>
+#include <sys/stat.h>
 
+#include "QVSa/frame/ConnectionString.h"
 #include "QVSa/hosting/Installation.h"
+#include "QVSa/hosting/ServerInstallation.h"
 #include "console/Commands.h"
 #include "console/Passwords.h"
 #include "console/Table.h"
+#include "platform/Files.h"
 
 namespace QVSa::console {
 
@@ -12,6 +16,8 @@ namespace {
 
 struct Options {
   String folder;
+  String login = "sa";
+  String script;
   bool makePasswords = false;
 };
 
@@ -28,11 +34,8 @@ Chosen choose(const String& whose, bool makeUp) {
 }
 
 String targetFolder(const Console& console, const Options& options) {
-  if (!options.folder.empty()) return std::filesystem::absolute(options.folder).lexically_normal().string();
-  const auto folder = folderOf(console.place().server);
-  if (!folder)
-    throw Misuse("An installation is made in a folder: name one, or a --server of the form \"file:FOLDER\".");
-  return *folder;
+  if (options.folder.empty()) return *folderOf(console.place().server);
+  return std::filesystem::absolute(options.folder).lexically_normal().string();
 }
 
 Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
@@ -54,9 +57,10 @@ Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
   return answer;
 }
 
-Answer init(const Console& console, const Options& options) {
+Answer initFolder(const Console& console, const Options& options) {
   const String folder = targetFolder(console, options);
   if (!Installation::canLieIn(folder)) throw Misuse("The path of an installation must hold none of ; | ' and \\.");
+  if (!options.script.empty()) throw Misuse("A script is for a server: name it with --server.");
   if (Installation::isThere(folder)) throw Refusal("There is an installation in " + folder + " already.");
   const Chosen admin = choose("Admin", options.makePasswords);
   const Chosen sa = choose("sa, the log-in that restores backups", options.makePasswords);
@@ -65,14 +69,50 @@ Answer init(const Console& console, const Options& options) {
   return answerOf(Installation::serverOf(folder), admin, sa);
 }
 
+Answer initServer(const String& server, const Options& options) {
+  ServerInstallation installation;
+  if (installation.isComplete(server)) throw Refusal("There is an installation on " + serverOnly(server) + " already.");
+  const String password = askPassword("Password of " + options.login + ", who may make databases and log-ins");
+  const Chosen admin = choose("Admin", options.makePasswords);
+  require(installation.make(server, options.login, password, admin.password), installation);
+  return answerOf(server, admin, {});
+}
+
+// A file of a script holds a password: nobody else may read it, which is no matter of the one that was there.
+Answer writeScript(const String& path, const String& script, const String& next) {
+  std::error_code error;
+  if (std::filesystem::is_regular_file(path, error)) throw Refusal("There is a file " + path + " already.");
+  ::umask(S_IRWXG | S_IRWXO);
+  platform::writeFile(path, Bytes(script.begin(), script.end()));
+  return {"The script is written to " + path + ".\n" + next, {{"script", path}}};
+}
+
+Answer init(const Console& console, const Options& options) {
+  const String& server = console.place().server;
+  if (!options.folder.empty() || folderOf(server)) return initFolder(console, options);
+  if (options.script.empty()) return initServer(server, options);
+  return writeScript(options.script, ServerInstallation::script(server),
+                     "It holds the password of QVUser. Run it as an administrator of the server, and `qvsa init` "
+                     "afterwards: it sets the password of Admin.\n");
+}
+
 }  // namespace
 
 void addInit(Console& console) {
   const auto options = std::make_shared<Options>();
-  CLI::App* command = console.app().add_subcommand("init", "Make an embedded installation in a folder");
+  CLI::App* command = console.app().add_subcommand("init", "Make an installation, in a folder or on a SQL Server");
   command->add_option("folder", options->folder, "The folder; by default the one of --server");
-  command->add_flag("--make-passwords", options->makePasswords, "Ask for no password, make both up");
+  command->add_flag("--make-passwords", options->makePasswords, "Ask for no new password, make them up");
+  command->add_option("--login", options->login, "Of a server: who makes it")->capture_default_str();
+  command->add_option("--script", options->script, "Of a server: write it to this file as T-SQL, make nothing");
   console.command(command, [&console, options] { return init(console, *options); });
+
+  CLI::App* upgrade = console.app().add_subcommand("upgrade", "Bring a server's databases to this release's layout");
+  upgrade->add_option("--script", options->script, "The file that the steps are written to, as T-SQL")->required();
+  console.command(upgrade, [options] {
+    return writeScript(options->script, ServerInstallation::upgradeScript(),
+                       "Run it as an administrator of the server. An embedded installation needs no such step.\n");
+  });
 }
 
 }  // namespace QVSa::console

@@ -1,56 +1,126 @@
 #include "providers/odbc/Connection.h"
 
-#include "providers/odbc/Environment.h"
-#include "providers/odbc/Failure.h"
+#include "providers/odbc/Pool.h"
 #include "providers/odbc/Rows.h"
+#include "providers/tsql/Printer.h"
 #include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::odbc {
 
-Connection::Connection(const String& odbcText, const String& password, std::chrono::seconds loginTimeout) {
-  if (!SQL_SUCCEEDED(SQLAllocHandle(SQL_HANDLE_DBC, environment(), &handle_))) {
-    throw failure(diagnostics(SQL_HANDLE_ENV, environment()));
+namespace {
+
+constexpr std::chrono::seconds ordinary{30};
+constexpr std::chrono::seconds unlimited{0};
+
+// The answer to the text that ended its last use is younger than this: the server is there.
+constexpr std::chrono::seconds fresh{1};
+
+}  // namespace
+
+Connection::Connection(Target target) : target_(std::move(target)) {
+  if (adoptKept()) return;
+  link_ = std::make_unique<Link>(target_.odbcText + target_.database, target_.password, target_.loginTimeout);
+}
+
+// Where the database can't be used any more, the attempt to open it afresh tells why.
+bool Connection::adoptKept() {
+  if (target_.keep.count() == 0) return false;
+  while (auto kept = Pool::instance().take(target_.identity)) {
+    link_ = std::move(kept->link);
+    if (!target_.databaseName.empty()) ahead_ = "use " + tsql::printName(target_.databaseName) + " ";
+    if (std::chrono::steady_clock::now() - kept->since < fresh) return true;
+    try {
+      if (ahead_.empty()) run("set nocount off", target_.loginTimeout);
+      sendAhead(target_.loginTimeout);
+      return true;
+    } catch (const Failure&) {
+      ahead_.clear();
+      keepable_ = true;
+      link_.reset();
+    }
   }
-  SQLSetConnectAttrW(handle_, SQL_ATTR_LOGIN_TIMEOUT, attributeValue(loginTimeout.count()), SQL_IS_UINTEGER);
-  std::u16string text = toWide(odbcText);
-  const SQLRETURN rc = SQLDriverConnectW(handle_, nullptr, wideData(text), static_cast<SQLSMALLINT>(text.size()),
-                                         nullptr, 0, nullptr, SQL_DRIVER_NOPROMPT);
-  if (SQL_SUCCEEDED(rc)) return;
-  const Failure refused = connectFailure(diagnostics(SQL_HANDLE_DBC, handle_), password);
-  SQLFreeHandle(SQL_HANDLE_DBC, handle_);
-  throw refused;
+  return false;
 }
 
 Connection::~Connection() {
   abandon();
-  if (inTransaction_) SQLEndTran(SQL_HANDLE_DBC, handle_, SQL_ROLLBACK);
-  SQLDisconnect(handle_);
-  SQLFreeHandle(SQL_HANDLE_DBC, handle_);
+  try {
+    if (isOwn()) giveBack();
+  } catch (...) {
+    // It is closed instead, and the server discards what is open.
+  }
+}
+
+// A session that stood in a database would hold up a restore, which waits for all of them.
+void Connection::giveBack() {
+  const bool keep = keepable_ && target_.keep.count() > 0;
+  if (keep) {
+    run("if @@trancount>0 rollback transaction set nocount off use master", ordinary);
+    if (keepable_) Pool::instance().give(target_.identity, std::move(link_), target_.keep);
+  } else if (inTransaction_) {
+    run("if @@trancount>0 rollback transaction", unlimited);
+  }
 }
 
 std::shared_ptr<Statement> Connection::statement(std::chrono::seconds timeout) {
-  refuseAfterLoss();
-  makeRoom();
-  return std::make_shared<Statement>(*this, handle_, timeout);
+  makeReady();
+  sendAhead(timeout);
+  return newStatement(timeout);
 }
 
+std::shared_ptr<Statement> Connection::execute(const WireBatch& batch, std::chrono::seconds timeout) {
+  makeReady();
+  keepable_ = keepable_ && batch.leavesNoTrace;
+  if (batch.isNocount) {
+    ahead_ += batch.text + " ";
+    return nullptr;
+  }
+  if (!batch.canFollow) sendAhead(timeout);
+  auto statement = newStatement(timeout);
+  statement->execute(ahead_ + batch.text);
+  ahead_.clear();
+  return statement;
+}
+
+// The texts are T-SQL and not the driver manager's calls, for which drivers make up to three round trips.
 void Connection::begin() {
-  refuseAfterLoss();
-  makeRoom();
-  autocommit(false);
+  makeReady();
+  run(ahead_ + "begin transaction", ordinary);
+  ahead_.clear();
   inTransaction_ = true;
 }
 
-void Connection::end(SQLSMALLINT completion) {
-  if (completion == SQL_COMMIT) refuseAfterLoss();
-  makeRoom();
-  check(SQLEndTran(SQL_HANDLE_DBC, handle_, completion));
-  // Only behind a transaction that is over: with one open, this would commit it.
-  autocommit(true);
-  inTransaction_ = lost_ = false;
+void Connection::commit() {
+  makeReady();
+  run("commit transaction", unlimited);
+  inTransaction_ = false;
 }
 
-void Connection::refuseAfterLoss() const {
+void Connection::rollback() {
+  makeRoom();
+  run("if @@trancount>0 rollback transaction", unlimited);
+  inTransaction_ = inDoubt_ = lost_ = false;
+}
+
+void Connection::failed(const Failure& failure) {
+  // What is not the server's own word may be a connection that is no good any more.
+  if (failure.native() == 0) keepable_ = false;
+  inDoubt_ = inTransaction_;
+}
+
+void Connection::makeReady() {
+  makeRoom();
+  refuseAfterLoss();
+}
+
+void Connection::refuseAfterLoss() {
+  if (inDoubt_) {
+    const auto count = newStatement(ordinary);
+    count->execute("select @@trancount");
+    lost_ = !count->fetch() || count->value(0, count->describe(0).second).toLong() == 0;
+    count->readOut();
+    inDoubt_ = false;
+  }
   if (lost_) throw tsql::transactionLost();
 }
 
@@ -67,13 +137,21 @@ void Connection::makeRoom() {
   if (arriving_) arriving_->keep();
 }
 
-void Connection::autocommit(bool on) {
-  check(SQLSetConnectAttrW(handle_, SQL_ATTR_AUTOCOMMIT, attributeValue(on ? SQL_AUTOCOMMIT_ON : SQL_AUTOCOMMIT_OFF),
-                           SQL_IS_UINTEGER));
+std::shared_ptr<Statement> Connection::newStatement(std::chrono::seconds timeout) {
+  return std::make_shared<Statement>(*this, link_->handle(), timeout);
 }
 
-void Connection::check(SQLRETURN rc) const {
-  if (!SQL_SUCCEEDED(rc)) throw failure(diagnostics(SQL_HANDLE_DBC, handle_));
+void Connection::sendAhead(std::chrono::seconds timeout) {
+  if (ahead_.empty()) return;
+  run(ahead_, timeout);
+  ahead_.clear();
+}
+
+void Connection::run(const String& text, std::chrono::seconds timeout) {
+  const auto statement = newStatement(timeout);
+  statement->execute(text);
+  while (statement->moreResults()) {
+  }
 }
 
 }  // namespace QVSa::odbc

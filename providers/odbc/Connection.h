@@ -4,28 +4,46 @@
 #include <memory>
 
 #include "QVSa/values/Failure.h"
+#include "providers/odbc/Link.h"
 #include "providers/odbc/Statement.h"
+#include "providers/odbc/WireBatch.h"
 
 namespace QVSa::odbc {
 
 class Rows;
 
-// A connection handle. The server answers one statement at a time, so the row set that is still arriving is read into
-// memory before anything else goes out. Going, it rolls back what is open and never throws.
+// What a connection is opened for.
+struct Target {
+  String odbcText;      // the driver manager's connection string without a database
+  String database;      // the part of it that names the database
+  String databaseName;  // empty: the log-in's own
+  String password;      // what no failure's text may repeat
+  std::chrono::seconds loginTimeout{15};
+  std::chrono::seconds keep{0};  // how long it is kept open afterwards
+  String identity{};             // whose connection it is: none is given to another one
+};
+
+// A session's hold of an open connection: one that was kept, or a new one. The server answers one statement at a time,
+// so the row set that is still arriving is read into memory before anything else goes out. Going, it rolls back what is
+// open, gives the connection back to those that are kept, and never throws.
 class Connection {
  public:
-  // `password` is not sent: it is what no failure's text may repeat.
-  Connection(const String& odbcText, const String& password, std::chrono::seconds loginTimeout);
+  explicit Connection(Target target);
   ~Connection();
   Connection(const Connection&) = delete;
   Connection& operator=(const Connection&) = delete;
 
+  // For a text with parameters, or one that must be a batch of its own.
   std::shared_ptr<Statement> statement(std::chrono::seconds timeout);
+  // Runs a batch and stands at its first result. Nothing for one that waits for the next.
+  std::shared_ptr<Statement> execute(const WireBatch& batch, std::chrono::seconds timeout);
   void begin();
-  void end(SQLSMALLINT completion);
-  // The server has rolled the open transaction back by itself. The next statement would begin another one and commit
-  // alone: until that is ended by a rollback, everything is refused with 3930.
-  void transactionLost() { lost_ = inTransaction_; }
+  void commit();
+  void rollback();
+
+  // What a statement of this connection met.
+  void failed(const Failure& failure);
+  bool isOwn() const { return link_->isOwn(); }
 
   // These rows arrive from now on.
   void arriving(Rows& rows) { arriving_ = &rows; }
@@ -34,15 +52,24 @@ class Connection {
   void abandon() noexcept;
 
  private:
-  void refuseAfterLoss() const;
+  bool adoptKept();
+  void makeReady();
+  void refuseAfterLoss();
   void makeRoom();
-  void autocommit(bool on);
-  void check(SQLRETURN rc) const;
+  std::shared_ptr<Statement> newStatement(std::chrono::seconds timeout);
+  void sendAhead(std::chrono::seconds timeout);
+  void run(const String& text, std::chrono::seconds timeout);
+  void giveBack();
 
-  SQLHDBC handle_ = SQL_NULL_HDBC;
+  Target target_;
+  std::unique_ptr<Link> link_;
   Rows* arriving_ = nullptr;
+  // Settings of the session that go out with the next batch, in front of it: they are no round trip of their own.
+  String ahead_;
   bool inTransaction_ = false;
-  bool lost_ = false;
+  bool inDoubt_ = false;  // a statement has failed, and with it perhaps the transaction has ended
+  bool lost_ = false;     // it has: the next statement would commit alone
+  bool keepable_ = true;
 };
 
 }  // namespace QVSa::odbc

@@ -2,9 +2,9 @@
 
 #include <algorithm>
 #include <cctype>
-#include <cstdlib>
 #include <filesystem>
 
+#include "platform/ServerSettings.h"
 #include "providers/odbc/Environment.h"
 
 namespace QVSa::odbc {
@@ -59,10 +59,46 @@ String braced(const String& value, bool freeTds) {
   return result + "};";
 }
 
-String serverText(const String& dataSource, bool freeTds) {
+Failure refused(const String& reason) { return Failure(number::general, "ODBC", reason); }
+
+bool isPort(const String& text) {
+  const bool digits = !text.empty() && text.size() <= 5 && text.find_first_not_of("0123456789") == String::npos;
+  return digits && std::stoi(text) >= 1 && std::stoi(text) <= 65535;
+}
+
+// A server without braces: the drivers look for a port or an instance in it. What would end it can't be a host.
+String serverText(const String& dataSource, const Access& access) {
+  if (dataSource.find_first_of(";{}") != String::npos) throw refused("The name of the server is not valid.");
   const auto comma = dataSource.rfind(',');
-  if (!freeTds || comma == String::npos) return "Server=" + dataSource + ";";
-  return "Server=" + dataSource.substr(0, comma) + ";Port=" + dataSource.substr(comma + 1) + ";";
+  const String host = dataSource.substr(0, comma);
+  const String port = comma == String::npos ? "" : dataSource.substr(comma + 1);
+  if (comma != String::npos && !isPort(port)) throw refused("The port of the server is not valid.");
+  const bool ofFile = access.driver.freeTds && access.certificate == "driver";
+  if (ofFile && !port.empty())
+    throw refused(
+        "The certificate is checked by an entry of freetds.conf, which names the port: name that entry alone.");
+  if (ofFile) return "Servername=" + host + ";";
+  if (!access.driver.freeTds || port.empty()) return "Server=" + dataSource + ";";
+  return "Server=" + host + ";Port=" + port + ";";
+}
+
+String freeTdsSecurity(const Access& access) {
+  if (access.certificate == "checked")
+    throw refused(
+        "FreeTDS checks a certificate only by an entry of freetds.conf: set certificate to driver, and name that entry "
+        "as the server.");
+  const String level = access.encryption == "required"   ? "require"
+                       : access.encryption == "optional" ? "request"
+                                                         : "off";
+  return "TDS_Version=7.4;ClientCharset=UTF-8;Encryption=" + level + ";";
+}
+
+// SQL Server makes a certificate of its own where it was given none, so encryption always works; checking who signed it
+// would refuse most installations, and version 18 would do that by default.
+String otherSecurity(const Access& access) {
+  const String encrypt = access.encryption == "required" ? "Encrypt=yes;" : "Encrypt=no;";
+  if (access.certificate == "driver") return encrypt;
+  return encrypt + "TrustServerCertificate=" + (access.certificate == "checked" ? "no;" : "yes;");
 }
 
 }  // namespace
@@ -80,32 +116,36 @@ Driver chooseDriver(const String& wanted, const std::vector<String>& registered,
   throw Failure(number::general, "ODBC", "No ODBC driver for SQL Server is installed.");
 }
 
-Driver systemDriver() {
+Driver systemDriver(const String& wanted) {
   // Asked once: the driver manager's list is read by steps that two threads must not take at the same time.
   // Never destroyed: a host may call with its last statics.
   static const auto& registered = *new std::vector<String>(registeredDrivers());
   static const auto& library = *new String(freeTdsLibrary());
-  const char* wanted = std::getenv("QVSA_ODBC_DRIVER");
-  return chooseDriver(wanted ? wanted : "", registered, library);
+  return chooseDriver(wanted, registered, library);
 }
 
-String connectionText(const ConnectionOptions& options, const Driver& driver) {
-  // A server without braces: the drivers look for a port or an instance in it. What would end it can't be a host.
-  if (options.dataSource.find_first_of(";{}") != String::npos) {
-    throw Failure(number::general, "ODBC", "The name of the server is not valid.");
-  }
-  const auto value = [&](const String& plain) { return braced(plain, driver.freeTds); };
-  String text = "Driver=" + value(driver.name) + serverText(options.dataSource, driver.freeTds);
-  if (!options.database.empty()) text += "Database=" + value(options.database);
+Access systemAccess() {
+  auto settings = platform::serverSettingsInForce();
+  const auto value = [&](const char* name) { return settings[name].value; };
+  return {systemDriver(value("odbc-driver")), value("encryption"), value("certificate"), value("driver-options"),
+          std::chrono::seconds(std::stoi(value("keep-seconds")))};
+}
+
+String connectionText(const ConnectionOptions& options, const Access& access) {
+  const auto value = [&](const String& plain) { return braced(plain, access.driver.freeTds); };
+  String text = "Driver=" + value(access.driver.name) + serverText(options.dataSource, access);
   if (options.integrated) {
     text += "Trusted_Connection=yes;";
   } else {
     text += "UID=" + value(options.user) + "PWD=" + value(options.password);
   }
-  if (driver.freeTds) return text + "TDS_Version=7.4;ClientCharset=UTF-8;";
-  // SQL Server makes a certificate of its own where it was given none, so encryption always works; checking who signed
-  // it would refuse most installations, and version 18 would do that by default.
-  return text + "Encrypt=yes;TrustServerCertificate=yes;";
+  text += access.driver.freeTds ? freeTdsSecurity(access) : otherSecurity(access);
+  const bool open = !access.driverOptions.empty() && access.driverOptions.back() != ';';
+  return text + access.driverOptions + (open ? ";" : "");
+}
+
+String databaseText(const String& database, const Driver& driver) {
+  return database.empty() ? "" : "Database=" + braced(database, driver.freeTds);
 }
 
 }  // namespace QVSa::odbc

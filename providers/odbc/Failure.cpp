@@ -26,8 +26,16 @@ String withoutPrefixes(const String& text) {
   return text.substr(std::min(text.find_first_not_of(' ', at), text.size()));
 }
 
+// 08004 is a server that answers, and refuses a database for example.
 bool speaksOfLink(const Diagnostic& diagnostic) {
-  return startsWith(diagnostic.state, "08") || startsWith(diagnostic.state, "HYT");
+  const bool refused = diagnostic.state == "08004" && diagnostic.native > 0;
+  return (startsWith(diagnostic.state, "08") && !refused) || startsWith(diagnostic.state, "HYT");
+}
+
+// FreeTDS tells by numbers of its own alone that reading, writing or the whole conversation has ended.
+bool isLostLink(const Diagnostic& diagnostic) {
+  static constexpr std::array<Long, 4> ends{20004, 20006, 20017, 20047};
+  return startsWith(diagnostic.state, "08S") || std::ranges::find(ends, diagnostic.native) != ends.end();
 }
 
 bool isWantOfMemory(const Diagnostic& diagnostic) { return diagnostic.state == "HY001" || diagnostic.state == "HY013"; }
@@ -81,6 +89,31 @@ bool containsWithoutCase(const String& text, const String& what) {
          }) != text.end();
 }
 
+Failure failureOf(const std::vector<Diagnostic>& diagnostics) {
+  if (diagnostics.empty()) return Failure(number::general, "ODBC", "Unspecified error");
+  const Diagnostic& error = deciding(diagnostics);
+  const String text = withoutPrefixes(error.text);
+  if (isWantOfMemory(error)) throw std::bad_alloc();
+  if (!isServers(error)) return Failure(numberOfState(error.state), "ODBC", text);
+  const Failure told = tsql::sqlFailure(error.native, text);
+  // The server has a number for every reason to refuse a log-in, and one state for all.
+  return startsWith(error.state, "28") ? Failure(number::login, told.source(), text, error.native) : told;
+}
+
+// FreeTDS gives the reason in a record beside the one that tells of the failure. Of a conversation that ended before
+// the log-in, the reason is mostly the encryption, and it says so nowhere.
+String reasonOf(const std::vector<Diagnostic>& diagnostics) {
+  constexpr Long firstOfClient = 20000;
+  constexpr Long conversationEnded = 20002;
+  const auto client =
+      std::ranges::find_if(diagnostics, [](const Diagnostic& one) { return one.native >= firstOfClient; });
+  if (client == diagnostics.end()) return withoutPrefixes(deciding(diagnostics).text);
+  if (client->native == conversationEnded)
+    return "The server ended the conversation before the log-in: it may not offer the encryption that is required, or "
+           "its certificate was refused.";
+  return withoutPrefixes(client->text);
+}
+
 }  // namespace
 
 std::vector<Diagnostic> diagnostics(SQLSMALLINT handleType, SQLHANDLE handle) {
@@ -99,23 +132,20 @@ std::vector<Diagnostic> diagnostics(SQLSMALLINT handleType, SQLHANDLE handle) {
 }
 
 Failure failure(const std::vector<Diagnostic>& diagnostics) {
-  if (diagnostics.empty()) return Failure(number::general, "ODBC", "Unspecified error");
-  const Diagnostic& error = deciding(diagnostics);
-  const String text = withoutPrefixes(error.text);
-  if (isWantOfMemory(error)) throw std::bad_alloc();
-  if (!isServers(error)) return Failure(numberOfState(error.state), "ODBC", text);
-  const Failure told = tsql::sqlFailure(error.native, text);
-  // The server has a number for every reason to refuse a log-in, and one state for all.
-  return startsWith(error.state, "28") ? Failure(number::login, told.source(), text, error.native) : told;
+  const Failure told = failureOf(diagnostics);
+  if (told.native() == 0 && std::ranges::any_of(diagnostics, isLostLink))
+    return Failure(number::general, told.source(), "The connection to the server is lost.");
+  return told;
 }
 
 Failure connectFailure(const std::vector<Diagnostic>& diagnostics, const String& password) {
   constexpr Long unreachable = 17;
-  const Failure told = failure(diagnostics);
+  const Failure told = failureOf(diagnostics);
   const bool outOfReach = !diagnostics.empty() && speaksOfLink(deciding(diagnostics));
-  const bool tellsTooMuch = (!password.empty() && told.description().find(password) != String::npos) ||
-                            containsWithoutCase(told.description(), "pwd=");
-  const String text = tellsTooMuch ? "The data source cannot be opened." : told.description();
+  const String reason = outOfReach ? reasonOf(diagnostics) : told.description();
+  const bool tellsTooMuch =
+      (!password.empty() && reason.find(password) != String::npos) || containsWithoutCase(reason, "pwd=");
+  const String text = tellsTooMuch ? "The data source cannot be opened." : reason;
   if (outOfReach) return Failure(number::general, told.source(), text, unreachable);
   return Failure(told.number(), told.source(), text, told.native());
 }

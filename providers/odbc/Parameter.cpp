@@ -1,5 +1,6 @@
 #include "providers/odbc/Parameter.h"
 
+#include <algorithm>
 #include <cstring>
 
 #include "providers/odbc/Failure.h"
@@ -7,6 +8,10 @@
 namespace QVSa::odbc {
 
 namespace {
+
+// The longest that a server takes as an ordinary text or binary value.
+constexpr std::size_t longestText = 4000;
+constexpr std::size_t longestBinary = 8000;
 
 SQL_TIMESTAMP_STRUCT moment(Date date) {
   SQL_TIMESTAMP_STRUCT result{};
@@ -35,41 +40,58 @@ bool isFractional(const ColumnType& type) {
 
 }  // namespace
 
-Parameter::Parameter(const Variant& value, const ColumnType& type) : type_(type) {
-  if (isBinary(type)) cType_ = SQL_C_BINARY;
-  if (!value.isNull()) hold(value);
+// The value goes out as what it is, with its own size: the server converts it to the column's type, and refuses what
+// does not fit. A driver that were told the column's size would cut it without a word.
+Parameter::Parameter(const Variant& value, const ColumnType& type) {
+  if (isBinary(type)) {
+    holdBytes(value.isNull() ? Bytes() : value.toBytes());
+  } else if (type.type == SQL_BIT && !value.isNull()) {
+    hold<unsigned char>(SQL_C_BIT, SQL_BIT, value.toBoolean() ? 1 : 0);
+  } else if (value.isDate()) {
+    constexpr SQLULEN digitsOfMoment = 23;
+    constexpr SQLSMALLINT milliseconds = 3;
+    hold(SQL_C_TYPE_TIMESTAMP, SQL_TYPE_TIMESTAMP, moment(value.toDate()));
+    size_ = digitsOfMoment;
+    digits_ = milliseconds;
+  } else if (value.isNull() || value.isText() || isText(type)) {
+    holdText(value.isNull() ? String() : value.toText());
+  } else if (isFractional(type)) {
+    hold<double>(SQL_C_DOUBLE, SQL_DOUBLE, value.toDouble());
+  } else {
+    hold<SQLINTEGER>(SQL_C_SLONG, SQL_INTEGER, value.toLong());
+  }
+  if (value.isNull()) length_ = SQL_NULL_DATA;
 }
 
 template <class T>
-void Parameter::hold(SQLSMALLINT cType, const T& value) {
-  hold(cType, &value, sizeof value);
+void Parameter::hold(SQLSMALLINT cType, SQLSMALLINT type, const T& value) {
+  hold(cType, type, &value, sizeof value);
 }
 
-void Parameter::hold(SQLSMALLINT cType, const void* data, std::size_t size) {
+void Parameter::hold(SQLSMALLINT cType, SQLSMALLINT type, const void* data, std::size_t size) {
   cType_ = cType;
+  type_ = type;
   length_ = static_cast<SQLLEN>(size);
   // One byte more than needed: an empty text must have an address, or drivers take it for NULL.
   data_.resize(size + 1);
-  std::memcpy(data_.data(), data, size);
+  if (size > 0) std::memcpy(data_.data(), data, size);
 }
 
-void Parameter::hold(const Variant& value) {
-  if (isBinary(type_)) {
-    const Bytes bytes = value.toBytes();
-    if (bytes.empty()) return hold(SQL_C_BINARY, "", 0);
-    return hold(SQL_C_BINARY, bytes.data(), bytes.size());
-  }
-  if (type_.type == SQL_BIT) return hold<unsigned char>(SQL_C_BIT, value.toBoolean() ? 1 : 0);
-  if (value.isDate()) return hold(SQL_C_TYPE_TIMESTAMP, moment(value.toDate()));
-  if (!value.isText() && !isText(type_) && isFractional(type_)) return hold<double>(SQL_C_DOUBLE, value.toDouble());
-  if (!value.isText() && !isText(type_)) return hold<SQLINTEGER>(SQL_C_SLONG, value.toLong());
-  const std::u16string text = toWide(value.toText());
-  hold(SQL_C_WCHAR, text.data(), text.size() * sizeof(char16_t));
+void Parameter::holdText(const String& text) {
+  const std::u16string wide = toWide(text);
+  hold(SQL_C_WCHAR, wide.size() > longestText ? SQL_WLONGVARCHAR : SQL_WVARCHAR, wide.data(),
+       wide.size() * sizeof(char16_t));
+  size_ = std::max<SQLULEN>(wide.size(), 1);
+}
+
+void Parameter::holdBytes(const Bytes& bytes) {
+  hold(SQL_C_BINARY, bytes.size() > longestBinary ? SQL_LONGVARBINARY : SQL_VARBINARY, bytes.data(), bytes.size());
+  size_ = std::max<SQLULEN>(bytes.size(), 1);
 }
 
 void Parameter::bind(SQLHSTMT statement, SQLUSMALLINT position) {
-  const SQLRETURN rc = SQLBindParameter(statement, position, SQL_PARAM_INPUT, cType_, type_.type, type_.size,
-                                        type_.digits, data_.data(), static_cast<SQLLEN>(data_.size()), &length_);
+  const SQLRETURN rc = SQLBindParameter(statement, position, SQL_PARAM_INPUT, cType_, type_, size_, digits_,
+                                        data_.data(), static_cast<SQLLEN>(data_.size()), &length_);
   if (!SQL_SUCCEEDED(rc)) throw failure(diagnostics(SQL_HANDLE_STMT, statement));
 }
 

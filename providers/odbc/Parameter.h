@@ -16,12 +16,15 @@ class Parameter {
 
  private:
   template <class T>
-  void hold(SQLSMALLINT cType, const T& value);
-  void hold(SQLSMALLINT cType, const void* data, std::size_t size);
-  void hold(const Variant& value);
+  void hold(SQLSMALLINT cType, SQLSMALLINT type, const T& value);
+  void hold(SQLSMALLINT cType, SQLSMALLINT type, const void* data, std::size_t size);
+  void holdText(const String& text);
+  void holdBytes(const Bytes& bytes);
 
-  ColumnType type_;
   SQLSMALLINT cType_ = SQL_C_WCHAR;
+  SQLSMALLINT type_ = SQL_WVARCHAR;
+  SQLULEN size_ = 1;
+  SQLSMALLINT digits_ = 0;
   Bytes data_;
   SQLLEN length_ = SQL_NULL_DATA;
 };

@@ -13,24 +13,32 @@ String literal(const String& text) {
   return result + "'";
 }
 
-std::vector<String> keyOfTable(Connection& connection, const tsql::ObjectName& table, std::chrono::seconds timeout) {
-  constexpr std::size_t columnName = 3;
-  const auto statement = connection.statement(timeout);
-  statement->askPrimaryKey(table.database, table.owner, table.name);
-  const ColumnType type = statement->describe(columnName).second;
-  std::vector<String> result;
-  while (statement->fetch()) result.push_back(statement->value(columnName, type).toText());
-  return result;
-}
+// What the catalogue of a table's database knows of its key, or of the synonym that stands for it.
+struct Known {
+  std::vector<String> key;
+  String base;  // of a synonym: "[database].[owner].[name]"
+};
 
-// The table behind a synonym, as "[database].[owner].[name]"; empty where the name is no synonym.
-String baseOf(Connection& connection, const tsql::ObjectName& synonym, std::chrono::seconds timeout) {
-  const String catalogue = synonym.database.empty() ? "" : tsql::printName(synonym.database) + ".";
+Known askCatalogue(Connection& connection, const tsql::ObjectName& object, std::chrono::seconds timeout) {
+  const String catalogue = object.database.empty() ? "" : tsql::printName(object.database) + ".";
+  const String id = "object_id(" + literal(objectText(object)) + ")";
   const auto statement = connection.statement(timeout);
-  statement->execute("select base_object_name from " + catalogue + "sys.synonyms where object_id=object_id(" +
-                     literal(objectText(synonym)) + ")");
-  const ColumnType type = statement->describe(0).second;
-  return statement->fetch() ? statement->value(0, type).toText() : String();
+  statement->execute("select c.name,null from " + catalogue + "sys.indexes i inner join " + catalogue +
+                     "sys.index_columns x on x.object_id=i.object_id and x.index_id=i.index_id inner join " +
+                     catalogue +
+                     "sys.columns c on c.object_id=x.object_id and c.column_id=x.column_id where i.object_id=" + id +
+                     " and i.is_primary_key=1 union all select null,base_object_name from " + catalogue +
+                     "sys.synonyms where object_id=" + id);
+  const ColumnType text = statement->describe(0).second;
+  Known known;
+  while (statement->fetch()) {
+    const Variant column = statement->value(0, text);
+    if (column.isNull())
+      known.base = statement->value(1, text).toText();
+    else
+      known.key.push_back(column.toText());
+  }
+  return known;
 }
 
 tsql::ObjectName readName(const String& text) {
@@ -38,13 +46,19 @@ tsql::ObjectName readName(const String& text) {
   return std::get<tsql::SelectPtr>(statements.front())->parts.front().core.from.front()->table;
 }
 
+// A name without a database is one of the synonym's own, not of the session's.
+tsql::ObjectName baseOf(const Known& synonym, const tsql::ObjectName& name) {
+  tsql::ObjectName base = readName(synonym.base);
+  if (base.database.empty()) base.database = name.database;
+  return base;
+}
+
 }  // namespace
 
 std::vector<String> primaryKey(Connection& connection, const tsql::ObjectName& table, std::chrono::seconds timeout) {
-  const auto key = keyOfTable(connection, table, timeout);
-  if (!key.empty()) return key;
-  const String base = baseOf(connection, table, timeout);
-  return base.empty() ? key : keyOfTable(connection, readName(base), timeout);
+  Known known = askCatalogue(connection, table, timeout);
+  if (known.base.empty()) return known.key;
+  return askCatalogue(connection, baseOf(known, table), timeout).key;
 }
 
 }  // namespace QVSa::odbc

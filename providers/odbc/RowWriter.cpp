@@ -1,6 +1,7 @@
 #include "providers/odbc/RowWriter.h"
 
 #include "providers/tsql/Printer.h"
+#include "providers/tsql/SqlFailure.h"
 
 namespace QVSa::odbc {
 
@@ -26,10 +27,7 @@ void RowWriter::write(Connection& connection, const std::vector<Variant>& row,
   const auto statement = connection.statement(timeout);
   statement->execute(text, parameters);
   // A count of -1 is a session that does not count.
-  if (statement->affected() == 0) {
-    throw Failure(number::general, "ODBC",
-                  "Row cannot be located for updating. Some values may have been changed since it was last read.");
-  }
+  if (statement->affected() == 0) throw tsql::rowGone();
 }
 
 }  // namespace QVSa::odbc

@@ -18,7 +18,10 @@ Rows::Rows(const std::shared_ptr<Connection>& connection, std::shared_ptr<Statem
   }
 }
 
-Rows::~Rows() { detach(); }
+Rows::~Rows() {
+  if (statement_) statement_->readOut();
+  detach();
+}
 
 bool Rows::next() {
   if (cutOff_) throw closed();
@@ -86,6 +89,7 @@ void Rows::keep() {
 }
 
 void Rows::abandon() noexcept {
+  if (statement_) statement_->readOut();
   statement_.reset();
   cutOff_ = true;
 }

@@ -1,13 +1,12 @@
 #include "providers/odbc/Session.h"
 
+#include "providers/odbc/Pool.h"
 #include "providers/odbc/PrimaryKey.h"
 #include "providers/odbc/Rows.h"
-#include "providers/odbc/WireText.h"
 
 namespace QVSa::odbc {
 
-Session::Session(const String& odbcText, const String& password, std::chrono::seconds loginTimeout)
-    : connection_(std::make_shared<Connection>(odbcText, password, loginTimeout)) {}
+Session::Session(Target target) : connection_(std::make_shared<Connection>(std::move(target))) {}
 
 BatchResult Session::run(const Batch& batch) {
   if (batch.updatable) {
@@ -15,12 +14,13 @@ BatchResult Session::run(const Batch& batch) {
       if (auto rows = openUpdatable(*select, batch)) return {std::move(rows), -1};
     }
   }
-  const auto statement = connection_->statement(batch.timeout);
-  statement->execute(wireText(batch.text));
-  return collect(statement, batch.text);
+  const WireBatch wire = wireBatch(batch.text);
+  if (wire.wantsDatabaseAlone) Pool::instance().clear();
+  const auto statement = connection_->execute(wire, batch.timeout);
+  return statement ? collect(statement, wire) : BatchResult{};
 }
 
-BatchResult Session::collect(const std::shared_ptr<Statement>& statement, const String& batch) {
+BatchResult Session::collect(const std::shared_ptr<Statement>& statement, const WireBatch& batch) {
   BatchResult result;
   do {
     if (statement->columnCount() == 0) {
@@ -29,10 +29,9 @@ BatchResult Session::collect(const std::shared_ptr<Statement>& statement, const 
     } else if (!result.rows) {
       auto rows = std::make_unique<Rows>(connection_, statement);
       connection_->arriving(*rows);
-      const bool last = endsWithItsRowSet(batch);
-      if (!last) rows->keep();
+      if (!batch.endsWithItsRowSet) rows->keep();
       result.rows = std::move(rows);
-      if (last) return result;
+      if (batch.endsWithItsRowSet) return result;
     }
   } while (statement->moreResults());
   return result;
@@ -44,8 +43,8 @@ std::unique_ptr<Rows> Session::openUpdatable(UpdatableSelect& select, const Batc
   const auto key = primaryKey(*connection_, select.table(), batch.timeout);
   if (key.empty()) return nullptr;
   select.addKey(key);
-  const auto statement = connection_->statement(batch.timeout);
-  statement->execute(select.added() == 0 ? batch.text : select.text());
+  const WireBatch wire = wireBatch(select.added() == 0 ? batch.text : select.text());
+  const auto statement = connection_->execute(wire, batch.timeout);
   auto rows = std::make_unique<Rows>(connection_, statement);
   rows->writeWith(select.writer(rows->columns(), rows->types(), batch.timeout),
                   rows->columns().size() - select.added());

@@ -9,17 +9,15 @@ namespace QVSa::odbc {
 // A session on a SQL Server through a driver of the system's driver manager.
 class Session final : public ProviderSession {
  public:
-  // `odbcText` is the driver manager's connection string. A failure's text repeats neither it nor the password.
-  explicit Session(const String& odbcText, const String& password = {},
-                   std::chrono::seconds loginTimeout = std::chrono::seconds(15));
+  explicit Session(Target target);
 
   BatchResult run(const Batch& batch) override;
   void begin() override { connection_->begin(); }
-  void commit() override { connection_->end(SQL_COMMIT); }
-  void rollback() override { connection_->end(SQL_ROLLBACK); }
+  void commit() override { connection_->commit(); }
+  void rollback() override { connection_->rollback(); }
 
  private:
-  BatchResult collect(const std::shared_ptr<Statement>& statement, const String& batch);
+  BatchResult collect(const std::shared_ptr<Statement>& statement, const WireBatch& batch);
   std::unique_ptr<Rows> openUpdatable(UpdatableSelect& select, const Batch& batch);
 
   std::shared_ptr<Connection> connection_;

@@ -18,14 +18,27 @@ Statement::Statement(Connection& connection, SQLHDBC handle, std::chrono::second
   SQLSetStmtAttrW(handle_, SQL_ATTR_NOSCAN, attributeValue(SQL_NOSCAN_ON), SQL_IS_UINTEGER);
 }
 
-Statement::~Statement() { SQLFreeHandle(SQL_HANDLE_STMT, handle_); }
+Statement::~Statement() {
+  if (connection_.isOwn()) SQLFreeHandle(SQL_HANDLE_STMT, handle_);
+}
+
+// Giving up in the middle costs a round trip, as the server must be told to stop; the last rows of a small row set are
+// mostly there already.
+void Statement::readOut() noexcept {
+  constexpr int few = 50;
+  try {
+    for (int rows = 0; rows < few && connection_.isOwn() && fetch(); ++rows) {
+    }
+  } catch (...) {
+    // Nobody waits for these rows; the connection has heard of it.
+  }
+}
 
 bool Statement::check(SQLRETURN rc) const {
   if (rc == SQL_NO_DATA) return false;
   if (SQL_SUCCEEDED(rc)) return true;
-  constexpr Long deadlocked = 1205;
   const Failure told = failure(diagnostics(SQL_HANDLE_STMT, handle_));
-  if (told.native() == deadlocked) connection_.transactionLost();
+  connection_.failed(told);
   throw told;
 }
 
@@ -39,12 +52,6 @@ void Statement::execute(const String& text, std::vector<Parameter>& parameters) 
   SQLUSMALLINT position = 0;
   for (Parameter& parameter : parameters) parameter.bind(handle_, ++position);
   execute(text);
-}
-
-void Statement::askPrimaryKey(const String& database, const String& owner, const String& table) {
-  std::u16string names[] = {toWide(database), toWide(owner), toWide(table)};
-  const auto data = [](std::u16string& name) { return name.empty() ? nullptr : wideData(name); };
-  check(SQLPrimaryKeysW(handle_, data(names[0]), SQL_NTS, data(names[1]), SQL_NTS, data(names[2]), SQL_NTS));
 }
 
 std::size_t Statement::columnCount() const {

@@ -22,9 +22,6 @@ class Statement {
   void execute(const String& text);
   // With the parameters' values for the marks of the text, in order.
   void execute(const String& text, std::vector<Parameter>& parameters);
-  // Asks for the primary key of a table; the columns of the answer are those of SQLPrimaryKeys.
-  void askPrimaryKey(const String& database, const String& owner, const String& table);
-
   // 0 where the current result is no row set.
   std::size_t columnCount() const;
   // Of the column at a position from 0.
@@ -36,6 +33,8 @@ class Statement {
 
   // Steps to the next row of the current result; false behind the last one.
   bool fetch();
+  // Steps over the rows behind the current one if they are few.
+  void readOut() noexcept;
   Variant value(std::size_t ordinal, const ColumnType& type) const { return readColumn(handle_, ordinal, type); }
 
  private:

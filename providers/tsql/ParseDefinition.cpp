@@ -128,17 +128,28 @@ Statement Parser::createSynonym() {
 Statement Parser::createLogin() {
   CreateLogin login;
   login.name = expectName();
-  expectWord("with");
-  expectWord("password");
-  expectSymbol("=");
-  if (now().kind != TokenKind::string) refuse();
-  login.password = take();
+  login.password = loginPassword();
   // The rules for passwords of the host system do not exist here: off is what they are.
   if (!takeSymbol(",")) return login;
   expectWord("check_policy");
   expectSymbol("=");
   switchedOn();
   return login;
+}
+
+Statement Parser::alterLogin() {
+  AlterLogin login;
+  login.name = expectName();
+  login.password = loginPassword();
+  return login;
+}
+
+Token Parser::loginPassword() {
+  expectWord("with");
+  expectWord("password");
+  expectSymbol("=");
+  if (now().kind != TokenKind::string) refuse();
+  return take();
 }
 
 Statement Parser::drop() {

@@ -85,6 +85,8 @@ class Parser {
   Statement createIndex();
   Statement createSynonym();
   Statement createLogin();
+  Statement alterLogin();
+  Token loginPassword();
   void tableElement(CreateTable& table);
   ColumnDefinition columnDefinition();
   bool columnOption(ColumnDefinition& column);

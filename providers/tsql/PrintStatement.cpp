@@ -116,6 +116,11 @@ void Writer::write(const CreateLogin& login) {
   writeToken(login.password);
 }
 
+void Writer::write(const AlterLogin& login) {
+  add("alter login " + printName(login.name) + " with password = ");
+  writeToken(login.password);
+}
+
 void Writer::write(const Drop& drop) {
   static constexpr const char* kKinds[] = {"table ", "view ", "index ", "synonym ", "login "};
   add("drop ");

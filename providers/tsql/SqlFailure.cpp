@@ -52,6 +52,11 @@ Failure transactionLost() {
                     "file. Roll back the transaction.");
 }
 
+Failure rowGone() {
+  return Failure(number::general, "SQL Server",
+                 "Row cannot be located for updating. Some values may have been changed since it was last read.");
+}
+
 void refuseDepth() {
   throw sqlFailure(
       191,

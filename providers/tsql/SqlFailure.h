@@ -17,6 +17,8 @@ Failure timeExpired();
 
 // 191: what is nested deeper than whoever reads it has room for.
 [[noreturn]] void refuseDepth();
+// A row set's row that is to be written is not there any more.
+Failure rowGone();
 // 3930: the server has rolled the transaction back, and the session has not said so yet: whatever it wrote now would be
 // committed alone.
 Failure transactionLost();

@@ -214,6 +214,11 @@ struct CreateLogin {
   Token password;
 };
 
+struct AlterLogin {
+  String name;
+  Token password;
+};
+
 struct Drop {
   enum class Kind { table, view, index, synonym, login };
   Kind kind = Kind::table;
@@ -272,8 +277,8 @@ struct VerifyBackup {
   Token file;
 };
 
-using Statement =
-    std::variant<SelectPtr, Insert, Update, Delete, CreateTable, CreateView, CreateIndex, CreateSynonym, CreateLogin,
-                 Drop, Use, SetOption, Transaction, Call, AlterDatabase, BackupDatabase, RestoreDatabase, VerifyBackup>;
+using Statement = std::variant<SelectPtr, Insert, Update, Delete, CreateTable, CreateView, CreateIndex, CreateSynonym,
+                               CreateLogin, AlterLogin, Drop, Use, SetOption, Transaction, Call, AlterDatabase,
+                               BackupDatabase, RestoreDatabase, VerifyBackup>;
 
 }  // namespace QVSa::tsql

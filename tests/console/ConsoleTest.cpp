@@ -53,7 +53,7 @@ TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   EXPECT_EQ(run("sign-on nobody", "x\n").error(), "0x8004044D");
   for (const char* misuse :
        {"", "dept show", "sign-on Admin --password x", "no-such-command", "number rule add x --reuse often",
-        "init \"it's\"", "doctor --database 'a b'", "init 'a\\b'"})
+        "init \"it's\"", "doctor --database 'a b'", "init 'a\\b'", "init --script x.sql", "doctor --encryption none"})
     EXPECT_EQ(run(misuse, "x\n").exitCode, 2) << misuse;
   EXPECT_EQ(run("sign-on Admin", "").exitCode, 2);
   name_ = "missing";
@@ -251,6 +251,16 @@ TEST_F(Program, TheTreeIsDrawnWithEachBranchUnderItsSuperior) {
   execute("update departments set superDept=" + value("select deptId from departments where deptNo='c'") +
           " where deptNo='b'");
   EXPECT_EQ(run("dept tree").document["onNoTop"], Json::array({"b", "c"}));
+}
+
+TEST_F(Program, PasswordsOfLogInsAreChangedByTheAdministrator) {
+  EXPECT_EQ(run("login password QVUser", "wrong\nOther-pass\n").error(), "0x80040E4D");
+  EXPECT_EQ(run("login password QVUser", "Sa-first\nOther;pass\n").error(), "5");
+  ASSERT_EQ(run("login password sa", "Sa-first\nSa-second\n").exitCode, 0);
+  ASSERT_EQ(run("login password QVUser", "Sa-second\nOther-pass\n").exitCode, 0);
+  EXPECT_EQ(run("user show Admin").error(), "0x80040E4D");
+  name_ += "|" + run("secrets scramble", "Other-pass\n").document["scrambled"].get<String>();
+  EXPECT_EQ(run("user show Admin").exitCode, 0);
 }
 
 TEST_F(Program, DoctorTellsWhatASignOnWouldPassOver) {

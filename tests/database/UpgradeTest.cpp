@@ -10,9 +10,11 @@ namespace {
 using embedded::Handle;
 
 // An installation as the layout before has it: made from today's by taking back what has come since.
-class OldInstallation : public testing::Test {
+class OldInstallation : public FilesScene {
  protected:
-  OldInstallation() {
+  void SetUp() override {
+    FilesScene::SetUp();
+    if (IsSkipped()) return;
     for (const char* batch :
          {"drop index departments_isOrg on departments", "drop view QV_v_JobDeptPathWithLevel",
           "create view QV_v_JobDeptPathWithLevel as "
@@ -53,7 +55,6 @@ class OldInstallation : public testing::Test {
     return lines;
   }
 
-  TestInstallation installation_;
   PlainSession system_{installation_.server(), "QVSys"};
 };
 

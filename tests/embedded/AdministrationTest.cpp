@@ -147,8 +147,11 @@ TEST_F(Administration, AWarmHandleKnowsWhatHasChangedSinceItsLastSession) {
   session->run({"drop login QVUser"});
   EXPECT_EQ(native(*session, "drop login QVUser"), 15151);
   EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
+  EXPECT_EQ(native(*session, "alter login QVUser with password=N'another'"), 15151);
   session->run({"create login QVUser with password=N'another'"});
   EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
+  session->run({"alter login qvuser with password=N'" + defaultDbPwd() + "'"});
+  EXPECT_EQ(native(*open("QVSys"), "alter login sa with password=N'mine now'"), 229);
 }
 
 TEST_F(Administration, ARestoreNeedsTheDatabaseForItself) {

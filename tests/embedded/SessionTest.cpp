@@ -87,6 +87,12 @@ TEST_F(Sessions, AFailedStatementLeavesTheTransactionAndASessionThatEndsTakesItB
   EXPECT_EQ(all(*second_, "select count(*) from t"), "3");
 }
 
+TEST_F(Sessions, WrittenRowsAreCountedUnlessNocountIsOn) {
+  EXPECT_EQ(first_->run({"update t set n=n where n>1"}).affected, 2);
+  EXPECT_EQ(first_->run({"set nocount on update t set n=n"}).affected, -1);
+  EXPECT_EQ(first_->run({"set nocount off update t set n=n"}).affected, 3);
+}
+
 TEST_F(Sessions, AClaimedRowIsPassedOverWaitedForOrRefused) {
   first_->begin();
   EXPECT_EQ(all(*first_, claim), "1");
@@ -183,6 +189,11 @@ TEST_F(Sessions, ATransactionThatLostItsWritesTakesNothingButARollback) {
   expectLost();
 
   second_->begin();
+  second_->run({"update t set n=9 where no='c'"});
+  EXPECT_EQ(nativeOf(*second_, "update t set n='x' where no='a'"), 245);
+  expectLost();
+
+  second_->begin();
   EXPECT_EQ(numberOf(*second_, "update t set n=" + endless + " where no='a'"), number::timeout);
   second_->run({"update t set n=9 where no='c'"});
   second_->rollback();
@@ -276,6 +287,7 @@ TEST_F(Sessions, RowsAreWrittenBackByTheirKeyAndComputedColumnsAreNot) {
   // The row set has the rows that it was opened with.
   ASSERT_TRUE(result.rows->next());
   EXPECT_EQ(result.rows->value(0).toText(), "b");
+  EXPECT_EQ(failureOf([&] { result.rows->update({{1, Variant(Long(1))}}); }), number::general) << "it is gone";
   EXPECT_EQ(rest(*result.rows), "");
   const auto stored = second_->run({"select x from t where n=41"});
   ASSERT_TRUE(stored.rows->next());

@@ -10,9 +10,11 @@ namespace QVSa::test {
 namespace {
 
 // A plan that keeps its backups for a day.
-class RunsOfAPlan : public Scene {
+class RunsOfAPlan : public FilesScene {
  protected:
   void SetUp() override {
+    FilesScene::SetUp();
+    if (IsSkipped()) return;
     nextSecond();
     plan_.connect(server(), "QVApp");
     plan_.Name("nightly");

@@ -14,7 +14,7 @@ namespace {
 namespace fs = std::filesystem;
 
 // A plan, every second day at ten, on the morning of 7 March 2024.
-class BackupPlans : public Scene {
+class BackupPlans : public FilesScene {
  protected:
   BKPlan plan(const String& name) {
     auto plan = connected<BKPlan>();

@@ -15,7 +15,7 @@
 namespace QVSa::test {
 namespace {
 
-class Backups : public Scene {
+class Backups : public FilesScene {
  protected:
   static constexpr const char* password = TestInstallation::administratorPassword;
 

@@ -16,13 +16,21 @@ TEST(OdbcFailure, TakesItsNumberFromTheServersOwn) {
   EXPECT_EQ(told.description(), "Violation of PRIMARY KEY constraint 'x'.");
   EXPECT_EQ(failure({{"42S02", 208, "Invalid object name 'x'."}}).number(), number::noTable);
   EXPECT_EQ(failure({{"40001", 1205, "Deadlock"}}).number(), number::general);
+  const Failure noDatabase = failure({{"08004", 911, "Database 'x' does not exist."}});
+  EXPECT_EQ(noDatabase.number(), number::statement);
+  EXPECT_EQ(noDatabase.native(), 911);
 }
 
 TEST(OdbcFailure, TakesItsNumberFromTheStateWhereADriverSpeaks) {
   EXPECT_EQ(failure({{"HYT00", 0, "Query timeout expired"}}).number(), number::timeout);
   EXPECT_EQ(failure({{"HYT00", 20003, "Timeout expired"}}).number(), number::timeout);
-  EXPECT_EQ(failure({{"08S01", 104, "Communication link failure"}}).number(), number::general);
-  EXPECT_EQ(failure({{"08S01", 104, "Communication link failure"}}).native(), 0);
+  for (const Diagnostic& lost : {Diagnostic{"08S01", 104, "Communication link failure"},
+                                 {"01000", 20017, "Unexpected EOF from the server"},
+                                 {"HY000", 20047, "Unknown error"}}) {
+    EXPECT_EQ(failure({lost}).number(), number::general);
+    EXPECT_EQ(failure({lost}).native(), 0);
+    EXPECT_EQ(failure({lost}).description(), "The connection to the server is lost.");
+  }
   EXPECT_EQ(failure({{"22001", 0, "String data, right truncation"}}).number(), number::range);
   EXPECT_EQ(failure({{"22018", 0, "Invalid character value"}}).number(), number::conversion);
   EXPECT_THROW(failure({{"HY001", 0, "Memory allocation error"}}), std::bad_alloc);
@@ -43,6 +51,8 @@ TEST(OdbcFailure, OfConnectingTellsARefusedLogInFromAServerOutOfReach) {
     EXPECT_EQ(away.native(), 17);
     EXPECT_EQ(away.description(), "Unable to connect");
   }
+  EXPECT_EQ(connectFailure({link, {"01000", 20013, "[FreeTDS]Unknown host machine name."}}, "").description(),
+            "Unknown host machine name.");
 }
 
 TEST(OdbcFailure, OfConnectingRepeatsNoPasswordAndNoConnectionString) {

@@ -1,4 +1,13 @@
+#include <sys/wait.h>
+#include <thread>
+#include <unistd.h>
+
+#include "QVSa/identity/User.h"
+#include "QVSa/numbering/IdMgr.h"
 #include "StrictSession.h"
+#include "providers/odbc/WireBatch.h"
+#include "tests/support/RecordingProvider.h"
+#include "tests/support/TestInstallation.h"
 
 namespace QVSa::odbc {
 namespace {
@@ -166,6 +175,121 @@ TEST_F(OdbcSession, EndsWithRowsStillOpenAndATransactionToo) {
   ASSERT_TRUE(open->next());
   session_.reset();
   EXPECT_THROW(open->next(), Failure);
+}
+
+class KeptConnections : public StrictSession {
+ protected:
+  void SetUp() override {
+    StrictSession::SetUp();
+    session_.reset();
+    if (!IsSkipped()) roundTrips();
+  }
+
+  // What a session costs that runs one batch: a log-in is one round trip, giving the connection back another one.
+  static int cost(const String& text, std::chrono::seconds keep = minute, const String& identity = "QVUser") {
+    {
+      const auto session = open(keep, identity);
+      try {
+        session->run({text});
+      } catch (const Failure&) {
+        // Some are there to fail.
+      }
+    }
+    return roundTrips();
+  }
+
+  static constexpr std::chrono::seconds minute{60};
+  static constexpr int warm = 2;
+  static constexpr int cold = 3;
+};
+
+TEST_F(KeptConnections, ServeTheNextSessionOfTheirIdentityAlone) {
+  EXPECT_EQ(cost("select 1 i"), cold);
+  EXPECT_EQ(cost("select 1 i"), warm);
+  EXPECT_EQ(cost("select 1 i", minute, "sa"), cold);
+  EXPECT_EQ(cost("select 1 i", std::chrono::seconds(0)), cold - 1) << "neither taken nor given back";
+  for (const char* trace : {"set identity_insert t on", "gone", "alter database QVSys set SINGLE_USER"}) {
+    cost("select 1 i");
+    cost(trace);
+    EXPECT_EQ(cost("select 1 i"), cold) << trace;
+  }
+  std::this_thread::sleep_for(std::chrono::milliseconds(1100));
+  EXPECT_EQ(cost("select 1 i"), warm + 1) << "one that was idle is asked first";
+  loseConnection();
+  std::this_thread::sleep_for(std::chrono::milliseconds(1100));
+  EXPECT_EQ(cost("select 1 i"), cold + 1);
+  cost("select 1 i", std::chrono::seconds(1));
+  std::this_thread::sleep_for(std::chrono::milliseconds(1100));
+  EXPECT_EQ(cost("select 1 i"), cold) << "its time was over";
+}
+
+TEST_F(KeptConnections, AreGivenBackWithoutATransaction) {
+  session_ = open(minute);
+  session_->begin();
+  session_ = nullptr;
+  session_ = open(minute);
+  EXPECT_EQ(value("select @@trancount").toLong(), 0);
+}
+
+TEST_F(KeptConnections, AreNoneBehindAFork) {
+  cost("select 1 i");
+  session_ = open(minute);
+  const auto rest = rows("select 1 i");
+  const pid_t child = fork();
+  if (child == 0) {
+    session_.reset();
+    _exit(roundTrips() == 1 && cost("select 1 i") == cold ? 0 : 1);
+  }
+  int status = 0;
+  ASSERT_EQ(waitpid(child, &status, 0), child);
+  EXPECT_EQ(status, 0);
+  EXPECT_EQ(texts(*rest), "1 ");
+}
+
+// What it costs that the server is far away: the statements of an operation as the embedded engine hears them, each
+// with one of its kind in its place. The bounds may only fall.
+class RoundTrips : public KeptConnections {
+ protected:
+  int of(const std::function<bool()>& operation) {
+    test::RecordingProvider recorder;
+    EXPECT_TRUE(operation());
+    for (int times = 0; times < 2; ++times) {  // the second time with kept connections
+      roundTrips();
+      for (const String& event : recorder.log()) replay(event);
+    }
+    return roundTrips();
+  }
+
+ private:
+  void replay(const String& event) {
+    if (event.rfind("open ", 0) == 0) {
+      session_ = open(minute);
+    } else if (event == "close") {
+      session_.reset();
+    } else if (event == "begin") {
+      session_->begin();
+    } else if (event == "commit") {
+      session_->commit();
+    } else if (wireBatch(event).endsWithItsRowSet) {
+      rows("select 1 i")->next();
+    } else {
+      run(wireBatch(event).isNocount ? event : "use QVSys");
+    }
+  }
+};
+
+TEST_F(RoundTrips, AreFewForASignOnAndForANumber) {
+  const test::TestInstallation installation;
+  User user;
+  ASSERT_TRUE(user.connect(installation.server(), "QVApp"));
+  user.Name("Ann");
+  user.Login("ann");
+  user.Pwd("right");
+  ASSERT_TRUE(user.Save()) << user.errDescription();
+  IdMgr rule;
+  ASSERT_TRUE(rule.connect(installation.server(), "QVApp"));
+  EXPECT_LE(of([&] { return user.loginAuth("ann", "right"); }), 18);
+  EXPECT_LE(of([&] { return !rule.newId("_RC").empty(); }), 6);
 }
 
 }  // namespace

@@ -46,6 +46,24 @@ TEST_F(UpdatableRows, TakeEveryKindOfValue) {
   EXPECT_EQ(value("select count(*) from rep where uid='b' and pwd='' and pic is null and made is null").toLong(), 1);
 }
 
+TEST_F(UpdatableRows, FindTheirTableBehindASynonym) {
+  const auto found = open("select pwd from rep_synonym where uid='c'");
+  ASSERT_TRUE(found->next());
+  found->update({{0, Variant("seen")}});
+  EXPECT_EQ(value("select pwd from rep where uid='c'"), Variant("seen"));
+}
+
+// The server refuses what is too long or does not convert: it has to see it.
+TEST_F(UpdatableRows, SendValuesAsTheyAre) {
+  run("create table short(i int primary key, a varchar(3), n int, d datetime, x varbinary(2))");
+  run("insert into short(i) values(1)");
+  const auto found = open("select * from short");
+  ASSERT_TRUE(found->next());
+  const String text = "longer than 3 \xE4\xB8\xAD";
+  found->update({{1, Variant(text)}, {2, Variant("no number")}, {3, Variant("no date")}, {4, Variant(Bytes(9000, 7))}});
+  EXPECT_EQ(texts(*rows("select a||n||d||length(x) from short")), text + "no numberno date9000 ");
+}
+
 TEST_F(UpdatableRows, FollowAKeyThatIsWritten) {
   const auto found = open("select no n,uid from rep where uid='c'");
   ASSERT_TRUE(found->next());

@@ -7,8 +7,8 @@
 #include <sstream>
 
 #include "QVSa/frame/ConnectionString.h"
+#include "QVSa/frame/internal/Providers.h"
 #include "QVSa/values/Text.h"
-#include "providers/embedded/session/Provider.h"
 
 namespace QVSa::test {
 
@@ -130,8 +130,7 @@ void runCases(const std::filesystem::path& folder, TestInstallation::Content con
   std::size_t count = 0;
   for (const auto& file : files) {
     const TestInstallation installation(content);
-    const auto session =
-        embedded::provider().open(parseConnectionString(buildConnString(installation.server(), "QVSys", false)));
+    const auto session = openSession(parseConnectionString(buildConnString(installation.server(), "QVSys", false)));
     for (const auto& expected : casesOf(file)) {
       runCase(*session, expected);
       ++count;

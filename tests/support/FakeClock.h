@@ -7,10 +7,18 @@ namespace QVSa::test {
 // The machine's clock, standing where a test puts it; the embedded engine's getdate() is the same clock.
 class FakeClock {
  public:
-  explicit FakeClock(Date now) : before_(platform::services()) { set(now); }
-  ~FakeClock() { platform::replaceServices(before_); }
+  explicit FakeClock(Date now) : before_(platform::services()) {
+    ++standing_;
+    set(now);
+  }
+  ~FakeClock() {
+    platform::replaceServices(before_);
+    --standing_;
+  }
   FakeClock(const FakeClock&) = delete;
   FakeClock& operator=(const FakeClock&) = delete;
+
+  static bool stands() { return standing_ > 0; }
 
   void set(Date now) {
     platform::Services services = platform::services();
@@ -19,6 +27,7 @@ class FakeClock {
   }
 
  private:
+  inline static int standing_ = 0;
   platform::Services before_;
 };
 

@@ -7,6 +7,7 @@
 #include "tests/support/FakeClock.h"
 #include "tests/support/PlainSession.h"
 #include "tests/support/TestInstallation.h"
+#include "tests/support/TestServer.h"
 
 namespace QVSa::test {
 
@@ -63,6 +64,14 @@ class Scene : public testing::Test {
   FakeClock clock_{Date(2024, 3, 7, 10, 0, 0)};
   TestInstallation installation_;
   PlainSession tables_{installation_.server()};
+};
+
+// A scene that looks into the installation's files, or has backups made on this machine.
+class FilesScene : public Scene {
+ protected:
+  void SetUp() override {
+    if (onServer()) GTEST_SKIP() << "the files of a server are out of reach";
+  }
 };
 
 }  // namespace QVSa::test

@@ -6,6 +6,7 @@
 #include "QVSa/frame/ConnectionString.h"
 #include "database/Scripts.h"
 #include "providers/Installation.h"
+#include "tests/support/TestServer.h"
 
 namespace QVSa::test {
 
@@ -44,6 +45,17 @@ const std::filesystem::path& modelOf(TestInstallation::Content content) {
   return shipped.path();
 }
 
+bool isServerTaken = false;
+
+void resetServer(TestInstallation::Content content) {
+  if (isServerTaken) throw std::logic_error("a server holds one installation");
+  if (content == TestInstallation::Content::shipped)
+    TestServer::instance().ship();
+  else
+    TestServer::instance().empty();
+  isServerTaken = true;
+}
+
 }  // namespace
 
 TestFolder::TestFolder() : path_(newFolder()) {}
@@ -53,16 +65,32 @@ TestFolder::~TestFolder() {
   std::filesystem::remove_all(path_, ignored);
 }
 
-TestInstallation::TestInstallation(Content content) : folder_(newFolder()) {
+TestInstallation::TestInstallation(Content content) {
+  if (onServer()) {
+    resetServer(content);
+    return;
+  }
+  folder_ = newFolder();
   std::filesystem::copy(modelOf(content), folder_);
 }
 
 TestInstallation::~TestInstallation() {
+  isServerTaken = false;
   std::error_code ignored;
   std::filesystem::remove_all(folder_, ignored);
 }
 
+const std::filesystem::path& TestInstallation::folder() const {
+  if (onServer()) throw std::logic_error("a server has no folder");
+  return folder_;
+}
+
+std::string TestInstallation::server() const {
+  return onServer() ? TestServer::instance().server() : "file:" + folder_.string();
+}
+
 std::string TestInstallation::administratorString(const std::string& database) const {
+  if (onServer()) return TestServer::instance().administratorString(database);
   return "provider=sqloledb;data source=" + server() + ";database=" + database +
          ";uid=sa;pwd=" + administratorPassword + ";";
 }

@@ -5,11 +5,12 @@
 
 namespace QVSa::test {
 
-// An installation of the embedded engine in a folder of its own, with the databases as they are shipped or empty; the
-// folder goes with the object. It lies on a memory-backed file system where there is one.
+// An installation, with the databases as they are shipped or empty. On the embedded engine it lies in a folder of its
+// own, on a memory-backed file system where there is one, and goes with the object. On a server (see TestServer) there
+// is one at a time.
 class TestInstallation {
  public:
-  static constexpr const char* administratorPassword = "test-admin";  // of the log-in sa
+  static constexpr const char* administratorPassword = "test-admin";  // of the log-in sa of the embedded engine
 
   enum class Content { shipped, empty };
   explicit TestInstallation(Content content = Content::shipped);
@@ -17,9 +18,10 @@ class TestInstallation {
   TestInstallation(const TestInstallation&) = delete;
   TestInstallation& operator=(const TestInstallation&) = delete;
 
-  const std::filesystem::path& folder() const { return folder_; }
+  // Of the embedded engine alone.
+  const std::filesystem::path& folder() const;
   // As `connect` of the public classes takes it.
-  std::string server() const { return "file:" + folder_.string(); }
+  std::string server() const;
   // The connection string of the log-in sa.
   std::string administratorString(const std::string& database) const;
 

@@ -45,6 +45,7 @@ TEST_F(LogExport, IsALineAnEntryInTheSystemsCodePage) {
 }
 
 TEST_F(LogExport, LeavesTheOldFileWhereItCannotBeDone) {
+  if (test::onServer()) GTEST_SKIP() << "a file of the installation is among them";
   writeThree();
   std::ofstream(path("log.txt")) << "old";
   std::filesystem::create_directory(path("taken"));

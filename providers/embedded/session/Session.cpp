@@ -171,7 +171,8 @@ void EmbeddedSession::runStep(const std::shared_ptr<Plan>& plan, Step& step, con
   for (const std::size_t database : step.databases) workspace_.enter(database);
   if (step.kind == Step::Kind::control) return control(step.control);
   if (step.kind != Step::Kind::query) {
-    result.affected = write(plan, step, tokens);
+    const Long written = write(plan, step, tokens);
+    if (!nocount_) result.affected = written;
     return;
   }
   auto rows = query(plan, step, tokens);
@@ -311,7 +312,7 @@ void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
     text += (text.empty() ? "" : ",") + quoteName(table.columns[column].name) + "=?";
   text = std::string("update ") + databaseNames[table.database] + "." + quoteName(table.name) + " set " + text +
          " where _rowid_=?";
-  guarded([&] {
+  const Long written = guarded([&] {
     const TimeLimit limit(workspace_.handle(), rowWriteLimit);
     transaction_.refuseAfterLoss();
     workspace_.enter(table.database);
@@ -324,6 +325,7 @@ void EmbeddedSession::writeRow(const TableInfo& table, std::int64_t key,
                                   return static_cast<Long>(sqlite3_changes(workspace_.handle().get()));
                                 }});
   });
+  if (written == 0) throw tsql::rowGone();
 }
 
 void EmbeddedSession::control(const tsql::Statement& statement) {
@@ -350,7 +352,8 @@ void EmbeddedSession::use(const std::string& database) {
 }
 
 void EmbeddedSession::setOption(const tsql::SetOption& option) {
-  // Counts are the caller's own business here; every other option than these two is refused by the parser.
+  // Every other option than these two is refused by the parser.
+  if (option.option == "nocount") nocount_ = option.on;
   if (option.option != "identity_insert") return;
   const Object object = workspace_.catalogue()->find(*option.table, workspace_.database());
   const auto* table = std::get_if<const TableInfo*>(&object);
@@ -368,6 +371,7 @@ void EmbeddedSession::setOption(const tsql::SetOption& option) {
 
 void EmbeddedSession::defineObject(const tsql::Statement& statement) {
   const bool logins = std::holds_alternative<tsql::CreateLogin>(statement) ||
+                      std::holds_alternative<tsql::AlterLogin>(statement) ||
                       (std::holds_alternative<tsql::Drop>(statement) &&
                        std::get<tsql::Drop>(statement).kind == tsql::Drop::Kind::login);
   if (logins) administration_.requireAdministrator();

@@ -60,6 +60,7 @@ class EmbeddedSession : public ProviderSession {
   Transaction transaction_;
   Administration administration_;
   TableKey identityInsert_;  // the table that takes identity values as they are given
+  bool nocount_ = false;
 };
 
 }  // namespace QVSa::embedded

@@ -10,7 +10,12 @@ namespace QVSa::embedded {
 
 namespace {
 
-constexpr Long deadlocked = 1205;
+// A deadlock, and a text that does not convert: with these a server ends the batch and its transaction.
+bool endsTransaction(Long native) {
+  constexpr Long deadlocked = 1205;
+  return native == deadlocked || tsql::failureNumber(native) == number::conversion;
+}
+
 // A longer transaction than any of the library's own is not kept to be made again.
 constexpr std::size_t mostChanges = 100;
 
@@ -75,7 +80,7 @@ void Transaction::refuseAfterLoss() const {
 void Transaction::afterFailure(Long native) {
   const bool hasWritten = settled_ || !changes_.empty();
   const bool ended = started_ && !handle().inTransaction();
-  if (marked_ && (native == deadlocked || undone_ || (ended && hasWritten))) {
+  if (marked_ && (endsTransaction(native) || undone_ || (ended && hasWritten))) {
     lost_ = true;
     rollback();
     marked_ = lost_ = true;

@@ -303,6 +303,14 @@ void createLogin(Handle& handle, const tsql::CreateLogin& login) {
       {login.name, platform::makePasswordDigest(login.password.text)});
 }
 
+void alterLogin(Handle& handle, const tsql::AlterLogin& login) {
+  if (handle.loginDigest(login.name).empty())
+    throw tsql::sqlFailure(
+        15151, "Cannot alter the login '" + login.name + "', because it does not exist or you do not have permission.");
+  run(handle, "update master.logins set digest=? where name=?",
+      {platform::makePasswordDigest(login.password.text), login.name});
+}
+
 template <class Info>
 const Info* infoNamed(const Catalogue& catalogue, std::size_t database, const std::string& name) {
   if (!catalogue.exists(database, name) || catalogue.synonym(database, name)) return nullptr;
@@ -392,7 +400,8 @@ bool isDefinition(const tsql::Statement& statement) {
         using Kind = std::decay_t<decltype(value)>;
         return std::is_same_v<Kind, tsql::CreateTable> || std::is_same_v<Kind, tsql::CreateView> ||
                std::is_same_v<Kind, tsql::CreateIndex> || std::is_same_v<Kind, tsql::CreateSynonym> ||
-               std::is_same_v<Kind, tsql::CreateLogin> || std::is_same_v<Kind, tsql::Drop>;
+               std::is_same_v<Kind, tsql::CreateLogin> || std::is_same_v<Kind, tsql::AlterLogin> ||
+               std::is_same_v<Kind, tsql::Drop>;
       },
       statement);
 }
@@ -420,6 +429,8 @@ void define(Handle& handle, const Catalogue& catalogue, std::size_t currentDatab
     createIndex(handle, catalogue, currentDatabase, *index);
   } else if (const auto* login = std::get_if<tsql::CreateLogin>(&statement)) {
     createLogin(handle, *login);
+  } else if (const auto* known = std::get_if<tsql::AlterLogin>(&statement)) {
+    alterLogin(handle, *known);
   } else {
     drop(handle, catalogue, currentDatabase, std::get<tsql::Drop>(statement));
   }
