@@ -61,7 +61,7 @@ bool readPieces(SQLHSTMT statement, std::size_t ordinal, SQLSMALLINT type, std::
 Variant readText(SQLHSTMT statement, std::size_t ordinal) {
   std::u16string value;
   if (!readPieces(statement, ordinal, SQL_C_WCHAR, sizeof(SQLWCHAR), value)) return Variant::null();
-  return fromWide(value);
+  return fromUtf16(value);
 }
 
 Variant readBytes(SQLHSTMT statement, std::size_t ordinal) {

@@ -127,7 +127,7 @@ std::vector<Diagnostic> diagnostics(SQLSMALLINT handleType, SQLHANDLE handle) {
                                         static_cast<SQLSMALLINT>(text.size()), &length);
     if (!SQL_SUCCEEDED(rc)) return result;
     const auto units = std::min(static_cast<std::size_t>(std::max<SQLSMALLINT>(length, 0)), text.size() - 1);
-    result.push_back({fromWide(state.substr(0, 5)), static_cast<Long>(native), fromWide(text.substr(0, units))});
+    result.push_back({fromUtf16(state.substr(0, 5)), static_cast<Long>(native), fromUtf16(text.substr(0, units))});
   }
 }
 

@@ -10,7 +10,7 @@ Link::Link(const String& odbcText, const String& password, std::chrono::seconds 
     throw failure(diagnostics(SQL_HANDLE_ENV, environment()));
   }
   SQLSetConnectAttrW(handle_, SQL_ATTR_LOGIN_TIMEOUT, attributeValue(loginTimeout.count()), SQL_IS_UINTEGER);
-  std::u16string text = toWide(odbcText);
+  std::u16string text = toUtf16(odbcText);
   const SQLRETURN rc = SQLDriverConnectW(handle_, nullptr, wideData(text), static_cast<SQLSMALLINT>(text.size()),
                                          nullptr, 0, nullptr, SQL_DRIVER_NOPROMPT);
   if (SQL_SUCCEEDED(rc)) return;

@@ -78,7 +78,7 @@ void Parameter::hold(SQLSMALLINT cType, SQLSMALLINT type, const void* data, std:
 }
 
 void Parameter::holdText(const String& text) {
-  const std::u16string wide = toWide(text);
+  const std::u16string wide = toUtf16(text);
   hold(SQL_C_WCHAR, wide.size() > longestText ? SQL_WLONGVARCHAR : SQL_WVARCHAR, wide.data(),
        wide.size() * sizeof(char16_t));
   size_ = std::max<SQLULEN>(wide.size(), 1);

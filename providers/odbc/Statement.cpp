@@ -43,7 +43,7 @@ bool Statement::check(SQLRETURN rc) const {
 }
 
 void Statement::execute(const String& text) {
-  std::u16string wide = toWide(text);
+  std::u16string wide = toUtf16(text);
   // SQL_NO_DATA is a write that met no row.
   check(SQLExecDirectW(handle_, wideData(wide), static_cast<SQLINTEGER>(wide.size())));
 }
@@ -69,7 +69,7 @@ std::pair<Column, ColumnType> Statement::describe(std::size_t ordinal) const {
                         static_cast<SQLSMALLINT>(name.size()), &length, &type.type, &type.size, &type.digits,
                         &nullable));
   name.resize(std::min(static_cast<std::size_t>(length), name.size() - 1));
-  return {Column{fromWide(name), isLong(type)}, type};
+  return {Column{fromUtf16(name), isLong(type)}, type};
 }
 
 Long Statement::affected() const {
