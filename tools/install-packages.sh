@@ -9,7 +9,7 @@ packages="build-essential cmake ninja-build ccache
   libsqlite3-dev libssl-dev unixodbc-dev tdsodbc libsqliteodbc
   pkgconf libkrb5-dev gss-ntlmssp libldap-dev slapd ldap-utils openssl
   libpugixml-dev zlib1g-dev libcli11-dev nlohmann-json3-dev libfccp-dev
-  libgtest-dev libbenchmark-dev"
+  libgtest-dev libbenchmark-dev python3"
 
 case "${1:-}" in
   "") ;;

@@ -56,6 +56,12 @@ class Variant {
   // The bytes held; of a text its UTF-8. Throws 13 for anything else.
   Bytes toBytes() const;
 
+  // `visitor` called with what is held, as std::visit does it; Empty is std::monostate.
+  template <class Visitor>
+  decltype(auto) visit(const Visitor& visitor) const {
+    return std::visit(visitor, value_);
+  }
+
   // Same kind and same value; no conversion.
   friend bool operator==(const Variant& a, const Variant& b) { return a.value_ == b.value_; }
 
