@@ -57,13 +57,15 @@ bench: packages  ## Run the benchmarks, each operation beside its floor (build/b
 	@for program in $$(find build/bench/bench -maxdepth 1 -type f -executable | sort); do \
 	  printf '\n== %s\n' "$$program"; "$$program"; done
 
-fuzz:  ## Fuzz statements of T-SQL up to SQLite for a minute (build/fuzz)
+fuzz:  ## Fuzz statements of T-SQL up to SQLite, and the C interface, a minute each (build/fuzz)
 	@tools/install-packages.sh fuzz
-	$(say) 'Building the fuzz target (build/fuzz)'
+	$(say) 'Building the fuzz targets (build/fuzz)'
 	@cmake --preset fuzz --log-level=NOTICE
-	@cmake --build --preset fuzz -j $(JOBS) --target statement_fuzz
+	@cmake --build --preset fuzz -j $(JOBS) --target fuzzers
+	@mkdir -p build/fuzz/calls
 	@test -d build/fuzz/corpus || { mkdir build/fuzz/corpus; split -l 1 -a 3 tests/tsql/statements.txt build/fuzz/corpus/; }
 	@build/fuzz/tests/fuzz/statement_fuzz -max_total_time=60 -dict=tests/fuzz/tsql.dict build/fuzz/corpus
+	@build/fuzz/tests/fuzz/call_sequence_fuzz -max_total_time=60 build/fuzz/calls
 
 docs:  ## Print the table of functions and operators into docs/dialect.md
 	@cmake --preset release --log-level=NOTICE
@@ -71,7 +73,7 @@ docs:  ## Print the table of functions and operators into docs/dialect.md
 	@sed -i -e '/^<!-- table -->$$/,/^<!-- end of the table -->$$/{//!d}' docs/dialect.md
 	@build/release/tools/dialect_table | sed -i '/^<!-- table -->$$/r /dev/stdin' docs/dialect.md
 
-sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h')
+sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h' '*.c')
 
 format:  ## Format all sources
 	@tools/install-packages.sh lint
