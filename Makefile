@@ -50,12 +50,14 @@ sanitize: packages  ## Run all tests under the address and undefined behaviour s
 	$(say) 'Testing with the sanitizers'
 	@ctest --preset sanitize $(TESTS)
 
-bench: packages  ## Run the benchmarks, each operation beside its floor (build/bench)
+bench: packages  ## Run the benchmarks, each operation beside its floor, and Python (build/bench)
 	$(say) 'Building the benchmarks (build/bench)'
 	@cmake --preset bench --log-level=NOTICE
 	@cmake --build --preset bench -j $(JOBS)
 	@for program in $$(find build/bench/bench -maxdepth 1 -type f -executable | sort); do \
 	  printf '\n== %s\n' "$$program"; "$$program"; done
+	$(say) 'bench/python_binding.py'
+	@QVSA_LIBRARY=build/bench/bindings/c/libqvsa_c.so PYTHONPATH=bindings/python python3 bench/python_binding.py
 
 fuzz:  ## Fuzz statements of T-SQL up to SQLite, and the C interface, a minute each (build/fuzz)
 	@tools/install-packages.sh fuzz
