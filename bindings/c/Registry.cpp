@@ -6,11 +6,14 @@
 #include "bindings/c/Class.h"
 
 // The public classes, each described in the file of its name in classes/.
-#define QVSA_PUBLIC_CLASSES(each)                                                                                      \
-  each(AclRule) each(BKPlan) each(BKPlans) each(cCRC32) each(cSchedule) each(DBMgr) each(Department) each(Departments) \
-      each(Directory) each(Home) each(IdMgr) each(IdMgrs) each(Job) each(Jobs) each(LogRecord) each(LogRecords)        \
-          each(QVAgent) each(Role) each(Roles) each(safeRule) each(Session) each(Sessions) each(tmpSafe) each(User)    \
-              each(userGroup) each(userGroups) each(Users)
+// clang-format off
+#define QVSA_PUBLIC_CLASSES(each) \
+  each(AclRule) each(BKPlan) each(BKPlans) each(cCRC32) each(cSchedule) each(DBMgr) \
+  each(Department) each(Departments) each(Directory) each(Home) each(IdMgr) each(IdMgrs) \
+  each(Job) each(Jobs) each(LogRecord) each(LogRecords) each(QVAgent) each(Role) each(Roles) \
+  each(safeRule) each(Session) each(Sessions) each(tmpSafe) each(User) each(userGroup) \
+  each(userGroups) each(Users)
+// clang-format on
 
 namespace QVSa::binding {
 
