@@ -1,4 +1,6 @@
+#include <algorithm>
 #include <cstring>
+#include <initializer_list>
 
 #include "QVSa/values/Failure.h"
 #include "bindings/c/Call.h"
@@ -47,9 +49,9 @@ int guarded(const Body& body) noexcept {
   }
 }
 
-template <class... Pointers>
-void require(Pointers... pointers) {
-  if (((pointers == nullptr) || ...)) throw CallFailure(QVSA_POINTER, "A null pointer was given.");
+void require(std::initializer_list<const void*> pointers) {
+  if (std::find(pointers.begin(), pointers.end(), nullptr) != pointers.end())
+    throw CallFailure(QVSA_POINTER, "A null pointer was given.");
 }
 
 void clear(qvsa_value* value) {
@@ -79,7 +81,7 @@ using namespace QVSa::binding;
 int qvsa_create(const char* class_name, qvsa_value* object) noexcept {
   clear(object);
   return guarded([&] {
-    require(class_name, object);
+    require({class_name, object});
     const ClassDescription& type = registry().named(class_name);
     *object = objectValue({type.make(), &type});
   });
@@ -87,7 +89,7 @@ int qvsa_create(const char* class_name, qvsa_value* object) noexcept {
 
 int qvsa_release(qvsa_value* value) noexcept {
   return guarded([&] {
-    require(value);
+    require({value});
     const qvsa_value released = std::exchange(*value, qvsa_empty());
     release(released);
   });
@@ -96,7 +98,7 @@ int qvsa_release(qvsa_value* value) noexcept {
 int qvsa_get(qvsa_object object, const char* property, qvsa_value* value) noexcept {
   clear(value);
   return guarded([&] {
-    require(property, value);
+    require({property, value});
     const Use use(object);
     const Property& wanted = use.type().property(property);
     if (!wanted.get) throw CallFailure(QVSA_ACCESS, wanted.name + " can only be set.");
@@ -106,7 +108,7 @@ int qvsa_get(qvsa_object object, const char* property, qvsa_value* value) noexce
 
 int qvsa_set(qvsa_object object, const char* property, const qvsa_value* value) noexcept {
   return guarded([&] {
-    require(property, value);
+    require({property, value});
     const Use use(object);
     const Property& wanted = use.type().property(property);
     if (!wanted.set) throw CallFailure(QVSA_ACCESS, wanted.name + " can't be set.");
@@ -118,8 +120,8 @@ int qvsa_call(qvsa_object object, const char* operation, qvsa_value* arguments, 
               qvsa_value* result) noexcept {
   clear(result);
   return guarded([&] {
-    require(operation);
-    if (count > 0) require(arguments);
+    require({operation});
+    if (count > 0) require({arguments});
     const Use use(object);
     const Operation& wanted = use.type().operation(operation);
     wanted.checkCount(count);
@@ -134,7 +136,7 @@ int qvsa_call(qvsa_object object, const char* operation, qvsa_value* arguments, 
 int qvsa_enumerate(qvsa_object collection, qvsa_value* walk) noexcept {
   clear(walk);
   return guarded([&] {
-    require(walk);
+    require({walk});
     const Use use(collection);
     if (!use.type().walk) throw CallFailure(QVSA_NO_MEMBER, use.type().name + " is no collection.");
     qvsa_value value = emptyValue(QVSA_OBJECT);
@@ -146,7 +148,7 @@ int qvsa_enumerate(qvsa_object collection, qvsa_value* walk) noexcept {
 int qvsa_next(qvsa_object walk, qvsa_value* item) noexcept {
   clear(item);
   return guarded([&] {
-    require(item);
+    require({item});
     Object next = handles().nextOf(walk);
     if (next.pointer) *item = objectValue(std::move(next));
   });
