@@ -38,13 +38,11 @@ int guarded(const Body& body) noexcept {
   } catch (const CallFailure& failure) {
     lastError.set(0, failure.what());
     return failure.code();
-  } catch (const std::exception& error) {
-    try {
-      const Failure failure = asFailure(error);
-      lastError.set(failure.number(), failure.what());
-    } catch (const std::exception&) {
-      lastError.set(number::memory, "Out of memory");
-    }
+  } catch (...) {
+    Long number = 0;
+    String description;
+    tellCurrentFailure(number, description);
+    lastError.set(number, description.c_str());
     return QVSA_RAISED;
   }
 }

@@ -77,7 +77,8 @@ class Headers:
 
     def public_headers(self):
         text = (self.sources / "QVSa/QVSa.h").read_text()
-        return re.findall(r'#include "([^"]+)"', text)
+        # What lies in hosting is for hosts in C++.
+        return [path for path in re.findall(r'#include "([^"]+)"', text) if "/hosting/" not in path]
 
     def functions(self, path, name, sections):
         """The functions of class `name`: by name the list of (result, arguments) of the overloads."""
@@ -111,9 +112,10 @@ class Headers:
             room = Path(header).parent
             includes = re.findall(r'#include "([^"]+)"', (self.sources / header).read_text())
             for path in [header, *(include for include in includes if Path(include).parent == room)]:
-                for name, body in re.findall(r"\benum (\w+)[^{;]*\{([^}]*)\}", self.read(path)):
+                for indent, name, body in re.findall(r"^( *)enum (\w+)[^{;]*\{([^}]*)\}", self.read(path), flags=re.M):
                     entries = (entry.split("=") for entry in body.split(","))
-                    found[name] = {key.strip(): int(value) for key, value in entries}
+                    # Those inside a class have its name in front.
+                    found[Path(path).stem + name if indent else name] = {key.strip(): int(value) for key, value in entries}
         return found
 
 

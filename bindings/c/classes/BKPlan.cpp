@@ -20,7 +20,8 @@ void describe(Class<BKPlan>& plan) {
       .operation("Save", {}, &BKPlan::Save, failsWith(false))
       .operation("newSche", {}, &BKPlan::newSche)
       .operation("Delete", {optional("Id", 0)}, &BKPlan::Delete, failsWith(false))
-      .operation("exec", {"schNo"}, &BKPlan::exec, failsWith(false));
+      .operation("exec", {"schNo"}, &BKPlan::exec, failsWith(false))
+      .enumeration("BKPlanKey", {{"byId", BKPlan::byId}, {"byName", BKPlan::byName}});
 }
 
 }  // namespace QVSa::binding

@@ -25,7 +25,10 @@ void describe(Class<Department>& department) {
       .operation("Delete", {optional("Id", "")}, &Department::Delete, failsWith(false))
       .operation("GetAllSub", {}, &Department::GetAllSub, failsWithNothing())
       .operation("GetSub", {}, &Department::GetSub, failsWithNothing())
-      .operation("GetUsers", {}, &Department::GetUsers, failsWithNothing());
+      .operation("GetUsers", {}, &Department::GetUsers, failsWithNothing())
+      .enumeration(
+          "DepartmentKey",
+          {{"byInnerId", Department::byInnerId}, {"byNumber", Department::byNumber}, {"byName", Department::byName}});
 }
 
 }  // namespace QVSa::binding

@@ -31,7 +31,8 @@ void describe(Class<Role>& role) {
       .operation("UpdateUsers", {"newUserJobIds", "delUserJobIds"}, &Role::UpdateUsers, failsWith(false))
       .operation("setJobs", {"depts", optional("DeptIdsDeleted", "")}, &Role::setJobs, failsWith(false))
       .operation("GetJobIdOfTheDept", {"deptId"}, &Role::GetJobIdOfTheDept, failsWith(0, -1))
-      .operation("getAcl", {optional("Id", 0)}, &Role::getAcl);
+      .operation("getAcl", {optional("Id", 0)}, &Role::getAcl)
+      .enumeration("RoleKey", {{"byId", Role::byId}, {"byName", Role::byName}});
 }
 
 }  // namespace QVSa::binding

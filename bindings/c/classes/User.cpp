@@ -74,7 +74,12 @@ void describe(Class<User>& user) {
       .operation("chkRegPwd", {"Pwd"}, &User::chkRegPwd)
       .operation("RecordAction", {"uid", "sId", input("s")}, &User::RecordAction)
       .enumeration("userTypes",
-                   {{"Genaral", Genaral}, {"adUser", adUser}, {"autoReg", autoReg}, {"ldapUser", ldapUser}});
+                   {{"Genaral", Genaral}, {"adUser", adUser}, {"autoReg", autoReg}, {"ldapUser", ldapUser}})
+      .enumeration("AccountState", {{"accountNormal", accountNormal},
+                                    {"accountLocked", accountLocked},
+                                    {"accountWaiting", accountWaiting},
+                                    {"accountRefused", accountRefused}})
+      .enumeration("UserKey", {{"byId", User::byId}, {"byName", User::byName}, {"byLogin", User::byLogin}});
 }
 
 }  // namespace QVSa::binding

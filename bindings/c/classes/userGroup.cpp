@@ -17,7 +17,8 @@ void describe(Class<userGroup>& group) {
       .operation("SetRoles", {"roleList"}, &userGroup::SetRoles, failsWith(false))
       .operation("GetOne", {"keyName", "keyValue"}, &userGroup::GetOne, failsWith(false))
       .operation("Delete", {optional("Id", 0)}, &userGroup::Delete, failsWith(false))
-      .operation("Save", {}, &userGroup::Save, failsWith(false));
+      .operation("Save", {}, &userGroup::Save, failsWith(false))
+      .enumeration("userGroupKey", {{"byId", userGroup::byId}, {"byName", userGroup::byName}});
 }
 
 }  // namespace QVSa::binding

@@ -29,6 +29,15 @@ class Object:
 class Collection(Object):
     def __contains__(self, index: int | str) -> bool: ...
 
+class BKPlanKey(IntEnum):
+    byId = 1
+    byName = 2
+
+class DepartmentKey(IntEnum):
+    byInnerId = 0
+    byNumber = 1
+    byName = 2
+
 class qvIdDatePart(IntEnum):
     noDate = 0
     yymm = 1
@@ -44,11 +53,30 @@ class qvIdReuse(IntEnum):
     sameMonth = 2
     anyone = 3
 
+class RoleKey(IntEnum):
+    byId = 1
+    byName = 2
+
 class userTypes(IntEnum):
     Genaral = 0
     adUser = 1
     autoReg = 2
     ldapUser = 3
+
+class AccountState(IntEnum):
+    accountNormal = 0
+    accountLocked = 1
+    accountWaiting = 2
+    accountRefused = 3
+
+class UserKey(IntEnum):
+    byId = 1
+    byName = 2
+    byLogin = 3
+
+class userGroupKey(IntEnum):
+    byId = 1
+    byName = 2
 
 class AclRule(Object):
     def __init__(self, server: str = ..., DBName: str = ...) -> None: ...
