@@ -8,7 +8,7 @@ JOBS ?= $(shell nproc)
 export CTEST_PARALLEL_LEVEL ?= $(JOBS)
 say = @printf '\n== %s\n'
 
-.PHONY: help packages build demo test test-long mutate sanitize bench fuzz docs format lint clean
+.PHONY: help packages build demo test test-long mutate sanitize bench fuzz docs package options format lint clean
 
 help:  ## List the targets
 	@grep -hE '^[a-z-]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
@@ -57,7 +57,7 @@ bench: packages  ## Run the benchmarks, each operation beside its floor, and Pyt
 	@for program in $$(find build/bench/bench -maxdepth 1 -type f -executable | sort); do \
 	  printf '\n== %s\n' "$$program"; "$$program"; done
 	$(say) 'bench/python_binding.py'
-	@QVSA_LIBRARY=build/bench/bindings/c/libqvsa_c.so PYTHONPATH=bindings/python python3 bench/python_binding.py
+	@QVSA_LIBRARY=build/bench/packaging/libqvsa.so PYTHONPATH=bindings/python python3 bench/python_binding.py
 
 fuzz:  ## Fuzz statements of T-SQL up to SQLite, and the C interface, a minute each (build/fuzz)
 	@tools/install-packages.sh fuzz
@@ -69,7 +69,19 @@ fuzz:  ## Fuzz statements of T-SQL up to SQLite, and the C interface, a minute e
 	@build/fuzz/tests/fuzz/statement_fuzz -max_total_time=60 -dict=tests/fuzz/tsql.dict build/fuzz/corpus
 	@build/fuzz/tests/fuzz/call_sequence_fuzz -max_total_time=60 build/fuzz/calls
 
-docs:  ## Print the table of functions and operators into docs/dialect.md
+package:  ## Build the Debian packages from the committed tree, check them, and try them in a bare root (build/packages)
+	@tools/install-packages.sh package
+	@packaging/make-packages.sh
+
+options: packages  ## Build the library without each of its parts, and look whether that fails as it should
+	@packaging/check-options.sh
+
+docs:  ## Write the pages of the public headers (build/docs/html), and the table of docs/dialect.md
+	@tools/install-packages.sh docs
+	@mkdir -p build/docs
+	@QVSA_VERSION=$$(sed -n 's/^project(QVSa VERSION \([0-9.]*\).*/\1/p' CMakeLists.txt) \
+	  QVSA_HEADERS="$$(sed -n '/QVSA_PUBLIC_HEADERS/,/)/p' QVSa/CMakeLists.txt | grep -o 'QVSa/.*\.h' | tr '\n' ' ') bindings/c/qvsa.h" \
+	  doxygen docs/Doxyfile
 	@cmake --preset release --log-level=NOTICE
 	@cmake --build --preset release -j $(JOBS) --target dialect_table
 	@sed -i -e '/^<!-- table -->$$/,/^<!-- end of the table -->$$/{//!d}' docs/dialect.md

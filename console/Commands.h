@@ -28,6 +28,7 @@ void addDirectory(Console& console);
 void addBackups(Console& console);
 void addPlans(Console& console);
 void addAgent(Console& console);
+void addSecrets(Console& console);
 void addDoctor(Console& console);
 
 }  // namespace QVSa::console

@@ -24,6 +24,7 @@ int main(int argc, char** argv) {
   QVSa::console::addBackups(console);
   QVSa::console::addPlans(console);
   QVSa::console::addAgent(console);
+  QVSa::console::addSecrets(console);
   QVSa::console::addDoctor(console);
   return console.main(argc, argv);
 }

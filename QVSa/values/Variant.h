@@ -13,7 +13,7 @@ namespace QVSa {
 // The conversions follow the run-time's rules and throw Failure: 94 for Null, 13 for a text that does not read as the
 // wanted kind, 6 where the value does not fit. Empty converts to 0, False and the empty text. Fractions round half to
 // even. A Boolean is -1 or 0 as a number and as a text.
-class Variant {
+class QVSA_EXPORT Variant {
  public:
   struct NullValue {
     friend constexpr bool operator==(NullValue, NullValue) { return true; }

@@ -2,6 +2,7 @@
 #include <cstring>
 #include <initializer_list>
 
+#include "QVSa/frame/Version.h"
 #include "QVSa/values/Failure.h"
 #include "bindings/c/Call.h"
 #include "bindings/c/Registry.h"
@@ -158,7 +159,7 @@ const char* qvsa_describe(void) noexcept {
   return text;
 }
 
-const char* qvsa_version(void) noexcept { return QVSA_VERSION; }
+const char* qvsa_version(void) noexcept { return QVSa::version(); }
 
 const char* qvsa_error_text(void) noexcept { return lastError.text; }
 

@@ -115,7 +115,7 @@ String Registry::toJson() const {
     for (const Enumeration& enumeration : description->enumerations) enumerations.push_back(jsonOf(enumeration));
     classes.push_back(jsonOf(*description));
   }
-  return Json{{"version", QVSA_VERSION}, {"enumerations", enumerations}, {"classes", classes}}.dump();
+  return Json{{"version", version()}, {"enumerations", enumerations}, {"classes", classes}}.dump();
 }
 
 }  // namespace QVSa::binding

@@ -77,13 +77,13 @@ class Headers:
 
     def public_headers(self):
         text = (self.sources / "QVSa/QVSa.h").read_text()
-        # What lies in hosting is for hosts in C++.
-        return [path for path in re.findall(r'#include "([^"]+)"', text) if "/hosting/" not in path]
+        # What lies in hosting is for hosts in C++, and the version has a call of its own.
+        return [path for path in re.findall(r'#include "([^"]+)"', text) if not re.search("/(hosting|frame)/", path)]
 
     def functions(self, path, name, sections):
         """The functions of class `name`: by name the list of (result, arguments) of the overloads."""
         text = self.read(path)
-        opening = re.search(rf"\bclass {name}\b([^;{{]*)\{{", text)
+        opening = re.search(rf"\bclass (?:QVSA_EXPORT )?{name}\b([^;{{]*)\{{", text)
         section, functions = "private", {}
         for part in re.split(r"\b(public|protected|private):", body_of(text, opening)):
             if part in ("public", "protected", "private"):

@@ -1,6 +1,6 @@
 #include "QVSa/maintenance/internal/BackupLock.h"
 
-#include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Secrets.h"
 #include "QVSa/maintenance/internal/RotatedKey.h"
 #include "platform/SecretMessage.h"
 
@@ -8,7 +8,7 @@ namespace QVSa {
 
 namespace {
 
-String key() { return rotatedKey(secrets::backupLockKeyStart); }
+String key() { return rotatedKey(static_cast<Integer>(deploymentSecrets().backupLockKeyStart)); }
 
 }  // namespace
 

@@ -2,12 +2,12 @@
 
 #include <algorithm>
 
-#include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Secrets.h"
 
 namespace QVSa {
 
 String rotatedKey(Integer start) {
-  const auto& characters = secrets::rotatedKeyCharacters;
+  const auto& characters = deploymentSecrets().rotatedKeyCharacters;
   const auto first = characters.begin() + std::clamp<std::ptrdiff_t>(start, 0, std::ssize(characters) - 1);
   String key(first, characters.end());
   return key.append(characters.begin(), first);

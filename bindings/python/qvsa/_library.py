@@ -8,7 +8,7 @@ from ._failure import Failure
 
 EMPTY, NULL, BOOLEAN, INTEGER, LONG, DOUBLE, DATE, TEXT, BYTES, OBJECT, ARRAY = range(11)
 
-_NAME = "libqvsa_c.so.0"
+_NAME = "libqvsa.so.0"
 
 
 class _Given(ctypes.Structure):
