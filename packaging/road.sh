@@ -6,7 +6,7 @@ cd /root
 
 listing() {
   find / -xdev -not -path '/proc/*' -not -path '/sys/*' -not -path '/tmp/*' -not -path '/root/*' -not -path '/srv/*' \
-    -not -path '/var/lib/dpkg/*' -not -path '/var/lib/apt/*' -not -path '/var/cache/*' -not -path '/var/log/*' | sort
+    -not -path '/run/*' -not -path '/etc/*-' -not -path '/var/lib/dpkg/*' -not -path '/var/lib/apt/*' -not -path '/var/cache/*' -not -path '/var/log/*' | sort
 }
 fail() { echo "$*" >&2; exit 1; }
 
@@ -31,10 +31,11 @@ ldd /usr/bin/qvsa | grep 'not found' && fail "a library is missing"
 if setpriv --reuid=nobody --clear-groups qvsa doctor; then fail "a stranger reads the secrets"; fi
 getent passwd qvsa-agent >/dev/null || fail "the agent has no account"
 
-rm -r /etc/qvsa
+rm /etc/qvsa/secrets
 apt-get purge --yes -qq qvsa libqvsa0 libqvsa-dev python3-qvsa >/dev/null
 getent passwd qvsa-agent && fail "the agent's account is left"
+getent group qvsa && fail "the group is left"
 listing >after
 diff before after || fail "something is left"
-[ -e /srv/qvsa/QVSys.db ] || ls /srv/qvsa
+[ -e /srv/qvsa/QVSys.db ] || fail "the data is gone"
 echo "Nothing is left but the data."
