@@ -29,6 +29,7 @@
 #include "QVSa/hosting/PlanRuns.h"
 #include "QVSa/hosting/RuleKeeping.h"
 #include "QVSa/hosting/SafeTexts.h"
+#include "QVSa/hosting/SecretRotation.h"
 #include "QVSa/hosting/SignOn.h"
 #include "QVSa/hosting/UserKeeping.h"
 #include "QVSa/identity/Session.h"

@@ -1,5 +1,6 @@
 #include "QVSa/frame/Secrets.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cstdio>
 #include <cstdlib>
@@ -202,6 +203,13 @@ String Secrets::fileText() const {
 String Secrets::loginPassword() const {
   return connPwdHead + text(connPwdNumber) + scrambleText(connPwdWordA) + scrambleText(lowerCase(connPwdWordB)) +
          connPwdTail;
+}
+
+String Secrets::rotatedKey(Integer start) const {
+  const auto& characters = rotatedKeyCharacters;
+  const auto first = characters.begin() + std::clamp<std::ptrdiff_t>(start, 0, std::ssize(characters) - 1);
+  String key(first, characters.end());
+  return key.append(characters.begin(), first);
 }
 
 String secretsFile() { return chosenFile().value_or(systemFile); }

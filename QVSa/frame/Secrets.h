@@ -30,6 +30,11 @@ struct Secrets {
 
   // The password of QVUser, put together at each call and never stored whole.
   String loginPassword() const;
+  // The ten characters of the rotated key, read from position `start` (0 to 9; anything else is taken as the nearer of
+  // the two) to their end and then from their beginning.
+  String rotatedKey(Integer start) const;
+  // What the lock of a backup is encrypted under.
+  String backupLockKey() const { return rotatedKey(static_cast<Integer>(backupLockKeyStart)); }
 };
 
 // The file that the secrets of this process come from: QVSA_SECRETS where that is set, else /etc/qvsa/secrets. Empty

@@ -2,7 +2,9 @@
 
 #include <memory>
 
+#include "QVSa/hosting/SecretRotation.h"
 #include "console/Commands.h"
+#include "console/Passwords.h"
 #include "console/Table.h"
 #include "platform/PrivateFile.h"
 
@@ -24,6 +26,27 @@ Answer make(const Options& options) {
           {{"file", file}}};
 }
 
+struct Rotation {
+  String newFile;
+  bool restored = false;
+};
+
+Answer rotate(const Console& console, const Rotation& options) {
+  SecretRotation rotation;
+  if (!rotation.connect(console.place().server)) throw Refusal(rotation.errDescription(), rotation.errNumber());
+  const String password = askPassword("Password of sa");
+  require(
+      options.restored ? rotation.rotateTexts(options.newFile, password) : rotation.rotate(options.newFile, password),
+      rotation);
+  Answer answer;
+  answer.document = {{"moved", rotation.moved()}, {"unread", rotation.unread()}};
+  answer.text = String(options.restored ? "" : "The log-in is moved, and ") +
+                counted(static_cast<std::size_t>(rotation.moved()), "encrypted text") + " with it.\n";
+  for (const String& name : rotation.unread()) answer.text += "Could not be read, and stays as it was: " + name + "\n";
+  answer.text += "Put " + options.newFile + " in the place of the old secrets, and start the hosts anew.\n";
+  return answer;
+}
+
 }  // namespace
 
 void addSecrets(Console& console) {
@@ -35,6 +58,13 @@ void addSecrets(Console& console) {
   makeCommand->add_option("file", options->file, "The file; by default QVSA_SECRETS, else /etc/qvsa/secrets");
   makeCommand->add_option("--group", options->group, "A group that may read it: that of the accounts that run hosts");
   console.command(makeCommand, [options] { return make(*options); });
+
+  const auto rotation = std::make_shared<Rotation>();
+  CLI::App* rotateCommand =
+      group->add_subcommand("rotate", "Move the installation from this machine's secrets to those of another file");
+  rotateCommand->add_option("file", rotation->newFile, "The new secrets, as make writes them")->required();
+  rotateCommand->add_flag("--restored", rotation->restored, "The texts alone, after a restore of an older backup");
+  console.command(rotateCommand, [&console, rotation] { return rotate(console, *rotation); });
 }
 
 }  // namespace QVSa::console

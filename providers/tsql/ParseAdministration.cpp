@@ -16,6 +16,7 @@ Token Parser::disk() {
 
 Statement Parser::alter() {
   take();
+  if (takeWord("login")) return login(true);
   expectWord("database");
   AlterDatabase alter;
   alter.database = expectName();

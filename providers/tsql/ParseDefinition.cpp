@@ -7,7 +7,7 @@ Statement Parser::create() {
   if (takeWord("table")) return createTable();
   if (takeWord("view")) return createView();
   if (takeWord("synonym")) return createSynonym();
-  if (takeWord("login")) return createLogin();
+  if (takeWord("login")) return login(false);
   return createIndex();
 }
 
@@ -125,8 +125,9 @@ Statement Parser::createSynonym() {
   return synonym;
 }
 
-Statement Parser::createLogin() {
+Statement Parser::login(bool isChange) {
   CreateLogin login;
+  login.isChange = isChange;
   login.name = expectName();
   expectWord("with");
   expectWord("password");

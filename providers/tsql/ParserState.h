@@ -84,7 +84,7 @@ class Parser {
   Statement createView();
   Statement createIndex();
   Statement createSynonym();
-  Statement createLogin();
+  Statement login(bool isChange);
   void tableElement(CreateTable& table);
   ColumnDefinition columnDefinition();
   bool columnOption(ColumnDefinition& column);

@@ -112,7 +112,7 @@ void Writer::write(const CreateSynonym& synonym) {
 }
 
 void Writer::write(const CreateLogin& login) {
-  add("create login " + printName(login.name) + " with password = ");
+  add((login.isChange ? "alter login " : "create login ") + printName(login.name) + " with password = ");
   writeToken(login.password);
 }
 

@@ -212,6 +212,7 @@ struct CreateSynonym {
 struct CreateLogin {
   String name;
   Token password;
+  bool isChange = false;  // alter login: of one that is there
 };
 
 struct Drop {

@@ -147,6 +147,7 @@ TEST_F(Administration, AWarmHandleKnowsWhatHasChangedSinceItsLastSession) {
   session->run({"drop login QVUser"});
   EXPECT_EQ(native(*session, "drop login QVUser"), 15151);
   EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
+  EXPECT_EQ(native(*session, "alter login QVUser with password=N'another'"), 15151);
   session->run({"create login QVUser with password=N'another'"});
   EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
 }

@@ -295,12 +295,20 @@ void dropIndex(Handle& handle, const TableInfo& table, const std::string& index)
   handle.execute(dropNullIndex(table, index));
 }
 
-void createLogin(Handle& handle, const tsql::CreateLogin& login) {
-  Prepared known(handle.get(), "select 1 from master.logins where name=?");
-  known.bind(1, login.name);
-  if (known.step()) throw tsql::sqlFailure(15025, "The server principal '" + login.name + "' already exists.");
-  run(handle, "insert into master.logins(name,digest) values(?,?)",
-      {login.name, platform::makePasswordDigest(login.password.text)});
+[[noreturn]] void refuseLogin(const std::string& verb, const std::string& name) {
+  throw tsql::sqlFailure(
+      15151, "Cannot " + verb + " the login '" + name + "', because it does not exist or you do not have permission.");
+}
+
+void writeLogin(Handle& handle, const tsql::CreateLogin& login) {
+  const bool isThere = !handle.loginDigest(login.name).empty();
+  const std::string digest = platform::makePasswordDigest(login.password.text);
+  if (login.isChange) {
+    if (!isThere) refuseLogin("alter", login.name);
+    return run(handle, "update master.logins set digest=? where name=?", {digest, login.name});
+  }
+  if (isThere) throw tsql::sqlFailure(15025, "The server principal '" + login.name + "' already exists.");
+  run(handle, "insert into master.logins(name,digest) values(?,?)", {login.name, digest});
 }
 
 template <class Info>
@@ -318,9 +326,7 @@ void drop(Handle& handle, const Catalogue& catalogue, std::size_t current, const
     if (!drop.table) refuseDrop("index", name);
     return dropIndex(handle, tableNamed(catalogue, *drop.table, current), name);
   }
-  if (drop.kind == Kind::login && handle.loginDigest(name).empty())
-    throw tsql::sqlFailure(
-        15151, "Cannot drop the login '" + name + "', because it does not exist or you do not have permission.");
+  if (drop.kind == Kind::login && handle.loginDigest(name).empty()) refuseLogin("drop", name);
   if (drop.kind == Kind::login) return run(handle, "delete from master.logins where name=?", {name});
   const std::size_t database = databaseOf(drop.name, current);
   if (drop.kind == Kind::table) {
@@ -419,7 +425,7 @@ void define(Handle& handle, const Catalogue& catalogue, std::size_t currentDatab
   } else if (const auto* index = std::get_if<tsql::CreateIndex>(&statement)) {
     createIndex(handle, catalogue, currentDatabase, *index);
   } else if (const auto* login = std::get_if<tsql::CreateLogin>(&statement)) {
-    createLogin(handle, *login);
+    writeLogin(handle, *login);
   } else {
     drop(handle, catalogue, currentDatabase, std::get<tsql::Drop>(statement));
   }
