@@ -16,7 +16,7 @@ Token Parser::disk() {
 
 Statement Parser::alter() {
   take();
-  if (takeWord("login")) return login(true);
+  if (takeWord("login")) return alterLogin();
   expectWord("database");
   AlterDatabase alter;
   alter.database = expectName();

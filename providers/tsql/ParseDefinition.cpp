@@ -7,7 +7,7 @@ Statement Parser::create() {
   if (takeWord("table")) return createTable();
   if (takeWord("view")) return createView();
   if (takeWord("synonym")) return createSynonym();
-  if (takeWord("login")) return login(false);
+  if (takeWord("login")) return createLogin();
   return createIndex();
 }
 
@@ -125,21 +125,31 @@ Statement Parser::createSynonym() {
   return synonym;
 }
 
-Statement Parser::login(bool isChange) {
+Statement Parser::createLogin() {
   CreateLogin login;
-  login.isChange = isChange;
   login.name = expectName();
-  expectWord("with");
-  expectWord("password");
-  expectSymbol("=");
-  if (now().kind != TokenKind::string) refuse();
-  login.password = take();
+  login.password = loginPassword();
   // The rules for passwords of the host system do not exist here: off is what they are.
   if (!takeSymbol(",")) return login;
   expectWord("check_policy");
   expectSymbol("=");
   switchedOn();
   return login;
+}
+
+Statement Parser::alterLogin() {
+  AlterLogin login;
+  login.name = expectName();
+  login.password = loginPassword();
+  return login;
+}
+
+Token Parser::loginPassword() {
+  expectWord("with");
+  expectWord("password");
+  expectSymbol("=");
+  if (now().kind != TokenKind::string) refuse();
+  return take();
 }
 
 Statement Parser::drop() {

@@ -84,7 +84,9 @@ class Parser {
   Statement createView();
   Statement createIndex();
   Statement createSynonym();
-  Statement login(bool isChange);
+  Statement createLogin();
+  Statement alterLogin();
+  Token loginPassword();
   void tableElement(CreateTable& table);
   ColumnDefinition columnDefinition();
   bool columnOption(ColumnDefinition& column);

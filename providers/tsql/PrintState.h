@@ -32,6 +32,7 @@ class Writer {
   void write(const CreateIndex& index);
   void write(const CreateSynonym& synonym);
   void write(const CreateLogin& login);
+  void write(const AlterLogin& login);
   void write(const Drop& drop);
   void write(const Use& use);
   void write(const SetOption& set);

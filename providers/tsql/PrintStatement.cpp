@@ -112,7 +112,12 @@ void Writer::write(const CreateSynonym& synonym) {
 }
 
 void Writer::write(const CreateLogin& login) {
-  add((login.isChange ? "alter login " : "create login ") + printName(login.name) + " with password = ");
+  add("create login " + printName(login.name) + " with password = ");
+  writeToken(login.password);
+}
+
+void Writer::write(const AlterLogin& login) {
+  add("alter login " + printName(login.name) + " with password = ");
   writeToken(login.password);
 }
 

@@ -212,7 +212,11 @@ struct CreateSynonym {
 struct CreateLogin {
   String name;
   Token password;
-  bool isChange = false;  // alter login: of one that is there
+};
+
+struct AlterLogin {
+  String name;
+  Token password;
 };
 
 struct Drop {
@@ -273,8 +277,8 @@ struct VerifyBackup {
   Token file;
 };
 
-using Statement =
-    std::variant<SelectPtr, Insert, Update, Delete, CreateTable, CreateView, CreateIndex, CreateSynonym, CreateLogin,
-                 Drop, Use, SetOption, Transaction, Call, AlterDatabase, BackupDatabase, RestoreDatabase, VerifyBackup>;
+using Statement = std::variant<SelectPtr, Insert, Update, Delete, CreateTable, CreateView, CreateIndex, CreateSynonym,
+                               CreateLogin, AlterLogin, Drop, Use, SetOption, Transaction, Call, AlterDatabase,
+                               BackupDatabase, RestoreDatabase, VerifyBackup>;
 
 }  // namespace QVSa::tsql

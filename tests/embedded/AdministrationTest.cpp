@@ -150,6 +150,8 @@ TEST_F(Administration, AWarmHandleKnowsWhatHasChangedSinceItsLastSession) {
   EXPECT_EQ(native(*session, "alter login QVUser with password=N'another'"), 15151);
   session->run({"create login QVUser with password=N'another'"});
   EXPECT_EQ(thrownBy([&] { open("QVSys"); }).native(), 18456);
+  session->run({"alter login qvuser with password=N'" + defaultDbPwd() + "'"});
+  EXPECT_EQ(native(*open("QVSys"), "alter login sa with password=N'mine now'"), 229);
 }
 
 TEST_F(Administration, ARestoreNeedsTheDatabaseForItself) {

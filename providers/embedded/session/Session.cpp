@@ -368,6 +368,7 @@ void EmbeddedSession::setOption(const tsql::SetOption& option) {
 
 void EmbeddedSession::defineObject(const tsql::Statement& statement) {
   const bool logins = std::holds_alternative<tsql::CreateLogin>(statement) ||
+                      std::holds_alternative<tsql::AlterLogin>(statement) ||
                       (std::holds_alternative<tsql::Drop>(statement) &&
                        std::get<tsql::Drop>(statement).kind == tsql::Drop::Kind::login);
   if (logins) administration_.requireAdministrator();

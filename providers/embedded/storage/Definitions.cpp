@@ -295,20 +295,20 @@ void dropIndex(Handle& handle, const TableInfo& table, const std::string& index)
   handle.execute(dropNullIndex(table, index));
 }
 
-[[noreturn]] void refuseLogin(const std::string& verb, const std::string& name) {
-  throw tsql::sqlFailure(
-      15151, "Cannot " + verb + " the login '" + name + "', because it does not exist or you do not have permission.");
+void createLogin(Handle& handle, const tsql::CreateLogin& login) {
+  Prepared known(handle.get(), "select 1 from master.logins where name=?");
+  known.bind(1, login.name);
+  if (known.step()) throw tsql::sqlFailure(15025, "The server principal '" + login.name + "' already exists.");
+  run(handle, "insert into master.logins(name,digest) values(?,?)",
+      {login.name, platform::makePasswordDigest(login.password.text)});
 }
 
-void writeLogin(Handle& handle, const tsql::CreateLogin& login) {
-  const bool isThere = !handle.loginDigest(login.name).empty();
-  const std::string digest = platform::makePasswordDigest(login.password.text);
-  if (login.isChange) {
-    if (!isThere) refuseLogin("alter", login.name);
-    return run(handle, "update master.logins set digest=? where name=?", {digest, login.name});
-  }
-  if (isThere) throw tsql::sqlFailure(15025, "The server principal '" + login.name + "' already exists.");
-  run(handle, "insert into master.logins(name,digest) values(?,?)", {login.name, digest});
+void alterLogin(Handle& handle, const tsql::AlterLogin& login) {
+  if (handle.loginDigest(login.name).empty())
+    throw tsql::sqlFailure(
+        15151, "Cannot alter the login '" + login.name + "', because it does not exist or you do not have permission.");
+  run(handle, "update master.logins set digest=? where name=?",
+      {platform::makePasswordDigest(login.password.text), login.name});
 }
 
 template <class Info>
@@ -326,7 +326,9 @@ void drop(Handle& handle, const Catalogue& catalogue, std::size_t current, const
     if (!drop.table) refuseDrop("index", name);
     return dropIndex(handle, tableNamed(catalogue, *drop.table, current), name);
   }
-  if (drop.kind == Kind::login && handle.loginDigest(name).empty()) refuseLogin("drop", name);
+  if (drop.kind == Kind::login && handle.loginDigest(name).empty())
+    throw tsql::sqlFailure(
+        15151, "Cannot drop the login '" + name + "', because it does not exist or you do not have permission.");
   if (drop.kind == Kind::login) return run(handle, "delete from master.logins where name=?", {name});
   const std::size_t database = databaseOf(drop.name, current);
   if (drop.kind == Kind::table) {
@@ -398,7 +400,8 @@ bool isDefinition(const tsql::Statement& statement) {
         using Kind = std::decay_t<decltype(value)>;
         return std::is_same_v<Kind, tsql::CreateTable> || std::is_same_v<Kind, tsql::CreateView> ||
                std::is_same_v<Kind, tsql::CreateIndex> || std::is_same_v<Kind, tsql::CreateSynonym> ||
-               std::is_same_v<Kind, tsql::CreateLogin> || std::is_same_v<Kind, tsql::Drop>;
+               std::is_same_v<Kind, tsql::CreateLogin> || std::is_same_v<Kind, tsql::AlterLogin> ||
+               std::is_same_v<Kind, tsql::Drop>;
       },
       statement);
 }
@@ -425,7 +428,9 @@ void define(Handle& handle, const Catalogue& catalogue, std::size_t currentDatab
   } else if (const auto* index = std::get_if<tsql::CreateIndex>(&statement)) {
     createIndex(handle, catalogue, currentDatabase, *index);
   } else if (const auto* login = std::get_if<tsql::CreateLogin>(&statement)) {
-    writeLogin(handle, *login);
+    createLogin(handle, *login);
+  } else if (const auto* known = std::get_if<tsql::AlterLogin>(&statement)) {
+    alterLogin(handle, *known);
   } else {
     drop(handle, catalogue, currentDatabase, std::get<tsql::Drop>(statement));
   }
