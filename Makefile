@@ -8,7 +8,7 @@ JOBS ?= $(shell nproc)
 export CTEST_PARALLEL_LEVEL ?= $(JOBS)
 say = @printf '\n== %s\n'
 
-.PHONY: help packages build demo test test-server test-long mutate sanitize bench fuzz docs format lint clean
+.PHONY: help packages build demo test test-server test-long mutate sanitize bench fuzz docs package options format lint clean
 
 help:  ## List the targets
 	@grep -hE '^[a-z-]+:.*##' $(MAKEFILE_LIST) | sed -E 's/:.*## /\t/' | expand -t 12
@@ -57,28 +57,44 @@ sanitize: packages  ## Run all tests under the address and undefined behaviour s
 	$(say) 'Testing with the sanitizers'
 	@ctest --preset sanitize $(TESTS)
 
-bench: packages  ## Run the benchmarks, each operation beside its floor (build/bench)
+bench: packages  ## Run the benchmarks, each operation beside its floor, and Python (build/bench)
 	$(say) 'Building the benchmarks (build/bench)'
 	@cmake --preset bench --log-level=NOTICE
 	@cmake --build --preset bench -j $(JOBS)
 	@for program in $$(find build/bench/bench -maxdepth 1 -type f -executable | sort); do \
 	  printf '\n== %s\n' "$$program"; "$$program"; done
+	$(say) 'bench/python_binding.py'
+	@QVSA_LIBRARY=build/bench/packaging/libqvsa.so PYTHONPATH=bindings/python python3 bench/python_binding.py
 
-fuzz:  ## Fuzz statements of T-SQL up to SQLite for a minute (build/fuzz)
+fuzz:  ## Fuzz statements of T-SQL up to SQLite, and the C interface, a minute each (build/fuzz)
 	@tools/install-packages.sh fuzz
-	$(say) 'Building the fuzz target (build/fuzz)'
+	$(say) 'Building the fuzz targets (build/fuzz)'
 	@cmake --preset fuzz --log-level=NOTICE
-	@cmake --build --preset fuzz -j $(JOBS) --target statement_fuzz
+	@cmake --build --preset fuzz -j $(JOBS) --target fuzzers
+	@mkdir -p build/fuzz/calls
 	@test -d build/fuzz/corpus || { mkdir build/fuzz/corpus; split -l 1 -a 3 tests/tsql/statements.txt build/fuzz/corpus/; }
 	@build/fuzz/tests/fuzz/statement_fuzz -max_total_time=60 -dict=tests/fuzz/tsql.dict build/fuzz/corpus
+	@build/fuzz/tests/fuzz/call_sequence_fuzz -max_total_time=60 build/fuzz/calls
 
-docs:  ## Print the table of functions and operators into docs/dialect.md
+package:  ## Build the Debian packages from the committed tree, check them, and try them in a bare root (build/packages)
+	@tools/install-packages.sh package
+	@packaging/make-packages.sh
+
+options: packages  ## Build the library without each of its parts, and look whether that fails as it should
+	@packaging/check-options.sh
+
+docs:  ## Write the pages of the public headers (build/docs/html), and the table of docs/dialect.md
+	@tools/install-packages.sh docs
+	@mkdir -p build/docs
+	@QVSA_VERSION=$$(sed -n 's/^project(QVSa VERSION \([0-9.]*\).*/\1/p' CMakeLists.txt) \
+	  QVSA_HEADERS="$$(sed -n '/QVSA_PUBLIC_HEADERS/,/)/p' QVSa/CMakeLists.txt | grep -o 'QVSa/.*\.h' | tr '\n' ' ') bindings/c/qvsa.h" \
+	  doxygen docs/Doxyfile
 	@cmake --preset release --log-level=NOTICE
 	@cmake --build --preset release -j $(JOBS) --target dialect_table
 	@sed -i -e '/^<!-- table -->$$/,/^<!-- end of the table -->$$/{//!d}' docs/dialect.md
 	@build/release/tools/dialect_table | sed -i '/^<!-- table -->$$/r /dev/stdin' docs/dialect.md
 
-sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h')
+sources = $$(git ls-files --cached --others --exclude-standard '*.cpp' '*.h' '*.c')
 
 format:  ## Format all sources
 	@tools/install-packages.sh lint

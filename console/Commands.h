@@ -29,6 +29,7 @@ void addBackups(Console& console);
 void addPlans(Console& console);
 void addAgent(Console& console);
 void addLogins(Console& console);
+void addSecrets(Console& console);
 void addDoctor(Console& console);
 
 }  // namespace QVSa::console

@@ -5,6 +5,7 @@
 #include <new>
 
 #include "QVSa/frame/ConnectionString.h"
+#include "QVSa/frame/Version.h"
 #include "QVSa/hosting/SafeTexts.h"
 #include "QVSa/hosting/ServerAccess.h"
 #include "QVSa/values/Failure.h"
@@ -44,6 +45,7 @@ std::optional<String> folderOf(const String& server) {
 }
 
 Console::Console() : app_("Manages the organisation, its people, their sessions and its numbers.", "qvsa") {
+  app_.set_version_flag("--version", String("qvsa ") + version());
   app_.require_subcommand(1);
   app_.fallthrough();
   app_.add_option("--server", place_.server, "\"file:FOLDER\" of an embedded installation, or a host[,port][|password]")

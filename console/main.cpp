@@ -25,6 +25,7 @@ int main(int argc, char** argv) {
   QVSa::console::addPlans(console);
   QVSa::console::addAgent(console);
   QVSa::console::addLogins(console);
+  QVSa::console::addSecrets(console);
   QVSa::console::addDoctor(console);
   return console.main(argc, argv);
 }

@@ -7,7 +7,7 @@
 
 #include "QVSa/QVSa.h"
 #include "QVSa/frame/ConnectionString.h"
-#include "examples/Steps.h"
+#include "Steps.h"
 
 namespace {
 

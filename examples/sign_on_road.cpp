@@ -11,7 +11,7 @@
 #include "QVSa/identity/safeRule.h"
 #include "QVSa/numbering/IdMgr.h"
 #include "QVSa/organisation/Department.h"
-#include "examples/Steps.h"
+#include "Steps.h"
 
 namespace {
 

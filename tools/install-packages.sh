@@ -3,20 +3,24 @@
 #   tools/install-packages.sh          what building, testing and benchmarks need
 #   tools/install-packages.sh lint     clang-format and clang-tidy as well
 #   tools/install-packages.sh fuzz     clang as well
+#   tools/install-packages.sh package  lintian and mmdebstrap as well
+#   tools/install-packages.sh docs     doxygen as well
 set -eu
 
 packages="build-essential cmake ninja-build ccache
   libsqlite3-dev libssl-dev unixodbc-dev tdsodbc libsqliteodbc
   pkgconf libkrb5-dev gss-ntlmssp libldap-dev slapd ldap-utils openssl
   libpugixml-dev zlib1g-dev libcli11-dev nlohmann-json3-dev libfccp-dev
-  libgtest-dev libbenchmark-dev"
+  libgtest-dev libbenchmark-dev python3"
 
 case "${1:-}" in
   "") ;;
   lint) packages="$packages clang-format clang-tidy" ;;
   fuzz) packages="$packages clang" ;;
+  package) packages="$packages lintian mmdebstrap" ;;
+  docs) packages="$packages doxygen" ;;
   *)
-    echo "usage: $0 [lint | fuzz]" >&2
+    echo "usage: $0 [lint | fuzz | package | docs]" >&2
     exit 2
     ;;
 esac

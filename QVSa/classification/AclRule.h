@@ -7,7 +7,7 @@ namespace QVSa {
 // The one access rule of the system: who may read and write reports, who may design them. The numbers mean something to
 // the hosts only; nothing here tests them.
 //   AclRule rule;  rule.connect(server);  rule.GetOne();  rule.RWType(2);  rule.Save();
-class AclRule : private Frame {
+class QVSA_EXPORT AclRule : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -10,7 +10,7 @@ namespace QVSa {
 // Each row holds its ancestry three times: as a path, ".Sales.Invoices.", as a full name, "Sales,Invoices", and as a
 // text that sorts, the ordPath "002.001". A save keeps paths and full names true in all that lies below; the ordPath
 // more than one level down can be that of before.
-class Directory : private Frame {
+class QVSA_EXPORT Directory : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

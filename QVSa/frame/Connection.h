@@ -13,7 +13,7 @@ class ProviderSession;
 //   Recordset rows = connection.Execute("select deptNo from departments");
 // Every member but the properties throws Failure: 0x80004005 server not reachable, 0x80040E4D log-in or database
 // refused, 0x800A0E78 not open, 0x800A0E79 open already, else the statement's own number.
-class Connection {
+class QVSA_EXPORT Connection {
  public:
   Connection();
   ~Connection();

@@ -6,7 +6,7 @@
 #include <string_view>
 #include <utility>
 
-#include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Secrets.h"
 #include "QVSa/values/Text.h"
 #include "providers/Provider.h"
 
@@ -68,10 +68,7 @@ String buildConnString(const String& server, const String& DBName, Boolean integ
   return integrated ? result : replaceAll(result, "<pwd>", passwordOf(server));
 }
 
-String defaultDbPwd() {
-  return secrets::connPwdHead + text(secrets::connPwdNumber) + scrambleText(secrets::connPwdWordA) +
-         scrambleText(lowerCase(secrets::connPwdWordB)) + secrets::connPwdTail;
-}
+String defaultDbPwd() { return deploymentSecrets().loginPassword(); }
 
 String serverOnly(const String& server) { return server.substr(0, server.find('|')); }
 

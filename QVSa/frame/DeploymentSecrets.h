@@ -2,7 +2,7 @@
 
 #include <array>
 
-// The secrets that all installations of one build share. A build for production names a header of its own in
+// The secrets of a machine that has no file of its own (see Secrets.h). A build may name another header in
 // QVSA_SECRETS_HEADER, with the same constants and builtInSecrets false.
 #ifdef QVSA_SECRETS_HEADER
 #include QVSA_SECRETS_HEADER

@@ -38,7 +38,7 @@ Handler silent();
 
 // A statement text whose tokens are filled by the object's factory, in one pass and with the usual flags: an empty text
 // goes as an empty text and not as NULL, trailing blanks are cut. Throws Failure for a value that has no literal.
-class SqlText {
+class QVSA_EXPORT SqlText {
  public:
   SqlText(SQLFactory& factory, std::vector<String>& secrets, String text);
   SqlText& number(const String& name, const Variant& value);
@@ -59,7 +59,7 @@ class SqlText {
 };
 
 // The common stock of the public classes: where the database is, the last failure, the shape of an operation.
-class Frame {
+class QVSA_EXPORT Frame {
  protected:
   Frame() = default;
   // A copy is an object of its own with the same values.

@@ -5,7 +5,7 @@
 namespace QVSa {
 
 // A password in clear, for as long as an object needs one: its memory is overwritten on every change and at the end.
-class Password {
+class QVSA_EXPORT Password {
  public:
   Password() = default;
   explicit Password(const String& text) : text_(text) {}
@@ -27,7 +27,7 @@ class Password {
 
 // A password out of a table: in clear, and where the stored text does not decrypt, that text. Such a one equals no
 // password, not even the empty one, and goes back into the table as it stands until another one is set.
-class StoredPassword {
+class QVSA_EXPORT StoredPassword {
  public:
   StoredPassword() = default;
   explicit StoredPassword(const String& clear) : clear_(clear) {}

@@ -27,7 +27,7 @@ using AttachedRows = std::shared_ptr<std::unique_ptr<Rows>>;
 
 // One column of a record set's current row. The plain readers take NULL as 0, False, the empty text and day 0.
 // Throws 0x800A0BCD where there is no current row.
-class Field {
+class QVSA_EXPORT Field {
  public:
   String Name() const;
   Variant Value() const;
@@ -62,7 +62,7 @@ class Field {
 // cursor location is the client, it keeps its rows as they come, to be counted and walked back; with a dynamic cursor
 // it streams in any case.
 // Throws 0x800A0E78 on a closed one, 0x800A0CC1 for a field that it does not have.
-class Recordset {
+class QVSA_EXPORT Recordset {
  public:
   Recordset();
   ~Recordset();

@@ -14,7 +14,7 @@ enum ParaType : Long { paraList = -1, paraVerbatim = 0, paraNumber = 1, paraText
 //   factory.AddPara("deptNo", paraText, "S'1", false, true);
 //   String text = "select * from departments where deptNo=<deptNo>";
 //   factory.makeSql(text, "");                                  // ... where deptNo=N'S''1'
-class SQLFactory {
+class QVSA_EXPORT SQLFactory {
  public:
   // The text that makeSql takes when its own is empty. Survives Clear.
   String SQL() const { return sql_; }
@@ -53,12 +53,12 @@ class SQLFactory {
 
 // A moment from a day number: the time as whole hours, minutes and seconds, parts of a second dropped; a day number
 // below 2 has the date 1900-01-01.
-Date dayNumberToDate(double dayNumber);
+QVSA_EXPORT Date dayNumberToDate(double dayNumber);
 
 // The quotes that sqlEscape doubles; any other code means both.
 enum EscapeMode : Long { escapeSingle = 1, escapeDouble = 2 };
 
 // The text of `value` without trailing blanks, the quotes of `mode` doubled. Null and Empty come back as they are.
-Variant sqlEscape(const Variant& value, Long mode);
+QVSA_EXPORT Variant sqlEscape(const Variant& value, Long mode);
 
 }  // namespace QVSa

@@ -16,6 +16,8 @@ constexpr Integer higher = 2;
 
 }  // namespace
 
+const char* version() noexcept { return QVSA_VERSION; }
+
 Integer compareVersion(const String& a, const String& b) {
   const std::vector<String> left = split(a, '.');
   const std::vector<String> right = split(b, '.');

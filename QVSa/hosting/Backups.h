@@ -7,7 +7,7 @@ namespace QVSa {
 // Backups and restores of both databases by a folder: sys.bak and app.bak in it, on the machine of the database server.
 // A path with a quote, which would end the file's name in DBMgr's statements, is refused with 5.
 //   Backups backups;  backups.connect(server);  if (!backups.backUp("/var/backups/qvsa")) ...
-class Backups : private Frame {
+class QVSA_EXPORT Backups : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

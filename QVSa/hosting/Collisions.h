@@ -10,11 +10,11 @@ namespace QVSa {
 // Whether these error values tell of a collision: somebody else took a number at the same moment (the key of `idRec`,
 // `seslog` or `syslog` refused the row), or the server ended the call as the victim of a deadlock. Nothing was stored
 // then, and trying again is safe. A deadlock is known by the server's English text.
-Boolean isCollision(Long errNumber, const String& errDescription);
+QVSA_EXPORT Boolean isCollision(Long errNumber, const String& errDescription);
 
 // How often a call is made, and how long the pauses are: random, up to `pause` before the second try, up to twice as
 // long before each further one, and never above `longest`. By default a call gives up after some 10 seconds.
-class Repetition {
+class QVSA_EXPORT Repetition {
  public:
   explicit Repetition(Integer tries = 100, std::chrono::milliseconds pause = std::chrono::milliseconds(4),
                       std::chrono::milliseconds longest = std::chrono::milliseconds(256))

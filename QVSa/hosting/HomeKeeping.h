@@ -8,7 +8,7 @@ namespace QVSa {
 // title and the news page of the login screen where getImage did not bring them to this machine before.
 //   HomeKeeping keeping;  keeping.connect(server);
 //   Home home;  if (!keeping.load(home)) ...  home.Fax("12");  if (!keeping.save(home)) ...
-class HomeKeeping : private Frame {
+class QVSA_EXPORT HomeKeeping : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -1,7 +1,7 @@
 #include "QVSa/hosting/Installation.h"
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Secrets.h"
 #include "QVSa/hosting/internal/FirstAdministrator.h"
 #include "database/Scripts.h"
 #include "providers/Installation.h"
@@ -45,6 +45,6 @@ String Installation::serverOf(const String& folder) {
   return "file:" + path.string();
 }
 
-Boolean Installation::hasBuiltInSecrets() { return secrets::builtInSecrets; }
+Boolean Installation::hasBuiltInSecrets() { return deploymentSecrets().builtIn; }
 
 }  // namespace QVSa

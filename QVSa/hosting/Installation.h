@@ -9,7 +9,7 @@ namespace QVSa {
 //   Installation installation;
 //   if (!installation.make("/var/lib/qvsa", adminPassword, saPassword)) complain(installation.errDescription());
 //   user.connect(Installation::serverOf("/var/lib/qvsa"), "QVApp");
-class Installation : private Frame {
+class QVSA_EXPORT Installation : private Frame {
  public:
   using Frame::errDescription;
   using Frame::errNumber;
@@ -27,7 +27,8 @@ class Installation : private Frame {
   static Boolean isThere(const String& folder);
   // The server text of the installation in `folder`.
   static String serverOf(const String& folder);
-  // Whether this build uses the deployment secrets that come with the source, which everybody knows.
+  // Whether this process uses the deployment secrets that come with the source, which everybody knows. Throws Failure
+  // where a file of secrets is there and can't be used.
   static Boolean hasBuiltInSecrets();
 };
 

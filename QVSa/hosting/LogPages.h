@@ -37,7 +37,7 @@ struct LogEntry {
 // it costs what it holds, however long the log is, and entries that come meanwhile move nothing.
 //   LogPages log;  log.connect(server, "QVApp");
 //   if (log.read(filter, 50, after)) show(log.entries(), log.next());
-class LogPages : private Frame {
+class QVSA_EXPORT LogPages : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

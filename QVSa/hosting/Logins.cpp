@@ -2,7 +2,7 @@
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/hosting/SafeTexts.h"
-#include "QVSa/hosting/internal/AdministratorConnection.h"
+#include "QVSa/hosting/internal/LoginConnection.h"
 #include "QVSa/values/Text.h"
 
 namespace QVSa {
@@ -29,7 +29,7 @@ Boolean Logins::setPassword(const String& login, const String& password, const S
       throw Failure(number::argument, "Logins",
                     "The password of a log-in is not empty, holds no semicolon and ends with no blank.");
     if (sameText(login, "QVUser")) requireScrambled(password);
-    Connection connection = openAsAdministrator(server(), asLogin, asPassword);
+    Connection connection = openAs(server(), asLogin, asPassword);
     connection.Execute(sql("alter login " + login + " with password=<password>").secret("password", password));
     return true;
   });

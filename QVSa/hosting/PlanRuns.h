@@ -18,7 +18,7 @@ struct PlanRun {
 // The runs of backup plans: which there are, and running one so that no good copy is lost for a bad one.
 //   PlanRuns runs;  runs.connect(server, "QVApp");
 //   PlanRun run;  if (!runs.runPlan(plan, run)) complain(runs.errDescription());
-class PlanRuns : private Frame {
+class QVSA_EXPORT PlanRuns : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

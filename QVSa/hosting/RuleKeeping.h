@@ -8,7 +8,7 @@ namespace QVSa {
 // period, whose counter is then read and no longer moved, and widens the numbers once more with a second save.
 //   RuleKeeping keeping;  keeping.connect(server, "QVApp");
 //   rule.DateFormat(yymm);  if (!keeping.save(rule)) complain(keeping.errDescription());
-class RuleKeeping : private Frame {
+class QVSA_EXPORT RuleKeeping : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -12,13 +12,13 @@ namespace QVSa {
 
 // "3,17" for the arguments that are lists of ids: User::setJobs, Departments::GetAll, userGroup::SetUsers and others.
 // No id gives the empty text, which means "all" to some of them.
-String idList(const std::vector<Long>& ids);
+QVSA_EXPORT String idList(const std::vector<Long>& ids);
 // "12,3|12,4" for Role::UpdateUsers: user and job.
-String idPairs(const std::vector<std::pair<Long, Long>>& pairs);
+QVSA_EXPORT String idPairs(const std::vector<std::pair<Long, Long>>& pairs);
 
 // Whether the path may stand in the statements of a backup (DBMgr, BKPlan::bkPath): no quote, no control character.
-Boolean isPlainPath(const String& path);
+QVSA_EXPORT Boolean isPlainPath(const String& path);
 // Whether the name may be the `DBName` of a connect: letters of any script, digits and "_", or nothing.
-Boolean isPlainName(const String& name);
+QVSA_EXPORT Boolean isPlainName(const String& name);
 
 }  // namespace QVSa

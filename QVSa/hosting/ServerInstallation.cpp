@@ -1,8 +1,8 @@
 #include "QVSa/hosting/ServerInstallation.h"
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/hosting/internal/AdministratorConnection.h"
 #include "QVSa/hosting/internal/FirstAdministrator.h"
+#include "QVSa/hosting/internal/LoginConnection.h"
 #include "database/Scripts.h"
 #include "providers/Provider.h"
 #include "providers/tsql/Parser.h"
@@ -72,7 +72,7 @@ Boolean ServerInstallation::make(const String& server, const String& login, cons
                                  const String& adminPassword) {
   return operation(plain(), [&] {
     {
-      Connection connection = openAsAdministrator(server, login, password);
+      Connection connection = openAs(server, login, password);
       const String ofUser = userPassword(server);
       for (const String& batch : steps()) connection.Execute(sql(batch).secret("userPassword", ofUser));
     }

@@ -12,7 +12,7 @@ namespace QVSa {
 // It costs one more connection with an open transaction (of no writes) during the attempt, and two short statements.
 // Who guesses at a login makes its owner wait, for as long as `patience` says. As loginAuth does, it goes on where the
 // policy or the list of sessions can't be read: `qvsa doctor` looks at both.
-class SignOn : private Frame {
+class QVSA_EXPORT SignOn : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -8,7 +8,7 @@ namespace QVSa {
 // setJobs and one group, begins the validity of his password anew, and unlocks a locked account.
 //   UserKeeping keeping;  keeping.connect(server, "QVApp");
 //   user.Email("ann@example.org");  if (!keeping.save(user)) complain(keeping.errDescription());
-class UserKeeping : private Frame {
+class QVSA_EXPORT UserKeeping : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

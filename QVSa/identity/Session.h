@@ -6,7 +6,7 @@ namespace QVSa {
 
 // One signed-on session, as Sessions::GetAll read it. All values are texts, the times in the default form of a date;
 // what the row does not hold is empty.
-class Session {
+class QVSA_EXPORT Session {
  public:
   const String& SessionId() const { return SessionId_; }
   const String& UserLogin() const { return UserLogin_; }

@@ -9,7 +9,7 @@ namespace QVSa {
 // The sessions that are signed on, in the order of the server, by position from 1 or by session id.
 //   Sessions sessions;  sessions.connect(server, "QVApp");  sessions.Terminate(id);
 // The list is that of the last GetAll; it always comes from QVSys, whatever database `connect` named.
-class Sessions : private Frame {
+class QVSA_EXPORT Sessions : private Frame {
  public:
   using Frame::errDescription;
   using Frame::errNumber;

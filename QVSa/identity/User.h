@@ -15,7 +15,7 @@ class safeRule;
 //   User user;  user.connect(server, "QVApp");
 //   String session;  if (user.loginAuth("ann", password, &session)) ...
 // A plain save removes the user's jobs and re-writes his password: give the jobs back by setJobs, and load him first.
-class User : private Frame {
+class QVSA_EXPORT User : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -7,7 +7,7 @@ namespace QVSa {
 // The policy for passwords and lock-outs, one row for the whole system.
 //   safeRule rule;  rule.connect(server);  if (!rule.checkPwd("abc")) show(rule.errDescription());
 // The row is read by GetOne, or by the first checkPwd, and not again by the same object.
-class safeRule : private Frame {
+class QVSA_EXPORT safeRule : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -11,7 +11,7 @@ namespace QVSa {
 // of the plan; saving queues the first, each run queues the next one.
 //   BKPlan plan;  plan.connect(server, "QVApp");  plan.Name("nightly");  plan.bkPath("D:\\bak");
 //   plan.schedule()->timesOneDay(1);  plan.Save();
-class BKPlan : private Frame {
+class QVSA_EXPORT BKPlan : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

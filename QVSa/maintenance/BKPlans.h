@@ -6,7 +6,7 @@
 namespace QVSa {
 
 // The backup plans of a server, by position from 1 or by name, in the order of the server.
-class BKPlans : private Frame {
+class QVSA_EXPORT BKPlans : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

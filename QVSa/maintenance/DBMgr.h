@@ -10,7 +10,7 @@ struct BackupLock;
 //   DBMgr manager;
 //   if (!manager.BackUpDB(server, "D:\\bak\\sys.bak", "D:\\bak\\app.bak")) report(manager.errDescription());
 // File paths are those of the database server; they go into the statements as they are and must hold no quote.
-class DBMgr : private Frame {
+class QVSA_EXPORT DBMgr : private Frame {
  public:
   using Frame::errDescription;
   using Frame::errNumber;

@@ -7,7 +7,7 @@ namespace QVSa {
 // What a client machine asks a server: which release it runs, and whether the program files here are those of it. Holds
 // one connection to QVUpdate from `connect` to its end.
 //   QVAgent agent;  agent.connect(server);  if (agent.newFiles() == 1) start the update program beside this one
-class QVAgent : private Frame {
+class QVSA_EXPORT QVAgent : private Frame {
  public:
   using Frame::errDescription;
   using Frame::errNumber;

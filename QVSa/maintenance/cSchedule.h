@@ -8,7 +8,7 @@ namespace QVSa {
 // A recurring schedule, and the way to the next task that is due in the system database.
 //   cSchedule schedule;  schedule.StartTime(*Date::parse("10:00"));  schedule.timesOneDay(1);
 //   Date next = schedule.GetNextTime(now);
-class cSchedule : private Frame {
+class QVSA_EXPORT cSchedule : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -1,7 +1,7 @@
 #include "QVSa/maintenance/tmpSafe.h"
 
 #include "QVSa/frame/ConnectionString.h"
-#include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Secrets.h"
 
 namespace QVSa {
 
@@ -13,7 +13,7 @@ Boolean tmpSafe::connect(const String& ServerName, const String& DBName) {
     Connection connection = open();
     Recordset row = connection.Execute("select top 1 * from QVTmpSafe");
     if (row.EOF_()) return true;
-    protectPwd_ = StoredPassword::read(row["protectPwd"].asText(), secrets::templatePwdKey);
+    protectPwd_ = StoredPassword::read(row["protectPwd"].asText(), deploymentSecrets().templatePwdKey);
     loadedPwd_ = protectPwd_;
     return true;
   });
@@ -22,8 +22,8 @@ Boolean tmpSafe::connect(const String& ServerName, const String& DBName) {
 Boolean tmpSafe::Save(Boolean changeAll) {
   return operation(plain(), [&] {
     Connection connection = open();
-    connection.Execute(
-        sql(" update QVTmpSafe set protectPwd = <Pwd>").secret("Pwd", protectPwd_.encrypted(secrets::templatePwdKey)));
+    connection.Execute(sql(" update QVTmpSafe set protectPwd = <Pwd>")
+                           .secret("Pwd", protectPwd_.encrypted(deploymentSecrets().templatePwdKey)));
     if (changeAll) {
       connection.Execute("update repTmps set rtpwd=''");
     } else if (loadedPwd_.is("")) {
@@ -38,8 +38,8 @@ void tmpSafe::dropDefaultPasswords(Connection& connection) {
   row.Open("select rtUid,rtPwd from repTmps where rtPwd is not null and rtPwd<>''", connection, adOpenKeyset,
            adLockOptimistic);
   for (; !row.EOF_(); row.MoveNext()) {
-    const auto own = StoredPassword::read(row["rtPwd"].asText(), secrets::templatePwdKey);
-    if (own.is(secrets::defaultTemplatePwd)) row["rtPwd"].Value("");
+    const auto own = StoredPassword::read(row["rtPwd"].asText(), deploymentSecrets().templatePwdKey);
+    if (own.is(deploymentSecrets().defaultTemplatePwd)) row["rtPwd"].Value("");
   }
 }
 

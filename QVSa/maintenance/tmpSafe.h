@@ -7,7 +7,7 @@ namespace QVSa {
 
 // The one password that protects report templates. It can be set, and read by who holds a live session.
 //   tmpSafe safe;  safe.connect(server);  safe.protectPwd("Secret-1");  safe.Save();
-class tmpSafe : private Frame {
+class QVSA_EXPORT tmpSafe : private Frame {
  public:
   // Takes effect with Save.
   void protectPwd(const String& value) { protectPwd_ = StoredPassword(value); }

@@ -7,7 +7,7 @@ namespace QVSa {
 
 // A numbering rule and the issuer of its numbers.
 //   IdMgr rule;  rule.connect(server, "QVApp");  String number = rule.newId("invoice");
-class IdMgr : private Frame {
+class QVSA_EXPORT IdMgr : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

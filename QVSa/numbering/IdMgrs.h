@@ -7,7 +7,7 @@
 namespace QVSa {
 
 // The numbering rules that an administrator may see, those of the system left out; in the order of the server.
-class IdMgrs : private Frame {
+class QVSA_EXPORT IdMgrs : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

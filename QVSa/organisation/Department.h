@@ -13,7 +13,7 @@ class Users;
 //   Department sales;  sales.connect(server);
 //   sales.Id("S1");  sales.Name("Sales");  sales.Super("_root");  sales.Save();
 // A department has two identities: its number (`Id`, the caller's) and its inner id (the database's).
-class Department : private Frame {
+class QVSA_EXPORT Department : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

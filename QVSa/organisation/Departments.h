@@ -10,7 +10,7 @@ namespace QVSa {
 //   if (tree.GetAll()) for (const auto& department : tree) show(department->fullName());
 // The key is the department number, but for GetRoot (the inner id) and for the ways up. A key that comes again
 // ends a list with 457; the departments before it stay. All lists leave `Org` empty.
-class Departments : public Collection<Department> {
+class QVSA_EXPORT Departments : public Collection<Department> {
  public:
   using Collection::Remove;
 

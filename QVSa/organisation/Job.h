@@ -5,7 +5,7 @@
 namespace QVSa {
 
 // A role held in a department, as Jobs lists it. Users, report rights and process tasks are bound to jobs.
-class Job {
+class QVSA_EXPORT Job {
  public:
   Long Id() const { return Id_; }
   // "Sales-East--Manager": the department's full name and the role's name.

@@ -7,7 +7,7 @@ namespace QVSa {
 
 // Jobs in lists, by the inner id of their department. The key is the job id as text. Items can't be taken out.
 // A failed list reports the message of a failed backup plan, "Fail to add new backup plan.".
-class Jobs : public Collection<Job> {
+class QVSA_EXPORT Jobs : public Collection<Job> {
  public:
   // The jobs in the department numbered `deptId`, of the role `roleName`, of the user `userId`: empty and 0 for any.
   Boolean GetAll(const String& deptId = "", const String& roleName = "", Long userId = 0);

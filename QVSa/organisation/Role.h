@@ -9,7 +9,7 @@ class Users;
 // A named set of rights, defined once for the whole system. It takes effect as a job: held in a department.
 //   Role manager;  manager.connect(server);
 //   manager.Name("Manager");  manager.Save();  manager.setJobs("3,7");
-class Role : private Frame {
+class QVSA_EXPORT Role : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -6,7 +6,7 @@
 namespace QVSa {
 
 // The roles of the system. The key is the role's name.
-class Roles : public Collection<Role> {
+class QVSA_EXPORT Roles : public Collection<Role> {
  public:
   using Collection::Remove;
 

@@ -10,7 +10,7 @@ namespace QVSa {
 // Users in lists, and a data source whose one member "users" is the row set of the last GetList. The key is the display
 // name: the second user of one name ends a list with 457, but for GetAllOfTheDeptAndRole. Lists fill the values that
 // they name and nothing else; load a user by his own GetOne before saving him.
-class Users : public Collection<User> {
+class QVSA_EXPORT Users : public Collection<User> {
  public:
   using Collection::Remove;
 

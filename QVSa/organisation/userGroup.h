@@ -7,7 +7,7 @@ namespace QVSa {
 // A named set of users that receives roles as a whole, without regard to departments.
 //   userGroup group;  group.connect(server);
 //   group.Name("Auditors");  group.Save();  group.SetUsers("3,7");  group.SetRoles("Report Owners");
-class userGroup : private Frame {
+class QVSA_EXPORT userGroup : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -6,7 +6,7 @@
 namespace QVSa {
 
 // The user groups. The key is the group's name.
-class userGroups : public Collection<userGroup> {
+class QVSA_EXPORT userGroups : public Collection<userGroup> {
  public:
   using Collection::Remove;
 

@@ -10,7 +10,7 @@ namespace QVSa {
 //   Home home;  home.connect(server);  home.homeName("Ours");  home.Save();
 // Save writes everything as it stands here. Before it, call getImage too where pictures, title and news page shall
 // stay: a Home that never fetched them clears them.
-class Home : private Frame {
+class QVSA_EXPORT Home : private Frame {
  public:
   using Frame::errDescription;
   using Frame::errNumber;

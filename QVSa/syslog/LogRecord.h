@@ -10,7 +10,7 @@ namespace QVSa {
 constexpr Long administrationLog = 3;
 
 // One row of the system log, as a query of LogRecords read it; what the row does not hold is empty.
-class LogRecord {
+class QVSA_EXPORT LogRecord {
  public:
   const String& description() const { return description_; }
   void description(String value) { description_ = std::move(value); }

@@ -13,7 +13,7 @@ namespace QVSa {
 //   log.Add(userId, 1, "Sales report", "Printed");
 //   log.GetAll(1, monday, friday);
 //   for (Recordset& rows = log.recordset(); !rows.EOF_(); rows.MoveNext()) show(rows[6].asText());
-class LogRecords : private Frame {
+class QVSA_EXPORT LogRecords : private Frame {
  public:
   LogRecords();
 

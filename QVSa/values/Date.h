@@ -9,7 +9,7 @@ namespace QVSa {
 // A moment: days since 1899-12-30, the fraction being the time of day. Without a time zone: whose clock it is, the
 // maker of the value knows. Good to the millisecond between the years 100 and 9999; the parts and texts of a moment
 // outside them throw Failure 6.
-class Date {
+class QVSA_EXPORT Date {
  public:
   constexpr Date() = default;
   constexpr explicit Date(double days) : days_(days) {}

@@ -11,7 +11,7 @@ namespace QVSa {
 // person, and the own number of the database server or the operating system (0 where there is none). No text holds a
 // password or a connection string. Only want of memory is std::bad_alloc, which needs no memory itself, until an
 // operation reports it as 7.
-class Failure : public std::runtime_error {
+class QVSA_EXPORT Failure : public std::runtime_error {
  public:
   Failure(Long number, const String& source, const String& description, Long native = 0)
       : std::runtime_error(description), number_(number), native_(native), source_(source) {}
@@ -68,11 +68,11 @@ constexpr Long keyExists = 457;
 }  // namespace number
 
 // A run-time failure with its usual text: 6 "Overflow", 9 "Subscript out of range", 13 "Type mismatch" and so on.
-Failure runtimeFailure(Long runtimeNumber, Long native = 0);
+QVSA_EXPORT Failure runtimeFailure(Long runtimeNumber, Long native = 0);
 
 // What is being handled in a catch block, as a failure: one of ours as it is, 7 for want of memory, 51 for any other.
-Failure currentFailure();
+QVSA_EXPORT Failure currentFailure();
 // The number and text of that. Where there is no memory for the text, those of want of memory.
-void tellCurrentFailure(Long& number, String& description) noexcept;
+QVSA_EXPORT void tellCurrentFailure(Long& number, String& description) noexcept;
 
 }  // namespace QVSa

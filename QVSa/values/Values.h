@@ -4,6 +4,8 @@
 #include <string>
 #include <vector>
 
+#include "QVSa/values/Export.h"
+
 namespace QVSa {
 
 using Long = std::int32_t;

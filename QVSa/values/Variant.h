@@ -13,7 +13,7 @@ namespace QVSa {
 // The conversions follow the run-time's rules and throw Failure: 94 for Null, 13 for a text that does not read as the
 // wanted kind, 6 where the value does not fit. Empty converts to 0, False and the empty text. Fractions round half to
 // even. A Boolean is -1 or 0 as a number and as a text.
-class Variant {
+class QVSA_EXPORT Variant {
  public:
   struct NullValue {
     friend constexpr bool operator==(NullValue, NullValue) { return true; }
@@ -55,6 +55,12 @@ class Variant {
   String toText() &&;
   // The bytes held; of a text its UTF-8. Throws 13 for anything else.
   Bytes toBytes() const;
+
+  // `visitor` called with what is held, as std::visit does it; Empty is std::monostate.
+  template <class Visitor>
+  decltype(auto) visit(const Visitor& visitor) const {
+    return std::visit(visitor, value_);
+  }
 
   // Same kind and same value; no conversion.
   friend bool operator==(const Variant& a, const Variant& b) { return a.value_ == b.value_; }

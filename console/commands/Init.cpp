@@ -50,9 +50,9 @@ Answer answerOf(const String& server, const Chosen& admin, const Chosen& sa) {
   if (admin.madeUp || sa.madeUp) answer.text += "\nMade-up passwords are shown this once: note them down.\n";
   if (Installation::hasBuiltInSecrets())
     answer.text +=
-        "\nThis build uses the deployment secrets that come with the source, which everybody knows. Build with a "
-        "header of\n"
-        "your own (QVSA_SECRETS_HEADER) before you keep anything here that is worth protecting.\n";
+        "\nThe deployment secrets are those that come with the source, which everybody knows. Make your own "
+        "(qvsa secrets make),\n"
+        "and the installation anew, before you keep anything here that is worth protecting.\n";
   answer.text += "\nPoint the console at it:  export QVSA_SERVER=\"" + server + "\"\n";
   return answer;
 }

@@ -2,8 +2,6 @@
 
 #include <memory>
 
-#include "QVSa/frame/ConnectionString.h"
-#include "QVSa/values/Failure.h"
 #include "console/Commands.h"
 #include "console/Passwords.h"
 
@@ -28,17 +26,6 @@ Answer setPassword(const Console& console, const Options& options) {
   return answer;
 }
 
-Answer scramble() {
-  const String password = askNewPassword("Password");
-  if (password.find(';') != String::npos) throw Misuse("A password in a server text holds no semicolon.");
-  try {
-    const String scrambled = scrambleText(password);
-    return {scrambled + "\n", {{"scrambled", scrambled}}};
-  } catch (const Failure& failure) {
-    throw Refusal("This password can't be scrambled: choose another one.", failure.number());
-  }
-}
-
 }  // namespace
 
 void addLogins(Console& console) {
@@ -51,11 +38,6 @@ void addLogins(Console& console) {
   password->add_option("--as", options->administrator, "The administrator of the database server")
       ->capture_default_str();
   console.command(password, [&console, options] { return setPassword(console, *options); });
-
-  CLI::App* secrets = console.app().add_subcommand("secrets", "Texts that hold a password");
-  secrets->require_subcommand(1);
-  CLI::App* scrambling = secrets->add_subcommand("scramble", "What stands behind the \"|\" of a server text");
-  console.command(scrambling, [] { return scramble(); });
 }
 
 }  // namespace QVSa::console

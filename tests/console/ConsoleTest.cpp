@@ -46,6 +46,32 @@ TEST_F(Program, InitShowsThePasswordsThatItMadeUp) {
   EXPECT_NE(made.document["saPassword"], made.document["adminPassword"]);
 }
 
+TEST_F(Program, SecretsOfAFileOpenTheInstallationsThatWereMadeWithThemAlone) {
+  const auto file = folder_.path() / "secrets";
+  ASSERT_EQ(run("secrets make '" + file.string() + "'").exitCode, 0);
+  EXPECT_EQ(run("secrets make '" + file.string() + "'").error(), "58") << "those of before are not lost";
+
+  const auto signOnWith = [&](const std::filesystem::path& secrets) {
+    ::setenv("QVSA_SECRETS", secrets.c_str(), 1);
+    const Outcome outcome = run("sign-on Admin", "Adm1n-first\n");
+    ::setenv("QVSA_SECRETS", "", 1);
+    return outcome.exitCode == 0 ? String("signed on") : outcome.error();
+  };
+  EXPECT_EQ(signOnWith(file), "0x80040E4D");
+  name_ = "own";
+  ::setenv("QVSA_SECRETS", file.c_str(), 1);
+  EXPECT_EQ(run("init", "Adm1n-first\nSa-first\n").document["builtInSecrets"], false);
+  EXPECT_EQ(signOnWith(file), "signed on");
+  EXPECT_EQ(signOnWith(""), "0x80040E4D");
+
+  EXPECT_EQ(signOnWith(folder_.path() / "none"), "53");
+  std::filesystem::permissions(file, std::filesystem::perms::others_read, std::filesystem::perm_options::add);
+  EXPECT_EQ(signOnWith(file), "70");
+  std::filesystem::permissions(file, std::filesystem::perms::others_read, std::filesystem::perm_options::remove);
+  std::ofstream(file, std::ios::app) << "conPwdHead = x\n";
+  EXPECT_EQ(signOnWith(file), "5");
+}
+
 TEST_F(Program, RefusalsAndMisuseHaveTheirOwnExitCodes) {
   const Outcome wrong = run("sign-on Admin", "wrong\n");
   EXPECT_EQ(wrong.exitCode, 1);

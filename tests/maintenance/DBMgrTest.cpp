@@ -1,9 +1,8 @@
 #include <filesystem>
 #include <fstream>
 
-#include "QVSa/frame/DeploymentSecrets.h"
+#include "QVSa/frame/Secrets.h"
 #include "QVSa/maintenance/internal/BackupLock.h"
-#include "QVSa/maintenance/internal/RotatedKey.h"
 #include "QVSa/values/Text.h"
 #include "platform/Files.h"
 #include "platform/SecretMessage.h"
@@ -112,7 +111,7 @@ TEST_F(Backups, LockTheCopyAndTheRunningSystem) {
   EXPECT_EQ(spec(), "");
   EXPECT_TRUE(manager_.decryptTmps(server(), "anything"));
 
-  tables_.run("update roles set roleSpec=N'" + platform::encryptText("7.9", rotatedKey(secrets::backupLockKeyStart)) +
+  tables_.run("update roles set roleSpec=N'" + platform::encryptText("7.9", deploymentSecrets().backupLockKey()) +
               "' where roleId=4");
   agent.connect(server());
   EXPECT_EQ(agent.hiddenReps(), "7.9") << "without a bar all of it is the list";

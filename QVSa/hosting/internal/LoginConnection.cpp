@@ -1,11 +1,11 @@
-#include "QVSa/hosting/internal/AdministratorConnection.h"
+#include "QVSa/hosting/internal/LoginConnection.h"
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/values/Failure.h"
 
 namespace QVSa {
 
-Connection openAsAdministrator(const String& server, const String& login, const String& password) {
+Connection openAs(const String& server, const String& login, const String& password) {
   if ((login + password).find(';') != String::npos)
     throw Failure(number::argument, "Installation", "A log-in and its password must hold no semicolon.");
   Connection connection;
