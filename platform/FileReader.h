@@ -13,6 +13,8 @@ namespace QVSa::platform {
 class FileReader {
  public:
   explicit FileReader(const String& path);
+  // Of a file that is open for reading.
+  explicit FileReader(FileDescriptor file) : file_(std::move(file)) {}
 
   // Fills the block as far as the file goes, and tells how far; 0 at its end.
   std::size_t read(std::span<std::uint8_t> block);

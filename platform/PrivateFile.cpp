@@ -6,14 +6,14 @@
 #include <grp.h>
 #include <sys/stat.h>
 
-#include "platform/FileDescriptor.h"
+#include "platform/FileReader.h"
 #include "platform/SystemFailure.h"
 
 namespace QVSa::platform {
 
 namespace {
 
-constexpr std::size_t largest = 64 * 1024;
+constexpr std::size_t largest = std::size_t{64} * 1024;
 
 Failure refused(const String& path, const String& why) {
   return {number::accessDenied, "Secrets", "The file of secrets " + path + " " + why};
@@ -29,7 +29,7 @@ void requirePrivate(const FileDescriptor& file, const String& path) {
 gid_t groupNamed(const String& name) {
   struct group entry {};
   struct group* found = nullptr;
-  std::array<char, 16 * 1024> room;
+  std::array<char, std::size_t{16} * 1024> room;
   if (getgrnam_r(name.c_str(), &entry, room.data(), room.size(), &found) != 0 || found == nullptr)
     throw Failure(number::argument, "Secrets", "There is no group " + name + ".");
   return found->gr_gid;
@@ -48,22 +48,14 @@ void writeWhole(const FileDescriptor& file, const String& content, const String&
 }  // namespace
 
 String readPrivateFile(const String& path) {
-  const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+  FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   if (!file.isOpen() && errno == EACCES) throw refused(path, "can't be read by this account.");
   if (!file.isOpen()) throw fileFailure(errno, path);
   requirePrivate(file, path);
-  String content(largest + 1, '\0');
-  std::size_t filled = 0;
-  while (filled < content.size()) {
-    const ssize_t count = ::read(file.get(), content.data() + filled, content.size() - filled);
-    if (count < 0 && errno == EINTR) continue;
-    if (count < 0) throw fileFailure(errno, path);
-    if (count == 0) break;
-    filled += static_cast<std::size_t>(count);
-  }
-  if (filled > largest) throw refused(path, "is too large.");
-  content.resize(filled);
-  return content;
+  Bytes content(largest + 1);
+  content.resize(FileReader(std::move(file)).read(content));
+  if (content.size() > largest) throw refused(path, "is too large.");
+  return {content.begin(), content.end()};
 }
 
 void makePrivateFile(const String& path, const String& content, const String& group) {
