@@ -7,7 +7,7 @@ namespace QVSa {
 // The log-ins of the database server: QVUser, which every host opens its connections with, and the administrator's.
 //   Logins logins;  logins.connect(server);
 //   if (!logins.setPassword("QVUser", newPassword, "sa", saPassword)) complain(logins.errDescription());
-class Logins : private Frame {
+class QVSA_EXPORT Logins : private Frame {
  public:
   using Frame::connect;
   using Frame::errDescription;

@@ -2,7 +2,8 @@
 
 #include <vector>
 
-#include "QVSa/values/Failure.h"
+#include "QVSa/values/Export.h"
+#include "QVSa/values/Values.h"
 
 namespace QVSa {
 
@@ -15,11 +16,11 @@ struct ServerSetting {
 };
 
 // The settings in force. Throws 0x80004005 for a setting or a value that is none, and where there is no driver.
-std::vector<ServerSetting> serverAccess();
+QVSA_EXPORT std::vector<ServerSetting> serverAccess();
 // Their names and meanings alone. Never throws for what is set.
-std::vector<ServerSetting> serverAccessNames();
+QVSA_EXPORT std::vector<ServerSetting> serverAccessNames();
 // What the program itself was told stands above the environment and the file. For the start of a program: not while
 // another thread works with the library. Throws 0x80004005.
-void setServerAccess(const String& name, const String& value);
+QVSA_EXPORT void setServerAccess(const String& name, const String& value);
 
 }  // namespace QVSa

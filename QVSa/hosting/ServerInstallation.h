@@ -8,14 +8,14 @@ namespace QVSa {
 //   ServerInstallation installation;
 //   if (!installation.make("db1,1433", "sa", saPassword, adminPassword)) complain(installation.errDescription());
 //   user.connect("db1,1433", "QVApp");
-class ServerInstallation : private Frame {
+class QVSA_EXPORT ServerInstallation : private Frame {
  public:
   using Frame::errDescription;
   using Frame::errNumber;
 
   // Does what is not done yet, as a log-in that may make databases and log-ins; after a failure it may be called again.
   // A database is filled as a whole or not at all, and one that holds tables is left alone. QVUser gets the password
-  // that `server` has behind a "|", else the one of this build; if it is there already, its password stays.
+  // that `server` has behind a "|", else the one of the deployment secrets; if it is there already, its password stays.
   // `adminPassword` is that of the user Admin, who gets it as long as he has none, and has to pass the policy. 5 a ";"
   // in a log-in or a password; 0x80040E14 and 50000 a database's texts heed case; else the number of what failed.
   Boolean make(const String& server, const String& login, const String& password, const String& adminPassword);
