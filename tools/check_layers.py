@@ -12,13 +12,14 @@ import re
 import subprocess
 import sys
 
+PROVIDERS = ["providers/embedded", "providers/odbc"]
 # From the bottom up. A file belongs to the longest name that its path begins with.
 LAYERS = [
     ["QVSa/values"],
     ["platform"],
     ["QVSa/resources", "providers", "database"],
     ["providers/tsql"],
-    ["providers/embedded", "providers/odbc"],
+    PROVIDERS,
     ["QVSa/frame"],
     ["QVSa/identity", "QVSa/organisation", "QVSa/numbering", "QVSa/syslog", "QVSa/classification", "QVSa/settings",
      "QVSa/maintenance"],
@@ -57,7 +58,7 @@ def broken_rule(path, included):
         return f"{included} is internal to {target}"
     if is_public(path) and included.startswith("providers/"):
         return "a public header knows no provider"
-    if target in ("providers/embedded", "providers/odbc") and room != target and path != PICKS_A_PROVIDER:
+    if target in PROVIDERS and room != target and path != PICKS_A_PROVIDER:
         return f"only {PICKS_A_PROVIDER} picks a provider"
     if LAYER[target] > LAYER[room]:
         return f"{target} lies above {room}"

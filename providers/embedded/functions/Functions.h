@@ -14,19 +14,10 @@ struct FunctionContext {
   bool hasScopeIdentity = false;
 };
 
-// Registers, on an SQLite connection, all that the emitter's texts call:
-//   collation tsql: no case, no trailing blanks, Unicode folding, then code order
-//   t_convert(x, fromBase, toBase, size, purpose, style): see Conversions.h, bases and purpose as numbers
-//   t_add(a, b) t_subtract(a, b) t_multiply(a, b) t_negate(a): int arithmetic, 8115 where the result has no 32 bits
-//   t_divide(a, b) t_modulo(a, b): whole numbers or reals by storage class, 8134 for a zero divisor
-//   t_like(value, pattern [, escape])
-//   t_len(x) t_charindex(what, in [, start]) t_replace(x, what, with) t_substring(x, start, count)
-//   t_left(x, n) t_right(x, n) t_ltrim(x) t_rtrim(x) t_upper(x) t_lower(x) t_str(x [, width [, decimals]])
-//   t_replicate(x, n)
-//   t_getdate() t_dateadd(part, n, ticks) t_datediff(part, from, to) t_datepart(part, ticks): parts by full names
-//   t_scope_identity() t_abs(x) t_round(x, n) t_floor(x) t_ceiling(x)
-//   list(?): a table-valued function with one column, value: the Values bound by bindList
-// A failure inside a function is kept as an exception and rethrown by rethrowFailure (throwStorageFailure calls it).
+// Registers, on an SQLite connection, all that the emitter's texts call: the collation tsql; the functions that the
+// tables at the ends of TextFunctions.cpp, DateFunctions.cpp and NumberFunctions.cpp and in Functions.cpp name; the
+// aggregates; and list(?), a table with one column, value, of the Values that bindList bound. A failure inside a
+// function is kept as an exception and rethrown by rethrowFailure (throwStorageFailure calls it).
 void registerFunctions(sqlite3* handle, FunctionContext& context);
 
 // Rethrows the failure that a function raised while the handle's last step ran; nothing otherwise.
