@@ -23,8 +23,8 @@ rm -rf "$packages/_CPack_Packages" "$tree"
 ls -l "$packages"/*.deb
 
 echo "== lintian"
-# They go to a site and not into the archive: no bug closes, and the texts are short.
-lintian --fail-on error --suppress-tags initial-upload-closes-no-bugs "$packages"/*.deb
+# They go to a site and not into the archive: no bug closes, and the site puts its own address into QVSA_MAINTAINER.
+lintian --fail-on error --suppress-tags initial-upload-closes-no-bugs,bogus-mail-host "$packages"/*.deb
 
 echo "== In a bare root"
 packaging/try-packages.sh "$packages"
