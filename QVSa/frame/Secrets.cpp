@@ -158,8 +158,8 @@ Secrets Secrets::madeUp() {
   result.connPwdWordA = randomWord();
   result.connPwdWordB = randomWord();
   result.connPwdTail = randomText(6);
-  const String key = randomText(result.rotatedKeyCharacters.size());
-  std::copy(key.begin(), key.end(), result.rotatedKeyCharacters.begin());
+  for (unsigned char& character : result.rotatedKeyCharacters)
+    character = static_cast<unsigned char>(randomText(1).front());
   result.backupLockKeyStart = randomText(1, "0123456789")[0] - '0';
   result.templatePwdKey = randomText(16);
   result.defaultTemplatePwd = randomText(12);
