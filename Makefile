@@ -18,12 +18,13 @@ packages:
 
 build: packages  ## Build the library, the console and the tests (build/release)
 	$(say) 'Building (build/release)'
-	@cmake --preset release --log-level=NOTICE
+	@cmake --preset release -DQVSA_TESTS=ON --log-level=NOTICE
 	@cmake --build --preset release -j $(JOBS)
 
-demo: packages  ## Make an installation, fill it with an organisation, walk the road of a sign-on
+demo:  ## Make an installation, fill it with an organisation, walk the road of a sign-on
+	@tools/install-packages.sh demo
 	$(say) 'Building the demonstration (build/release)'
-	@cmake --preset release --log-level=NOTICE
+	@cmake --preset release -DQVSA_TESTS=OFF --log-level=NOTICE
 	@cmake --build --preset release -j $(JOBS) --target qvsa_console sign_on_road registration_road \
 	  log_and_classes organisation_walk made_up_organisation
 	@tools/demo.sh
@@ -36,7 +37,7 @@ test: build  ## Build and run all tests, then the quick ones once more under the
 
 test-server: packages  ## Test against a SQL Server: SERVER=host,port, the password of its sa in QVSA_TEST_PASSWORD
 	@: "$${QVSA_TEST_PASSWORD:?the password of sa is wanted there}" '$(if $(SERVER),,$(error SERVER=host,port is wanted))'
-	@cmake --preset release --log-level=NOTICE
+	@cmake --preset release -DQVSA_TESTS=ON --log-level=NOTICE
 	@cmake --build --preset release -j $(JOBS) --target server_tests
 	$(say) 'Testing against $(SERVER)'
 	@QVSA_TEST_SERVER='$(SERVER)' ctest --preset release -L server -j 1

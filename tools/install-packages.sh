@@ -1,6 +1,7 @@
 #!/bin/sh
 # Installs the Debian packages that the project needs, as far as they are missing; asks no server when all are there.
 #   tools/install-packages.sh          what building, testing and benchmarks need
+#   tools/install-packages.sh demo     what building alone needs
 #   tools/install-packages.sh lint     clang-format and clang-tidy as well
 #   tools/install-packages.sh fuzz     clang as well
 #   tools/install-packages.sh package  lintian and mmdebstrap as well
@@ -8,19 +9,20 @@
 set -eu
 
 packages="build-essential cmake ninja-build ccache
-  libsqlite3-dev libssl-dev unixodbc-dev tdsodbc libsqliteodbc
-  pkgconf libkrb5-dev gss-ntlmssp libldap-dev slapd ldap-utils openssl
-  libpugixml-dev zlib1g-dev libcli11-dev nlohmann-json3-dev libfccp-dev
+  libsqlite3-dev libssl-dev unixodbc-dev pkgconf libkrb5-dev libldap-dev
+  libpugixml-dev zlib1g-dev libcli11-dev nlohmann-json3-dev libfccp-dev"
+for_tests="tdsodbc libsqliteodbc gss-ntlmssp slapd ldap-utils openssl
   libgtest-dev libbenchmark-dev python3"
 
+[ "${1:-}" = demo ] || packages="$packages $for_tests"
 case "${1:-}" in
-  "") ;;
+  "" | demo) ;;
   lint) packages="$packages clang-format clang-tidy" ;;
   fuzz) packages="$packages clang" ;;
   package) packages="$packages lintian mmdebstrap" ;;
   docs) packages="$packages doxygen" ;;
   *)
-    echo "usage: $0 [lint | fuzz | package | docs]" >&2
+    echo "usage: $0 [demo | lint | fuzz | package | docs]" >&2
     exit 2
     ;;
 esac
