@@ -6,6 +6,7 @@
 #include "QVSa/values/Failure.h"
 #include "QVSa/values/Text.h"
 #include "platform/Files.h"
+#include "platform/NamedLines.h"
 
 namespace QVSa::platform {
 
@@ -39,17 +40,11 @@ void put(Settings& settings, const String& name, const String& value, const Stri
   settings[name] = {value, source};
 }
 
-void putLine(Settings& settings, const String& line, const String& path) {
-  const std::size_t mark = line.find('=');
-  if (mark == String::npos) throw refused("\"" + line + "\" is no \"name = value\" (" + path + ").");
-  put(settings, trim(line.substr(0, mark)), trim(line.substr(mark + 1)), path);
-}
-
 void putFile(Settings& settings, const String& path) {
   const Bytes content = readFile(path);
-  for (const String& line : split(String(content.begin(), content.end()), '\n')) {
-    const String plain = trim(replaceAll(replaceAll(line, "\r", ""), "\t", " "));
-    if (!plain.empty() && plain.front() != '#') putLine(settings, plain, path);
+  for (const NamedLine& line : namedLines(String(content.begin(), content.end()))) {
+    if (line.name.empty()) throw refused("Line " + text(line.number) + " is no \"name = value\" (" + path + ").");
+    put(settings, line.name, line.value, path);
   }
 }
 

@@ -6,8 +6,6 @@
 
 namespace QVSa {
 
-namespace {}  // namespace
-
 Connection::Connection() = default;
 Connection::~Connection() { disconnect(); }
 Connection::Connection(Connection&& other) noexcept = default;

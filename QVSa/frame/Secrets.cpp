@@ -11,6 +11,7 @@
 #include "QVSa/frame/DeploymentSecrets.h"
 #include "QVSa/values/Failure.h"
 #include "QVSa/values/Text.h"
+#include "platform/NamedLines.h"
 #include "platform/PrivateFile.h"
 #include "platform/RandomBytes.h"
 
@@ -25,16 +26,9 @@ constexpr int highestKeyStart = 9;
 class Lines {
  public:
   explicit Lines(const String& content) {
-    Long number = 0;
-    for (const String& line : split(content, '\n')) {
-      ++number;
-      const String trimmed = trim(line);
-      if (trimmed.empty() || trimmed.front() == '#') continue;
-      const std::size_t mark = trimmed.find('=');
-      if (mark == String::npos ||
-          !values_.emplace(trim(trimmed.substr(0, mark)), trim(trimmed.substr(mark + 1))).second)
-        throw unusable("line " + text(number));
-    }
+    for (platform::NamedLine& line : platform::namedLines(content))
+      if (line.name.empty() || !values_.emplace(std::move(line.name), std::move(line.value)).second)
+        throw unusable("line " + text(line.number));
   }
 
   String take(const String& name) {

@@ -60,13 +60,19 @@ void SecretRotation::moveTexts(Connection& connection, const Secrets& to) {
   unread_.clear();
   const Secrets& from = deploymentSecrets();
 
-  const String safe = movedText(firstText(connection, "select top 1 isnull(protectPwd,'') from QVTmpSafe"),
-                                from.templatePwdKey, to.templatePwdKey, "the template password");
-  connection.Execute(sql("update QVTmpSafe set protectPwd=<pwd>").secret("pwd", safe));
-  const String lock = movedText(firstText(connection, "select isnull(roleSpec,'') from roles where roleId=4"),
-                                from.backupLockKey(), to.backupLockKey(), "the lock of the backups");
-  connection.Execute(sql("update roles set roleSpec=<lock> where roleId=4").secret("lock", lock));
+  moveText(connection, "select top 1 isnull(protectPwd,'') from QVTmpSafe", "update QVTmpSafe set protectPwd=<text>",
+           from.templatePwdKey, to.templatePwdKey, "the template password");
+  moveText(connection, "select isnull(roleSpec,'') from roles where roleId=4",
+           "update roles set roleSpec=<text> where roleId=4", from.backupLockKey(), to.backupLockKey(),
+           "the lock of the backups");
   moveTemplates(connection, to);
+}
+
+void SecretRotation::moveText(Connection& connection, const String& query, const String& update, const String& oldKey,
+                              const String& newKey, const String& name) {
+  const String cipher = firstText(connection, query);
+  if (cipher.empty()) return;
+  connection.Execute(sql(update).secret("text", movedText(cipher, oldKey, newKey, name)));
 }
 
 void SecretRotation::moveTemplates(Connection& connection, const Secrets& to) {
@@ -85,7 +91,6 @@ void SecretRotation::moveTemplates(Connection& connection, const Secrets& to) {
 }
 
 String SecretRotation::movedText(const String& cipher, const String& oldKey, const String& newKey, const String& name) {
-  if (cipher.empty()) return cipher;
   const auto stored = StoredPassword::read(cipher, oldKey);
   if (stored.isReadable()) {
     ++moved_;

@@ -32,6 +32,9 @@ class QVSA_EXPORT SecretRotation : private Frame {
   Connection openSystem(const String& saPassword) const;
   Boolean logsIn(const Secrets& secrets) const;
   void moveTexts(Connection& connection, const Secrets& to);
+  // The one text that `query` gives; NULL and an empty one stay.
+  void moveText(Connection& connection, const String& query, const String& update, const String& oldKey,
+                const String& newKey, const String& name);
   void moveTemplates(Connection& connection, const Secrets& to);
   // The text in the new key; `cipher` itself where the old one can't read it, which is noted under `name`.
   String movedText(const String& cipher, const String& oldKey, const String& newKey, const String& name);

@@ -206,7 +206,7 @@ class QVSA_EXPORT User : private Frame {
   void saveGroup(Connection& connection, Long id);
   String storedPwd() const;
   Boolean pwdUsedBefore(Integer cycle, const String& Pwd = "");
-  void noteStored();
+  void noteStored(String name);
   void pushPwdHistory(Integer cycle);
 
   Boolean testPassword(Connection& connection, const String& Pwd, Boolean* wrongPwd, Boolean authLd);

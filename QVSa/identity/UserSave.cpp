@@ -35,8 +35,8 @@ Boolean User::passesPolicy(const String& password, Integer& cycle) {
 // The name is stored without its trailing blanks, and a password is read under the name as it is stored.
 String User::storedPwd() const { return Pwd_.encrypted(trimRight(Name_)); }
 
-void User::noteStored() {
-  storedName_ = trimRight(Name_);
+void User::noteStored(String name) {
+  storedName_ = std::move(name);
   isStored_ = true;
 }
 
@@ -57,10 +57,12 @@ Boolean User::insertUser() {
                            .raw("jobList", jobList_));
   }
   saveGroup(connection, id);
+  // Behind the commit nothing may fail, want of memory neither.
+  String stored = trimRight(Name_);
   connection.CommitTrans();
   // Not before: where the row is rolled back, another user may get its number.
   Id_ = id;
-  noteStored();
+  noteStored(std::move(stored));
   return true;
 }
 
@@ -121,9 +123,10 @@ Boolean User::updateUser() {
     }
   }
   saveGroup(connection, Id_);
+  String stored = trimRight(Name_);
   connection.CommitTrans();
   regState_ = state;
-  noteStored();
+  noteStored(std::move(stored));
   return true;
 }
 

@@ -4,7 +4,7 @@
 #include <cmath>
 #include <limits>
 
-#include "QVSa/values/Text.h"
+#include "QVSa/values/Utf8.h"
 
 namespace QVSa::binding {
 
@@ -34,8 +34,10 @@ std::optional<Whole> wholeOf(const qvsa_value& value) {
 }
 
 bool isUtf8(const String& text) {
-  const bool ascii = std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
-  return ascii || fromUtf16(toUtf16(text)) == text;
+  const char* const end = text.data() + text.size();
+  for (const char* at = text.data(); at < end;)
+    if (nextSymbol(at, end) >= strayByte) return false;
+  return true;
 }
 
 template <class Content, class Given>

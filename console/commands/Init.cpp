@@ -1,6 +1,5 @@
 #include <filesystem>
 #include <memory>
-#include <sys/stat.h>
 
 #include "QVSa/frame/ConnectionString.h"
 #include "QVSa/hosting/Installation.h"
@@ -8,7 +7,7 @@
 #include "console/Commands.h"
 #include "console/Passwords.h"
 #include "console/Table.h"
-#include "platform/Files.h"
+#include "platform/PrivateFile.h"
 
 namespace QVSa::console {
 
@@ -78,12 +77,9 @@ Answer initServer(const String& server, const Options& options) {
   return answerOf(server, admin, {});
 }
 
-// A file of a script holds a password: nobody else may read it, which is no matter of the one that was there.
+// A script holds a password: nobody else may read it.
 Answer writeScript(const String& path, const String& script, const String& next) {
-  std::error_code error;
-  if (std::filesystem::is_regular_file(path, error)) throw Refusal("There is a file " + path + " already.");
-  ::umask(S_IRWXG | S_IRWXO);
-  platform::writeFile(path, Bytes(script.begin(), script.end()));
+  platform::makePrivateFile(path, script);
   return {"The script is written to " + path + ".\n" + next, {{"script", path}}};
 }
 

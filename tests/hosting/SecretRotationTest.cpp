@@ -73,8 +73,10 @@ TEST_F(ARotation, MovesTheLogInAndEveryTextThatItCanReadWholeOrNotAtAll) {
   EXPECT_EQ(rotation_.errNumber(), number::argument) << "a second time it would find nothing that it can read";
 
   store("update QVTmpSafe set protectPwd=", "Sesame", old.templatePwdKey);
+  run("update roles set roleSpec=null where roleId=4");
   EXPECT_TRUE(rotation_.rotateTexts(file_, administrator));
   EXPECT_EQ(rotation_.moved(), 1) << "what an older backup brought back";
+  EXPECT_EQ(text("select count(*) from roles where roleId=4 and roleSpec is null"), "1") << "nothing to move";
 }
 
 }  // namespace
